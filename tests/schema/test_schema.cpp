@@ -1,0 +1,409 @@
+// The generated class schema: repository, feature order and flags, defaults,
+// ancestry, method records and slot offsets.
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "framework/Instance.h"
+#include "schema/Repository.h"
+#include "schema/generated/CIM_ConcreteJob.h"
+#include "schema/generated/CIM_DiagnosticService.h"
+#include "schema/generated/CIM_FCPort.h"
+#include "schema/generated/CIM_SoftwareInstallationService.h"
+#include "schema/generated/TAVRIN_AgentService.h"
+#include "schema/generated/TAVRIN_AlertIndication.h"
+#include "schema/generated/TAVRIN_CIMXMLCommunicationMechanism.h"
+#include "schema/generated/TAVRIN_ConcreteJob.h"
+#include "schema/generated/TAVRIN_DiagnosticTest.h"
+#include "schema/generated/TAVRIN_FCPort.h"
+#include "schema/generated/TAVRIN_LANEndpoint.h"
+#include "schema/generated/TAVRIN_LogicalDisk.h"
+#include "schema/generated/TAVRIN_MemoryDiagnosticTest.h"
+#include "schema/generated/TAVRIN_PortController.h"
+#include "schema/generated/TAVRIN_StorageExtent.h"
+
+using namespace CPTA;
+
+namespace {
+
+const uint32 KIND_BITS = FLAG_PROPERTY | FLAG_REFERENCE | FLAG_METHOD;
+
+const Meta_Class* meta(const char* name) {
+    return find_meta_class(&__meta_repository, name);
+}
+
+bool starts_with(const char* s, const char* prefix) {
+    return std::strncmp(s, prefix, std::strlen(prefix)) == 0;
+}
+
+// Size of the slot a property or reference occupies.
+size_t slot_size(const Meta_Feature* f) {
+    if (f->flags & FLAG_REFERENCE) {
+        auto r = reinterpret_cast<const Meta_Reference*>(f);
+        return r->subscript ? sizeof(Property<Array<Instance*>>) : sizeof(Instance*);
+    }
+    static const size_t sizes[] = {1, 1, 1, 2, 2, 4, 4, 8, 8, 4, 8, 2, 8, 8};
+    auto p = reinterpret_cast<const Meta_Property*>(f);
+    return (p->subscript ? sizeof(void*) : sizes[p->type]) + 1;
+}
+
+uint32 offset_of(const Meta_Feature* f) {
+    if (f->flags & FLAG_REFERENCE)
+        return reinterpret_cast<const Meta_Reference*>(f)->offset;
+    return reinterpret_cast<const Meta_Property*>(f)->offset;
+}
+
+// The slots of a class or method record lie in feature order, inside the
+// structure, without overlapping.
+void expect_slots_in_order(const char* what, const Meta_Feature* const* features, size_t n,
+                           uint32 size) {
+    size_t end = sizeof(Instance);
+    for (size_t i = 0; i < n; i++) {
+        const Meta_Feature* f = features[i];
+        if (f->flags & FLAG_METHOD)
+            continue;
+        EXPECT_GE(offset_of(f), end) << what << "." << f->name;
+        end = offset_of(f) + slot_size(f);
+    }
+    EXPECT_LE(end, size) << what;
+}
+
+}  // namespace
+
+TEST(Repository, HoldsTheModuleClassesAndTheirCimAncestors) {
+    ASSERT_EQ(__meta_repository.num_meta_classes, 178u);
+    size_t cim = 0, tavrin = 0;
+    std::set<std::string> names;
+    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = __meta_repository.meta_classes[i];
+        cim += starts_with(mc->name, "CIM_");
+        tavrin += starts_with(mc->name, "TAVRIN_");
+        EXPECT_EQ(mc->meta_repository, &__meta_repository) << mc->name;
+        EXPECT_TRUE(names.insert(mc->name).second) << mc->name;
+    }
+    EXPECT_EQ(cim, 101u);
+    EXPECT_EQ(tavrin, 77u);
+
+    EXPECT_EQ(meta("tavrin_fcport"), &TAVRIN_FCPort::static_meta_class);
+    EXPECT_EQ(meta("CIM_FCPORT"), &CIM_FCPort::static_meta_class);
+    EXPECT_EQ(meta("TAVRIN_NoSuchClass"), nullptr);
+}
+
+// Checks every class against the rules of the model, so that a fault of the
+// generator in any one of them shows up here.
+TEST(Repository, EveryClassIsConsistentWithItsSuperclass) {
+    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = __meta_repository.meta_classes[i];
+        SCOPED_TRACE(mc->name);
+        const Meta_Class* sup = mc->super_meta_class;
+        bool assoc = mc->flags & FLAG_ASSOCIATION;
+        EXPECT_NE(assoc, bool(mc->flags & FLAG_CLASS));
+        if (mc->flags & FLAG_AGGREGATION) {
+            EXPECT_TRUE(assoc);
+        }
+        if (sup) {
+            ASSERT_GE(mc->num_meta_features, sup->num_meta_features);
+            EXPECT_EQ(sup->meta_repository, &__meta_repository);
+            EXPECT_EQ(bool(sup->flags & FLAG_ASSOCIATION), assoc);
+            EXPECT_EQ(sup->flags & FLAG_INDICATION, mc->flags & FLAG_INDICATION);
+        }
+        size_t keys = 0;
+        for (size_t j = 0; j < mc->num_meta_features; j++) {
+            const Meta_Feature* f = mc->meta_features[j];
+            uint32 kind = f->flags & KIND_BITS;
+            EXPECT_TRUE(kind == FLAG_PROPERTY || kind == FLAG_REFERENCE || kind == FLAG_METHOD)
+                << f->name;
+            keys += (f->flags & FLAG_KEY) != 0;
+            if (sup && j < sup->num_meta_features) {
+                const Meta_Feature* inherited = sup->meta_features[j];
+                EXPECT_STRCASEEQ(f->name, inherited->name);
+                EXPECT_EQ(kind, inherited->flags & KIND_BITS) << f->name;
+                if (!mc->locals[j]) {
+                    EXPECT_EQ(f, inherited) << f->name;
+                }
+                if (inherited->flags & FLAG_KEY) {
+                    EXPECT_TRUE(f->flags & FLAG_KEY) << f->name;
+                }
+            } else {
+                EXPECT_TRUE(mc->locals[j]) << f->name;
+            }
+            if (kind == FLAG_REFERENCE) {
+                auto r = reinterpret_cast<const Meta_Reference*>(f);
+                ASSERT_NE(r->meta_class, nullptr);
+                if (r->meta_class != &Instance::static_meta_class) {
+                    EXPECT_EQ(meta(r->meta_class->name), r->meta_class) << f->name;
+                }
+                if (sup && j < sup->num_meta_features) {
+                    auto old = reinterpret_cast<const Meta_Reference*>(sup->meta_features[j]);
+                    EXPECT_TRUE(is_subclass(old->meta_class, r->meta_class)) << f->name;
+                }
+            }
+        }
+        EXPECT_EQ(mc->num_keys, keys);
+        expect_slots_in_order(mc->name, mc->meta_features, mc->num_meta_features, mc->size);
+    }
+}
+
+TEST(Repository, MethodRecordsEndWithTheirReturnValue) {
+    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = __meta_repository.meta_classes[i];
+        for (size_t j = 0; j < mc->num_meta_features; j++) {
+            if (!(mc->meta_features[j]->flags & FLAG_METHOD))
+                continue;
+            auto m = reinterpret_cast<const Meta_Method*>(mc->meta_features[j]);
+            SCOPED_TRACE(std::string(mc->name) + "." + m->name);
+            ASSERT_GE(m->num_meta_features, 1u);
+            auto rv = reinterpret_cast<const Meta_Property*>(m->meta_features[m->num_meta_features - 1]);
+            EXPECT_STREQ(rv->name, "return_value");
+            EXPECT_EQ(rv->flags, FLAG_PROPERTY | FLAG_OUT);
+            EXPECT_EQ(rv->type, m->return_type);
+            for (size_t k = 0; k + 1 < m->num_meta_features; k++)
+                EXPECT_TRUE(m->meta_features[k]->flags & (FLAG_IN | FLAG_OUT));
+            expect_slots_in_order(m->name, m->meta_features, m->num_meta_features, m->size);
+        }
+    }
+}
+
+TEST(ClassSchema, FCPortHasTheFeaturesOfCimFCPortInOrder) {
+    static const char* const expected[] = {
+        "InstanceID", "Caption", "Description", "ElementName", "Generation", "InstallDate",
+        "Name", "OperationalStatus", "StatusDescriptions", "Status", "HealthState",
+        "CommunicationStatus", "DetailedStatus", "OperatingStatus", "PrimaryStatus",
+        "EnabledState", "OtherEnabledState", "RequestedState", "EnabledDefault",
+        "TimeOfLastStateChange", "AvailableRequestedStates", "TransitioningToState",
+        "RequestStateChange", "SystemCreationClassName", "SystemName", "CreationClassName",
+        "DeviceID", "PowerManagementSupported", "PowerManagementCapabilities", "Availability",
+        "StatusInfo", "LastErrorCode", "ErrorDescription", "ErrorCleared",
+        "OtherIdentifyingInfo", "PowerOnHours", "TotalPowerOnHours", "IdentifyingDescriptions",
+        "AdditionalAvailability", "MaxQuiesceTime", "LocationIndicator", "SetPowerState",
+        "Reset", "EnableDevice", "OnlineDevice", "QuiesceDevice", "SaveProperties",
+        "RestoreProperties", "Speed", "MaxSpeed", "RequestedSpeed", "UsageRestriction",
+        "PortType", "OtherPortType", "OtherNetworkPortType", "PortNumber", "LinkTechnology",
+        "OtherLinkTechnology", "PermanentAddress", "NetworkAddresses", "FullDuplex",
+        "AutoSense", "SupportedMaximumTransmissionUnit", "ActiveMaximumTransmissionUnit",
+        "SupportedCOS", "ActiveCOS", "SupportedFC4Types", "ActiveFC4Types",
+        "DetailedPortState", "DomainPortNumber", "LogicalModulePortNumber",
+        "PortAvailability", "PortDiscriminator"};
+    const Meta_Class* mc = &TAVRIN_FCPort::static_meta_class;
+    ASSERT_EQ(mc->num_meta_features, 73u);
+    size_t methods = 0;
+    std::vector<std::string> keys;
+    for (size_t i = 0; i < 73; i++) {
+        const Meta_Feature* f = mc->meta_features[i];
+        EXPECT_STREQ(f->name, expected[i]);
+        methods += (f->flags & FLAG_METHOD) != 0;
+        if (f->flags & FLAG_KEY)
+            keys.push_back(f->name);
+    }
+    EXPECT_EQ(methods, 8u);
+    EXPECT_EQ(mc->num_keys, 4u);
+    EXPECT_EQ(keys, (std::vector<std::string>{"SystemCreationClassName", "SystemName",
+                                              "CreationClassName", "DeviceID"}));
+    EXPECT_EQ(mc->super_meta_class, &CIM_FCPort::static_meta_class);
+    EXPECT_EQ(mc->flags, FLAG_CLASS);
+
+    auto prop = [&](const char* name) { return find_property(mc, name); };
+    EXPECT_EQ(prop("Generation")->type, UINT64);
+    EXPECT_EQ(prop("PowerOnHours")->flags, FLAG_PROPERTY | FLAG_COUNTER);
+    EXPECT_EQ(prop("LocationIndicator")->flags, FLAG_PROPERTY | FLAG_EXPERIMENTAL | FLAG_WRITE);
+    EXPECT_EQ(prop("OperationalStatus")->subscript, -1);
+}
+
+TEST(ClassSchema, ModuleClassesRepeatTheirSuperclass) {
+    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = __meta_repository.meta_classes[i];
+        if (!starts_with(mc->name, "TAVRIN_") || !std::strcmp(mc->name, "TAVRIN_AgentService"))
+            continue;
+        SCOPED_TRACE(mc->name);
+        const Meta_Class* sup = mc->super_meta_class;
+        ASSERT_NE(sup, nullptr);
+        size_t extra = std::strcmp(mc->name, "TAVRIN_AlertIndication") == 0 ? 1 : 0;
+        EXPECT_EQ(mc->num_meta_features, sup->num_meta_features + extra);
+        EXPECT_EQ(mc->num_keys, sup->num_keys);
+        EXPECT_EQ(mc->flags & ~FLAG_EXPERIMENTAL, sup->flags & ~(FLAG_ABSTRACT | FLAG_EXPERIMENTAL));
+    }
+    const Meta_Class* alert = &TAVRIN_AlertIndication::static_meta_class;
+    const Meta_Feature* last = alert->meta_features[alert->num_meta_features - 1];
+    EXPECT_STREQ(last->name, "Category");
+    EXPECT_EQ(last->flags, FLAG_PROPERTY);
+    EXPECT_EQ(alert->flags, FLAG_CLASS | FLAG_INDICATION);
+    EXPECT_TRUE(alert->locals[0]);  // IndicationIdentifier is redeclared
+
+    EXPECT_EQ(meta("TAVRIN_HostedAccessPoint")->flags, FLAG_ASSOCIATION);
+    EXPECT_EQ(meta("TAVRIN_MemberOfCollection")->flags, FLAG_ASSOCIATION | FLAG_AGGREGATION);
+    EXPECT_EQ(meta("TAVRIN_ProductElementComponent")->flags,
+              FLAG_ASSOCIATION | FLAG_AGGREGATION | FLAG_COMPOSITION | FLAG_EXPERIMENTAL);
+    EXPECT_EQ(find_reference(meta("TAVRIN_MemberOfCollection"), "Collection")->flags,
+              FLAG_REFERENCE | FLAG_KEY | FLAG_AGGREGATE);
+    EXPECT_EQ(find_reference(meta("TAVRIN_FCPortSystemDevice"), "PartComponent")->flags,
+              FLAG_REFERENCE | FLAG_KEY | FLAG_WEAK);
+    // Narrowed references.
+    EXPECT_EQ(find_reference(meta("TAVRIN_OwningJobElement"), "OwningElement")->meta_class,
+              &TAVRIN_DiagnosticTest::static_meta_class);
+    EXPECT_EQ(find_reference(meta("TAVRIN_HostedLANEndpoint"), "Dependent")->meta_class,
+              &TAVRIN_LANEndpoint::static_meta_class);
+}
+
+TEST(ClassSchema, AgentServiceIsARootClass) {
+    const Meta_Class* mc = &TAVRIN_AgentService::static_meta_class;
+    EXPECT_EQ(mc->super_meta_class, nullptr);
+    EXPECT_EQ(mc->flags, FLAG_CLASS);
+    EXPECT_EQ(mc->num_keys, 1u);
+    ASSERT_EQ(mc->num_meta_features, 2u);
+    EXPECT_EQ(mc->meta_features[0]->flags, FLAG_PROPERTY | FLAG_KEY);
+    EXPECT_STREQ(mc->meta_features[0]->name, "Name");
+    EXPECT_TRUE(is_subclass(&Instance::static_meta_class, mc));
+    EXPECT_FALSE(is_subclass(meta("CIM_ManagedElement"), mc));
+
+    auto m = reinterpret_cast<const Meta_Method*>(mc->meta_features[1]);
+    EXPECT_EQ(m, &TAVRIN_AgentService_executeMethod_method::static_meta_class);
+    EXPECT_STREQ(m->name, "executeMethod");
+    ASSERT_EQ(m->num_meta_features, 3u);
+    EXPECT_STREQ(m->meta_features[0]->name, "response");
+    EXPECT_EQ(m->meta_features[0]->flags, FLAG_PROPERTY | FLAG_OUT);
+    EXPECT_STREQ(m->meta_features[1]->name, "request");
+    EXPECT_EQ(m->meta_features[1]->flags, FLAG_PROPERTY | FLAG_IN);
+    EXPECT_EQ(m->return_type, UINT32);
+    EXPECT_EQ(m->size, sizeof(TAVRIN_AgentService_executeMethod_method));
+}
+
+TEST(ClassSchema, DiagnosticTestsDeriveThroughTheCommonTest) {
+    const Meta_Class* memory = &TAVRIN_MemoryDiagnosticTest::static_meta_class;
+    EXPECT_EQ(memory->super_meta_class, &TAVRIN_DiagnosticTest::static_meta_class);
+    EXPECT_TRUE(is_subclass(meta("CIM_DiagnosticTest"), memory));
+    EXPECT_TRUE(is_subclass(&TAVRIN_DiagnosticTest::static_meta_class, memory));
+    EXPECT_FALSE(is_subclass(memory, meta("TAVRIN_LoopbackDiagnosticTest")));
+    EXPECT_TRUE(is_subclass(meta("CIM_ManagedElement"), &TAVRIN_FCPort::static_meta_class));
+    EXPECT_FALSE(is_subclass(&TAVRIN_FCPort::static_meta_class, meta("CIM_ManagedElement")));
+}
+
+TEST(ClassSchema, MethodParametersFollowTheirDeclaration) {
+    auto run = &CIM_DiagnosticService_RunDiagnostic_method::static_meta_class;
+    EXPECT_EQ(find_method(meta("TAVRIN_EthLoopbackDiagnosticTest"), "rundiagnostic"), run);
+    EXPECT_STREQ(run->name, "RunDiagnostic");
+    ASSERT_EQ(run->num_meta_features, 5u);
+    const char* const names[] = {"ManagedElement", "DiagSetting", "JobSetting", "Job"};
+    const char* const classes[] = {"CIM_ManagedElement", "CIM_DiagnosticSetting",
+                                   "CIM_JobSettingData", "CIM_ConcreteJob"};
+    for (int i = 0; i < 4; i++) {
+        auto r = reinterpret_cast<const Meta_Reference*>(run->meta_features[i]);
+        EXPECT_STREQ(r->name, names[i]);
+        EXPECT_EQ(r->flags, FLAG_REFERENCE | (i < 3 ? FLAG_IN : FLAG_OUT));
+        EXPECT_EQ(r->subscript, 0);
+        EXPECT_EQ(r->meta_class, meta(classes[i]));
+    }
+
+    auto uri = &CIM_SoftwareInstallationService_InstallFromURI_method::static_meta_class;
+    EXPECT_EQ(find_method(meta("TAVRIN_HBASoftwareInstallationService"), "InstallFromURI"), uri);
+    ASSERT_EQ(uri->num_meta_features, 6u);
+    EXPECT_EQ(uri->meta_features[0]->flags, FLAG_REFERENCE | FLAG_OUT);
+    auto options = reinterpret_cast<const Meta_Property*>(uri->meta_features[3]);
+    EXPECT_STREQ(options->name, "InstallOptions");
+    EXPECT_EQ(options->flags, FLAG_PROPERTY | FLAG_IN);
+    EXPECT_EQ(options->type, UINT16);
+    EXPECT_EQ(options->subscript, -1);
+
+    // An [OUT] parameter is also an input: IN defaults to true.
+    auto get_error = find_method(meta("TAVRIN_ConcreteJob"), "GetError");
+    EXPECT_EQ(get_error, &CIM_ConcreteJob_GetError_method::static_meta_class);
+    auto error = reinterpret_cast<const Meta_Reference*>(get_error->meta_features[0]);
+    EXPECT_EQ(error->flags, FLAG_REFERENCE | FLAG_IN | FLAG_OUT | FLAG_EMBEDDED_INSTANCE);
+    EXPECT_EQ(error->meta_class, meta("CIM_Error"));
+
+    // The job redeclares RequestStateChange with its own parameter list.
+    auto change = find_method(meta("TAVRIN_ConcreteJob"), "RequestStateChange");
+    ASSERT_EQ(change->num_meta_features, 3u);
+    EXPECT_STREQ(change->meta_features[1]->name, "TimeoutPeriod");
+
+    auto goals = find_method(meta("CIM_Capabilities"), "CreateGoalSettings");
+    EXPECT_EQ(goals->return_type, UINT16);
+    EXPECT_EQ(goals->flags, FLAG_METHOD | FLAG_EXPERIMENTAL);
+}
+
+TEST(ClassSchema, OffsetsInTheMetaDataMatchTheStructures) {
+    TAVRIN_FCPort* port = create<TAVRIN_FCPort>(false);
+    ASSERT_NE(port, nullptr);
+    char* base = reinterpret_cast<char*>(port);
+    const Meta_Class* mc = &TAVRIN_FCPort::static_meta_class;
+    EXPECT_EQ(base + find_property(mc, "DeviceID")->offset, reinterpret_cast<char*>(&port->DeviceID));
+    EXPECT_EQ(base + find_property(mc, "InstanceID")->offset,
+              reinterpret_cast<char*>(&port->InstanceID));
+    EXPECT_EQ(base + find_property(mc, "PortDiscriminator")->offset,
+              reinterpret_cast<char*>(&port->PortDiscriminator));
+    EXPECT_EQ(mc->size, sizeof(TAVRIN_FCPort));
+    destroy(port);
+
+    TAVRIN_ConcreteJob* job = create<TAVRIN_ConcreteJob>(false);
+    ASSERT_NE(job, nullptr);
+    base = reinterpret_cast<char*>(job);
+    EXPECT_EQ(base + find_reference(job->meta_class, "JobOutParameters")->offset,
+              reinterpret_cast<char*>(&job->JobOutParameters));
+    destroy(job);
+
+    auto uri = &CIM_SoftwareInstallationService_InstallFromURI_method::static_meta_class;
+    auto rec = static_cast<CIM_SoftwareInstallationService_InstallFromURI_method*>(create(uri));
+    ASSERT_NE(rec, nullptr);
+    base = reinterpret_cast<char*>(rec);
+    EXPECT_EQ(base + reinterpret_cast<const Meta_Property*>(find_parameter(uri, "URI"))->offset,
+              reinterpret_cast<char*>(&rec->URI));
+    EXPECT_EQ(base + find_reference(uri, "Target")->offset, reinterpret_cast<char*>(&rec->Target));
+    destroy(rec);
+}
+
+TEST(ClassSchema, InstancesCreatedWithDefaultsHoldTheSchemaDefaults) {
+    TAVRIN_FCPort* port = create<TAVRIN_FCPort>(true);
+    ASSERT_NE(port, nullptr);
+    EXPECT_FALSE(port->EnabledState.null);
+    EXPECT_EQ(port->EnabledState.value, 5);
+    EXPECT_EQ(port->RequestedState.value, 12);
+    EXPECT_EQ(port->EnabledDefault.value, 2);
+    EXPECT_EQ(port->TransitioningToState.value, 12);
+    EXPECT_FALSE(port->PortAvailability.null);
+    EXPECT_EQ(port->PortAvailability.value, 2);
+    EXPECT_TRUE(port->Caption.null);
+    EXPECT_TRUE(port->DeviceID.null);
+    destroy(port);
+
+    TAVRIN_PortController* controller = create<TAVRIN_PortController>(true);
+    EXPECT_EQ(controller->ControllerType.value, 4);
+    EXPECT_FALSE(controller->ControllerType.null);
+    destroy(controller);
+
+    TAVRIN_LogicalDisk* disk = create<TAVRIN_LogicalDisk>(true);
+    EXPECT_EQ(disk->NameFormat.value, 12);
+    EXPECT_EQ(disk->NameNamespace.value, 8);
+    EXPECT_FALSE(disk->ThinlyProvisioned.null);
+    EXPECT_FALSE(disk->ThinlyProvisioned.value);
+    destroy(disk);
+
+    TAVRIN_StorageExtent* extent = create<TAVRIN_StorageExtent>(true);
+    EXPECT_EQ(extent->NameFormat.value, 12);
+    EXPECT_TRUE(extent->NameNamespace.null);
+    destroy(extent);
+
+    TAVRIN_ConcreteJob* job = create<TAVRIN_ConcreteJob>(true);
+    EXPECT_FALSE(job->TimeBeforeRemoval.null);
+    EXPECT_TRUE(job->TimeBeforeRemoval.value.is_interval());
+    EXPECT_EQ(job->TimeBeforeRemoval.value.usec(), 5 * Datetime::MIN);
+    EXPECT_EQ(job->JobRunTimes.value, 1u);
+    destroy(job);
+
+    TAVRIN_CIMXMLCommunicationMechanism* mech = create<TAVRIN_CIMXMLCommunicationMechanism>(true);
+    EXPECT_EQ(mech->CommunicationMechanism.value, 2);
+    destroy(mech);
+
+    TAVRIN_LANEndpoint* lan = create<TAVRIN_LANEndpoint>(true);
+    EXPECT_FALSE(lan->RequestedState.null);
+    EXPECT_EQ(lan->RequestedState.value, 12);
+    destroy(lan);
+
+    // Redeclared in the alert class, the schema's default is kept.
+    TAVRIN_AlertIndication* alert = create<TAVRIN_AlertIndication>(true);
+    EXPECT_FALSE(alert->AlertingElementFormat.null);
+    EXPECT_EQ(alert->AlertingElementFormat.value, 0);
+    EXPECT_TRUE(alert->Category.null);
+    destroy(alert);
+}

@@ -1,0 +1,93 @@
+"""The schema generator's reading of MOF: the rules it applies and the
+mistakes in the module's MOF that it refuses."""
+
+import os
+import sys
+import unittest
+
+sys.dont_write_bytecode = True
+sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)),
+                                "..", "..", "tools", "schemagen"))
+
+import model  # noqa: E402
+import mof  # noqa: E402
+
+BASE = """
+[Abstract] class CIM_A {
+   [Key] string Id;
+   [Write] uint16 Level = 3;
+   [Experimental] string Note;
+   uint32 Act([IN] string In1, [OUT] string InOut, [IN ( false ), OUT] CIM_A REF Out1);
+};
+[Association] class CIM_Link {
+   [Key] CIM_A REF Left;
+   [Key] CIM_A REF Right;
+};
+"""
+F = model.FLAG
+
+
+def build(own, base=BASE):
+    return model.build(mof.parse(base, "base.mof"), mof.parse(own, "own.mof"))
+
+
+class Rules(unittest.TestCase):
+    def test_redeclaration_keeps_position_and_inherited_qualifiers(self):
+        s = build("""
+            class T_A : CIM_A {
+               string Extra;
+               [Override ( "Note" )] string Note;
+               [Override ( "Level" ), Write ( false )] uint16 Level;
+            };""")
+        t = s.get("T_A")
+        self.assertEqual([f.name for f in t.features], ["Id", "Level", "Note", "Act", "Extra"])
+        self.assertEqual(t.locals, [False, True, True, False, True])
+        level, note = t.features[1], t.features[2]
+        # Write(false) clears the inherited flag; Experimental is not inherited.
+        self.assertEqual(level.flags, F["property"])
+        self.assertEqual(note.flags, F["property"])
+        # A redeclaration without a value has no default.
+        self.assertIsNone(level.default)
+        self.assertEqual(s.get("CIM_A").features[1].default, 3)
+        self.assertEqual(t.flags, F["class"])  # Abstract is not inherited
+
+    def test_parameters_are_inputs_unless_in_false(self):
+        act = build("").get("CIM_A").find("Act")
+        self.assertEqual([p.flags for p in act.params],
+                         [F["property"] | F["in"], F["property"] | F["in"] | F["out"],
+                          F["reference"] | F["out"]])
+
+    def test_association_subclass_inherits_keys_and_narrows(self):
+        s = build("""
+            class T_A : CIM_A { };
+            [Association] class T_Link : CIM_Link {
+               [Override ( "Left" )] T_A REF Left;
+            };""")
+        link = s.get("T_Link")
+        self.assertEqual(link.flags, F["association"])
+        self.assertEqual(link.num_keys, 2)
+        self.assertEqual(link.features[0].ref_class, "T_A")
+
+
+class Refused(unittest.TestCase):
+    def refused(self, own, text):
+        with self.assertRaises(mof.MofError) as e:
+            build(own)
+        self.assertIn(text, str(e.exception))
+
+    def test_mistakes(self):
+        self.refused('class T : CIM_A { [Vendorish] string X; };', "not a standard qualifier")
+        self.refused('class T : CIM_A { [Override ( "Level" )] uint32 Level; };', "another type")
+        self.refused('class T : CIM_A { [Override ( "Nope" )] string Nope; };', "overrides nothing")
+        self.refused('class T : CIM_Link { };', "must repeat the Association")
+        self.refused('[Association] class T : CIM_Link { [Override ( "Left" )] CIM_Link REF Left; };',
+                     "not a subclass")
+        self.refused('class T2 : T1 { }; class T1 : CIM_A { };', "before its declaration")
+        self.refused('class T : CIM_A { uint16 X = 70000; };', "does not fit")
+        self.refused('class T : CIM_A { datetime D = "2020"; };', "does not fit")
+        self.refused('class T : CIM_Nope { };', "unknown superclass")
+        self.refused('class T : CIM_A { string X; string x; };', "declared twice")
+
+
+if __name__ == "__main__":
+    unittest.main()
