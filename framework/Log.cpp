@@ -1,0 +1,205 @@
+#include "framework/Log.h"
+
+#include <pthread.h>
+#include <strings.h>
+#include <sys/stat.h>
+
+#include <cctype>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+
+#include "framework/Buffer.h"
+#include "framework/Datetime.h"
+#include "framework/File_Lock.h"
+
+namespace CPTA {
+
+const char* const _log_level_strings[NUM_LOG_LEVELS] = {"FATAL", "ERR", "WARN", "INFO", "DBG"};
+
+std::atomic<bool> _log_enabled_state(true);
+
+namespace {
+
+// All state below is guarded by _mutex, which is held for the whole of a
+// message. Everything is constant-initialised, so messages logged by other
+// static initialisers find it ready.
+pthread_mutex_t _mutex = PTHREAD_MUTEX_INITIALIZER;
+int _level = LL_FATAL;
+bool _initialized = false;
+FILE* _file = nullptr;
+File_Lock* _file_lock = nullptr;
+
+// The environment variable naming the directory that holds the configuration.
+const char cimple_home_envvar[] = "HOME";
+
+const size_t PATH_SIZE = 1024;
+const size_t LINE_SIZE = 1024;
+
+struct Log_Guard {
+    Log_Guard() { pthread_mutex_lock(&_mutex); }
+    ~Log_Guard() { pthread_mutex_unlock(&_mutex); }
+};
+
+int _level_of(const char* name) {
+    if (!name)
+        return -1;
+    for (int i = 0; i < NUM_LOG_LEVELS; i++) {
+        if (strcasecmp(_log_level_strings[i], name) == 0)
+            return i;
+    }
+    return -1;
+}
+
+// Builds a path; false when it does not fit.
+bool _path(char (&buffer)[PATH_SIZE], const char* format, const char* a, const char* b) {
+    int n = snprintf(buffer, PATH_SIZE, format, a, b);
+    return n >= 0 && size_t(n) < PATH_SIZE;
+}
+
+// The value of the first LOG_LEVEL line of the configuration file, or -1.
+int _read_level(const char* home) {
+    char path[PATH_SIZE];
+    if (!_path(path, "%s/%src", home, ".cimple"))
+        return -1;
+    FILE* is = fopen(path, "re");
+    if (!is)
+        return -1;
+
+    int level = -1;
+    char line[LINE_SIZE];
+    while (fgets(line, sizeof(line), is)) {
+        size_t n = strlen(line);
+        if (n == sizeof(line) - 1 && line[n - 1] != '\n') {
+            // Only the first LINE_SIZE - 1 characters of a line count.
+            int c;
+            while ((c = fgetc(is)) != EOF && c != '\n') {
+            }
+        }
+        if (line[0] == '#')
+            continue;
+        while (n > 0 && isspace(static_cast<unsigned char>(line[n - 1])))
+            line[--n] = '\0';
+        if (n == 0 || strncmp(line, "LOG_LEVEL", 9) != 0)
+            continue;
+        const char* p = line + 9;
+        while (isspace(static_cast<unsigned char>(*p)))
+            p++;
+        if (*p != '=')
+            continue;
+        p++;
+        while (isspace(static_cast<unsigned char>(*p)))
+            p++;
+        level = _level_of(p);
+        break;
+    }
+    fclose(is);
+    return level;
+}
+
+void _release_files() {
+    delete _file_lock;
+    _file_lock = nullptr;
+    if (_file)
+        fclose(_file);
+    _file = nullptr;
+    _initialized = false;
+}
+
+// Reads the configuration and opens the files; false leaves logging off.
+bool _start() {
+    const char* home = getenv(cimple_home_envvar);
+    if (!home || !*home)
+        return false;
+    int level = _read_level(home);
+    if (level < 0)
+        return false;
+    _level = level;
+
+    char dir[PATH_SIZE], messages[PATH_SIZE], lock[PATH_SIZE];
+    if (!_path(dir, "%s/%s", home, ".cimple") || !_path(messages, "%s%s", dir, "/messages") ||
+        !_path(lock, "%s%s", dir, "/messages.lock"))
+        return false;
+    mkdir(dir, 0777);
+
+    _file_lock = new File_Lock(lock);
+    if (_file_lock->okay())
+        _file = fopen(messages, "ae");
+    if (!_file) {
+        _release_files();
+        return false;
+    }
+    _initialized = true;
+    return true;
+}
+
+const char* _level_name(int level) {
+    if (level < 0)
+        level = LL_FATAL;
+    return level < NUM_LOG_LEVELS ? _log_level_strings[level] : "DBG";
+}
+
+}  // namespace
+
+void vlog(Log_Level level, const char* file, int line, const char* format, va_list ap) {
+    try {
+        Log_Guard guard;
+        if (!_initialized && !_start())
+            return;
+        if (int(level) > _level)
+            return;
+
+        // The time to the second: the prettified timestamp up to its '.'.
+        char now[Datetime::BUFFER_SIZE];
+        Datetime::now().ascii(now, true);
+        if (char* dot = strchr(now, '.'))
+            *dot = '\0';
+
+        Buffer buffer;
+        buffer.format("%s %s: %s(%d): ", now, _level_name(level), file ? file : "", line);
+        buffer.vformat(format ? format : "", ap);
+        if (buffer.data()[buffer.size() - 1] != '\n')
+            buffer.append('\n');
+
+        _file_lock->lock();
+        fwrite(buffer.data(), 1, buffer.size(), _file);
+        fflush(_file);
+        _file_lock->unlock();
+    } catch (...) {
+        // Out of memory: the message is lost, the caller carries on.
+    }
+}
+
+void log(Log_Level level, const char* file, int line, const char* format, ...) {
+    va_list ap;
+    va_start(ap, format);
+    vlog(level, file, line, format, ap);
+    va_end(ap);
+}
+
+void Log_Call_Frame::invoke(const char* format, ...) {
+    va_list ap;
+    va_start(ap, format);
+    vlog(level, file, line, format, ap);
+    va_end(ap);
+}
+
+int log_set_level(const String& name) {
+    int level = _level_of(name.c_str());
+    if (level < 0)
+        return -1;
+    Log_Guard guard;
+    _level = level;
+    return 0;
+}
+
+int log_enable(bool flag) {
+    return _log_enabled_state.exchange(flag) == flag ? -1 : 0;
+}
+
+void close_log() {
+    Log_Guard guard;
+    _release_files();
+}
+
+}  // namespace CPTA
