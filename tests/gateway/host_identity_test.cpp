@@ -1,0 +1,107 @@
+#include <gtest/gtest.h>
+
+#include <sys/utsname.h>
+
+#include <cstring>
+#include <thread>
+
+#include "gateway/ProviderUtil.h"
+#include "tests/gateway/TestSupport.h"
+
+using namespace CPTA;
+using gwtest::LogCapture;
+
+namespace {
+
+// A scripted host for the look-up seam.
+bool nameFails, domainFails, resolves;
+std::vector<std::string> addresses;
+
+int fakeHostName(char* buffer, size_t length) {
+    return nameFails ? -1 : (CPTA::strlcpy(buffer, "node7", length), 0);
+}
+int fakeDomainName(char* buffer, size_t length) {
+    return domainFails ? -1 : (CPTA::strlcpy(buffer, "(none)", length), 0);
+}
+bool fakeResolve(const char*, std::vector<std::string>& out) {
+    out = addresses;
+    return resolves;
+}
+const HostLookup kFakeHost = {fakeHostName, fakeDomainName, fakeResolve};
+
+class HostIdentity : public ::testing::Test {
+protected:
+    void SetUp() override {
+        nameFails = domainFails = false;
+        resolves = true;
+        addresses.clear();
+        ProviderUtil::setHostLookup(&kFakeHost);
+        LogCapture::get().mark();
+    }
+    void TearDown() override { ProviderUtil::setHostLookup(nullptr); }
+
+    // The host text and kind; checks that nothing is written past `length`.
+    std::pair<int, std::string> info(size_t length = 255) {
+        std::vector<char> buffer(length + 1, 'Z');
+        int rc = ProviderUtil::getHostInfo(buffer.data(), length);
+        EXPECT_EQ(buffer[length], 'Z');
+        return {rc, buffer.data()};
+    }
+};
+
+TEST_F(HostIdentity, FirstNonLoopbackAddressWins) {
+    addresses = {"127.0.0.1", "10.0.0.5", "10.0.0.6"};
+    EXPECT_EQ(info(), std::make_pair(0, std::string("10.0.0.5")));
+    EXPECT_EQ(info(8), std::make_pair(0, std::string("10.0.0.")));
+    EXPECT_STREQ(ProviderUtil::updateNamespacePath("TAVRIN_FCPort").c_str(),
+                 "//10.0.0.5/root/tavrin:TAVRIN_FCPort");
+}
+
+TEST_F(HostIdentity, FallsBackToTheHostNameThenLocalhost) {
+    addresses = {"127.0.0.1", "127.0.1.1"};
+    EXPECT_EQ(info(), std::make_pair(2, std::string("node7")));
+    EXPECT_TRUE(LogCapture::get().has(
+        "INFO", "gethostbyname() FAILED. hostString will have hostname instead of ipAddress"));
+    domainFails = true;
+    EXPECT_EQ(info(), std::make_pair(2, std::string("node7")));
+    EXPECT_TRUE(LogCapture::get().has("INFO", "getdomainname() failed"));
+
+    resolves = false;
+    EXPECT_EQ(info(), std::make_pair(2, std::string("node7")));
+
+    nameFails = true;
+    EXPECT_EQ(info(), std::make_pair(3, std::string("localhost")));
+    EXPECT_TRUE(LogCapture::get().has("INFO", "gethostname() FAILED. hostString will be filled with localhost"));
+}
+
+TEST(HostIdentitySystem, HostNameIsTheNodeName) {
+    struct utsname u;
+    ASSERT_EQ(uname(&u), 0);
+    LogCapture::get().mark();
+    EXPECT_STREQ(ProviderUtil::getHostName().c_str(), u.nodename);
+    EXPECT_TRUE(LogCapture::get().has("INFO", std::string("Host Name: ") + u.nodename));
+}
+
+// With the system resolver, every thread sees what a lone caller sees.
+TEST(HostIdentitySystem, ConcurrentCallersAgree) {
+    char expected[255] = {0};
+    const int expectedRc = ProviderUtil::getHostInfo(expected, sizeof(expected));
+    EXPECT_GT(std::strlen(expected), 0u);
+    std::vector<std::thread> threads;
+    std::vector<int> mismatches(8, 0);
+    for (int t = 0; t < 8; t++) {
+        threads.emplace_back([&, t] {
+            for (int i = 0; i < 50; i++) {
+                char buffer[255] = {0};
+                int rc = ProviderUtil::getHostInfo(buffer, sizeof(buffer));
+                mismatches[t] += rc != expectedRc || std::strcmp(buffer, expected) != 0;
+            }
+        });
+    }
+    for (std::thread& t : threads)
+        t.join();
+    for (int t = 0; t < 8; t++)
+        EXPECT_EQ(mismatches[t], 0) << "thread " << t;
+}
+
+}  // namespace

@@ -1,0 +1,48 @@
+#include <gtest/gtest.h>
+
+#include "gateway/CIMProviderTfaj.h"
+#include "gateway/ProviderInit.h"
+#include "gateway/ProviderUtil.h"
+#include "tests/gateway/TestSupport.h"
+
+using namespace CPTA;
+using gwtest::LogCapture;
+
+namespace {
+
+TEST(NoLibrary, StartsWithFallbacksAndFindsNothing) {
+    LogCapture& log = LogCapture::get();
+    ProviderInit::driverStatus = -1;
+    {
+        ProviderInit init;
+        EXPECT_FALSE(gTfajLibLoaded);
+        EXPECT_EQ(libHandle, nullptr);
+        EXPECT_EQ(ProviderInit::getDriverStatus(), 1);
+        EXPECT_TRUE(log.has("DBG", "Error in loading library: libdtfaj.so: cannot open shared object file"))
+            << log.text();
+        EXPECT_TRUE(log.has("INFO", "TFAJ Library version: NOT Loaded"));
+        EXPECT_TRUE(log.has("ERR", "libInitHbaLib returns NULL response or has error"));
+
+        int fallbacks = 0;
+#define ENTRY_POINT(kind, symbol, pointer) fallbacks += pointer == TVRN_EP_DEFAULT_##kind;
+#include "gateway/EntryPoints.def"
+#undef ENTRY_POINT
+        EXPECT_EQ(fallbacks, 117);
+        EXPECT_TRUE(libGetPortByWwn(Json::Value(Json::objectValue)).isNull());
+        EXPECT_EQ(libGetRequestID(), -1);
+        EXPECT_EQ(libGetNumOfAdapters(), 65535u);
+        EXPECT_EQ(libGetAgtVersion(), nullptr);
+        libRegisterEventProcessingCb(nullptr);
+
+        Json::Value list;
+        EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), -1);
+        EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber("1000000533a0b1c2").c_str(), "");
+        EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-K7M"));
+        EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");
+        EXPECT_EQ(ProviderUtil::getAdapterId("1000000533a0b1c2"), -1);
+        log.mark();
+    }
+    EXPECT_TRUE(log.has("DBG", "Inside ProviderInit Destructor."));
+}
+
+}  // namespace
