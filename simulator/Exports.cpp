@@ -1,0 +1,121 @@
+// The exported symbols of libdtfaj.so: the 117 library entry points, with the
+// plain names the module resolves, and the tvrn_sim_ control interface.
+#include "simulator/Library.h"
+#include "simulator/SimControl.h"
+
+#include <string>
+
+using tvrnsim::EntryId;
+using tvrnsim::Library;
+
+#define SIM_API extern "C" __attribute__((visibility("default")))
+
+namespace {
+
+int intQuery(EntryId id) {
+    Library::count(id);
+    switch (id) {
+    case tvrnsim::EP_getRequestID:
+        return Library::instance().nextRequestId();
+    case tvrnsim::EP_free_hba_lib:
+        return Library::instance().freeLibrary();
+    default:
+        return -1;
+    }
+}
+
+unsigned int uintQuery(EntryId id) {
+    Library::count(id);
+    return id == tvrnsim::EP_getNumberOfAdapters ? Library::instance().adapterCount() : 0xFFFFu;
+}
+
+const char* stringQuery(EntryId id) {
+    Library::count(id);
+    return id == tvrnsim::EP_get_agt_version ? Library::instance().version() : nullptr;
+}
+
+void eventCallback(EntryId id, void (*cb)(const char*)) {
+    Library::count(id);
+    Library::instance().setEventCallback(cb);
+}
+
+void logCallback(EntryId id, void (*cb)(int, const char*, int, const char*)) {
+    Library::count(id);
+    Library::instance().setLogCallback(cb);
+}
+
+// The delivery thread must be gone before the code it runs is unmapped.
+__attribute__((destructor)) void stopOnUnload() {
+    if (Library* lib = Library::existing()) lib->shutdown();
+}
+
+thread_local std::string tText;
+
+const char* keep(std::string text) {
+    tText = std::move(text);
+    return tText.c_str();
+}
+
+}  // namespace
+
+#define SIM_JSON(symbol) \
+    SIM_API Json::Value symbol(const Json::Value& request) { return Library::instance().callJson(tvrnsim::EP_##symbol, request); }
+#define SIM_INT_QUERY(symbol) \
+    SIM_API int symbol() { return intQuery(tvrnsim::EP_##symbol); }
+#define SIM_UINT_QUERY(symbol) \
+    SIM_API unsigned int symbol() { return uintQuery(tvrnsim::EP_##symbol); }
+#define SIM_STRING_QUERY(symbol) \
+    SIM_API const char* symbol() { return stringQuery(tvrnsim::EP_##symbol); }
+#define SIM_EVENT_CB(symbol) \
+    SIM_API void symbol(void (*cb)(const char*)) { eventCallback(tvrnsim::EP_##symbol, cb); }
+#define SIM_LOG_CB(symbol) \
+    SIM_API void symbol(void (*cb)(int, const char*, int, const char*)) { logCallback(tvrnsim::EP_##symbol, cb); }
+
+#define ENTRY_POINT(kind, symbol, pointer) SIM_##kind(symbol)
+#include "gateway/EntryPoints.def"
+#undef ENTRY_POINT
+
+// ---------------------------------------------------------------------------
+// Control interface
+
+SIM_API int tvrn_sim_load_fixture(const char* nameOrPath) { return Library::instance().loadFixture(nameOrPath); }
+
+SIM_API int tvrn_sim_load_fixture_text(const char* jsonText) {
+    return Library::instance().loadFixtureText(jsonText ? jsonText : "", "fixture text");
+}
+
+SIM_API int tvrn_sim_reset(void) { return Library::instance().reset(); }
+
+SIM_API const char* tvrn_sim_last_error(void) { return keep(Library::instance().lastError()); }
+
+SIM_API const char* tvrn_sim_fixture_dir(void) { return keep(Library::fixtureDir()); }
+
+SIM_API void tvrn_sim_set_version(const char* text) { Library::instance().setVersion(text); }
+
+SIM_API void tvrn_sim_set_init_result(int result) { Library::instance().setInitResult(result); }
+
+SIM_API int tvrn_sim_set_fault(const char* entryPoint, const char* key, int kind, int code, const char* text,
+                               int times) {
+    return Library::instance().setFault(entryPoint, key, kind, code, text, times);
+}
+
+SIM_API void tvrn_sim_clear_faults(void) { Library::instance().clearFaults(); }
+
+SIM_API unsigned long long tvrn_sim_call_count(const char* entryPoint) {
+    return Library::instance().callCount(entryPoint);
+}
+
+SIM_API unsigned long long tvrn_sim_total_calls(void) { return Library::instance().totalCalls(); }
+
+SIM_API void tvrn_sim_reset_counters(void) { Library::instance().resetCounters(); }
+
+SIM_API int tvrn_sim_emit_event(const char* text) {
+    if (!text) return -1;
+    return Library::instance().events().emit(text) ? 1 : 0;
+}
+
+SIM_API int tvrn_sim_wait_events(int timeoutMs) {
+    return Library::instance().events().waitDelivered(timeoutMs) ? 0 : -1;
+}
+
+SIM_API unsigned long long tvrn_sim_events_delivered(void) { return Library::instance().events().delivered(); }

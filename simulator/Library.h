@@ -1,0 +1,95 @@
+// The simulated adapter management library: one process-wide object holding
+// the host state, the injected faults, the call counters and the event hub.
+#ifndef TVRN_SIMULATOR_LIBRARY_H
+#define TVRN_SIMULATOR_LIBRARY_H
+
+#include "simulator/EntryTable.h"
+#include "simulator/Events.h"
+#include "simulator/Handlers.h"
+
+#include <json/json.h>
+
+#include <atomic>
+#include <cstdint>
+#include <mutex>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace tvrnsim {
+
+using LogCallback = void (*)(int level, const char* file, int line, const char* message);
+
+struct Fault {
+    int entry;
+    std::string key;  // lower case; empty: every request
+    int kind;
+    int code;
+    std::string text;
+    int remaining;  // > 0: fires that many more times; otherwise until cleared
+};
+
+class Library {
+public:
+    // Created on first use and never destroyed: the module may call in from its
+    // own static destructors after this library's have run.
+    static Library& instance();
+    // The object if it was created, else null (used at unload).
+    static Library* existing();
+
+    // Entry points.
+    Json::Value callJson(EntryId id, const Json::Value& request);
+    int nextRequestId();
+    int freeLibrary();
+    unsigned adapterCount();
+    const char* version();
+    void setEventCallback(EventCallback cb);
+    void setLogCallback(LogCallback cb);
+
+    // Control.
+    int loadFixture(const char* nameOrPath);
+    int loadFixtureText(const std::string& text, const std::string& source);
+    int reset();
+    std::string lastError();
+    static std::string fixtureDir();
+    void setVersion(const char* text);
+    void setInitResult(int result);
+    int setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times);
+    void clearFaults();
+    static void count(EntryId id) { counters_[id].fetch_add(1, std::memory_order_relaxed); }
+    std::uint64_t callCount(const char* entryPoint);
+    std::uint64_t totalCalls();
+    void resetCounters();
+    EventHub& events() { return events_; }
+    void shutdown();
+
+private:
+    Library() = default;
+    bool takeFault(EntryId id, const Json::Value& request, Fault& out);
+    Json::Value registerForEvents(const Json::Value& request);
+    Json::Value unregisterForEvents(const Json::Value& request);
+    void log(std::vector<LogLine> lines);
+    const char* intern(const std::string& text);
+    void fail(const std::string& source, const std::string& why);
+
+    std::mutex mu_;  // guards everything below but the counters and the event hub
+    State state_;
+    std::vector<Fault> faults_;
+    const char* version_ = nullptr;
+    std::set<std::string> versions_;  // every text version_ has pointed at stays alive
+    std::string reloadPath_;          // the current host's fixture file, if it came from one
+    std::string fixtureText_;         // else its text
+    std::string lastError_;
+    std::vector<LogLine> pendingLogs_;  // said before a log callback was registered
+    std::atomic<LogCallback> logCb_{nullptr};
+    EventHub events_;
+    static std::atomic<std::uint64_t> counters_[EP_COUNT];
+};
+
+// Changes an answer as a drop-member or wrong-type fault says. The path is
+// dot-separated; a numeric part indexes an array.
+void applyMemberFault(Json::Value& answer, const std::string& path, bool drop);
+
+}  // namespace tvrnsim
+
+#endif

@@ -1,0 +1,73 @@
+/* Control interface of the adapter-library simulator libdtfaj.so, for tests,
+ * benchmarks and tools. Link the simulator, or dlopen("libdtfaj.so") and look
+ * the functions up by name. Every function is safe to call from any thread. */
+#ifndef TVRN_SIMULATOR_SIMCONTROL_H
+#define TVRN_SIMULATOR_SIMCONTROL_H
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* What an injected fault does to a call of a JSON entry point. */
+enum tvrn_sim_fault_kind {
+    TVRN_SIM_FAULT_NULL_ANSWER = 1,     /* answer a null value */
+    TVRN_SIM_FAULT_ERROR_OBJECT = 2,    /* answer {"error": {"name", "code", "message": text}} */
+    TVRN_SIM_FAULT_HBA_AGENT_ERROR = 3, /* throw CPTA::HbaAgentError{code, text} */
+    TVRN_SIM_FAULT_STD_EXCEPTION = 4,   /* throw std::runtime_error(text) */
+    TVRN_SIM_FAULT_NON_STANDARD = 5,    /* throw the int code (no std::exception) */
+    TVRN_SIM_FAULT_DROP_MEMBER = 6,     /* remove member text ("a.b", "0.c") from the answer */
+    TVRN_SIM_FAULT_WRONG_TYPE = 7       /* replace member text with a value of another JSON type */
+};
+
+/* Loads a fixture: a path (anything with a '/') or a bare name looked up in the
+ * fixtures directory next to the library (".json" may be left out). NULL selects
+ * what the environment selects: $TVRN_SIM_FIXTURE, else "default.json".
+ * Replaces the host, the version text, the init result and the faults; state
+ * changes are discarded. Returns 0, or -1 when the fixture cannot be used: the
+ * host then has no adapters and tvrn_sim_last_error() says why. */
+int tvrn_sim_load_fixture(const char* nameOrPath);
+/* The same from JSON text. */
+int tvrn_sim_load_fixture_text(const char* jsonText);
+/* Reloads the current fixture and also clears the call counters, diagnostic
+ * requests and queued events. Event and callback registrations are kept. */
+int tvrn_sim_reset(void);
+/* Why the last load failed; "" after a successful load. Valid until the next
+ * call of this function on the same thread. */
+const char* tvrn_sim_last_error(void);
+/* The fixtures directory next to the library. Same lifetime rule. */
+const char* tvrn_sim_fixture_dir(void);
+
+/* The text get_agt_version answers (default "3.2.1"); NULL makes it answer NULL. */
+void tvrn_sim_set_version(const char* text);
+/* The "result" init_hba_lib answers (default 0). */
+void tvrn_sim_set_init_result(int result);
+
+/* Injects a fault into the JSON entry point `entryPoint`. With a non-empty
+ * `key` it fires only for requests that have a top-level string member equal to
+ * it (any case); such faults take precedence over ones without a key. `code`
+ * and `text` are used as the kind says. `times` > 0 fires that many times, then
+ * the fault is gone; otherwise it stays until cleared. Returns 0, or -1 for an
+ * unknown or non-JSON entry point or an unknown kind. */
+int tvrn_sim_set_fault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times);
+void tvrn_sim_clear_faults(void);
+
+/* Calls of one entry point (any kind) since the last counter reset; 0 for an
+ * unknown name. */
+unsigned long long tvrn_sim_call_count(const char* entryPoint);
+unsigned long long tvrn_sim_total_calls(void);
+void tvrn_sim_reset_counters(void);
+
+/* Queues an event text for the registered callback, delivered on the
+ * simulator's event thread. Returns 1 when queued, 0 when dropped because no
+ * client is registered for events, -1 for a NULL text. */
+int tvrn_sim_emit_event(const char* text);
+/* Waits until every queued event has been delivered: 0, or -1 on timeout. */
+int tvrn_sim_wait_events(int timeoutMs);
+/* Events delivered to a callback so far. */
+unsigned long long tvrn_sim_events_delivered(void);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

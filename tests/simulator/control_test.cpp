@@ -1,0 +1,226 @@
+// The control interface: fixtures, version and init result, fault injection
+// and call counters.
+#include "tests/simulator/SimTestSupport.h"
+
+#include "gateway/HbaAgentError.h"
+
+#include <fstream>
+#include <stdexcept>
+
+using namespace simtest;
+
+namespace {
+
+class Control : public SimTest {};
+
+const Json::Value kFcHbaReq = J(std::string("{\"wwn\": \"") + kFcHba + "\"}");
+const Json::Value kHpReq = J(std::string("{\"wwn\": \"") + kHpHba + "\"}");
+
+TEST_F(Control, VersionAndInitResult) {
+    tvrn_sim_set_version("2.9.9");
+    EXPECT_STREQ("2.9.9", get_agt_version());
+    const char* held = get_agt_version();
+    tvrn_sim_set_version("3.10.0");
+    EXPECT_STREQ("2.9.9", held);  // texts handed out stay valid
+    tvrn_sim_set_version(nullptr);
+    EXPECT_EQ(nullptr, get_agt_version());
+    tvrn_sim_set_init_result(5);
+    EXPECT_EQ(5, init_hba_lib(J(R"({"appId": 2})"))["result"].asInt());
+    EXPECT_TRUE(isError(init_hba_lib(J(R"({"appId": "two"})"))));
+    // Loading a fixture restores both.
+    tvrn_sim_load_fixture("default");
+    EXPECT_STREQ("3.2.1", get_agt_version());
+    EXPECT_EQ(0, init_hba_lib(J(R"({"appId": 2})"))["result"].asInt());
+}
+
+TEST_F(Control, AnswerFaults) {
+    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0));
+    EXPECT_TRUE(getHbaByWwn(kFcHbaReq).isNull());
+    tvrn_sim_clear_faults();
+    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_ERROR_OBJECT, 77, "adapter busy", 0));
+    Json::Value e = getHbaByWwn(kFcHbaReq);
+    EXPECT_EQ(77, e["error"]["code"].asInt());
+    EXPECT_EQ("adapter busy", e["error"]["message"].asString());
+    EXPECT_TRUE(e["error"]["name"].isString());
+    tvrn_sim_clear_faults();
+    EXPECT_FALSE(isError(getHbaByWwn(kFcHbaReq)));
+
+    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.isCNA", 0);
+    EXPECT_FALSE(getHbaByWwn(kFcHbaReq)["hbaData"].isMember("isCNA"));
+    EXPECT_TRUE(getHbaByWwn(kFcHbaReq)["hbaData"].isMember("model"));
+    tvrn_sim_clear_faults();
+    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData", 0);
+    EXPECT_TRUE(getHbaByWwn(kFcHbaReq)["hbaData"].isString());
+    tvrn_sim_clear_faults();
+    tvrn_sim_set_fault("getAllAdaptersIndexString", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, 0, "indexStrings.1", 0);
+    Json::Value all = getAllAdaptersIndexString(Json::Value());
+    EXPECT_TRUE(all["indexStrings"][0].isString());
+    EXPECT_TRUE(all["indexStrings"][1].isInt());
+    tvrn_sim_clear_faults();
+    tvrn_sim_set_fault("getAllRemotePorts", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "0", 0);
+    EXPECT_EQ(3u, getAllRemotePorts(J(std::string("{\"pPortWwn\": \"") + kFcPort0 + "\", \"lPortWwn\": \"" + kFcPort0 + "\"}")).size());
+}
+
+TEST_F(Control, ThrowFaults) {
+    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_HBA_AGENT_ERROR, 42, "no such port", 0);
+    const Json::Value req = J(std::string("{\"wwn\": \"") + kFcPort0 + "\"}");
+    try {
+        getPortByWwn(req);
+        ADD_FAILURE() << "no exception";
+    } catch (const CPTA::HbaAgentError& e) {
+        EXPECT_EQ(42, e.code);
+        EXPECT_EQ("no such port", e.message);
+    }
+    tvrn_sim_clear_faults();
+    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_STD_EXCEPTION, 0, "transport down", 0);
+    try {
+        getPortByWwn(req);
+        ADD_FAILURE() << "no exception";
+    } catch (const std::exception& e) {
+        EXPECT_STREQ("transport down", e.what());
+    }
+    tvrn_sim_clear_faults();
+    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_NON_STANDARD, 9, nullptr, 0);
+    EXPECT_THROW(getPortByWwn(req), int);
+}
+
+TEST_F(Control, FaultsByKeyAndCount) {
+    tvrn_sim_set_fault("getHbaByWwn", kHpHba, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0);
+    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_ERROR_OBJECT, 1, "any", 1);
+    EXPECT_TRUE(getHbaByWwn(kHpReq).isNull());   // the keyed fault wins
+    EXPECT_TRUE(isError(getHbaByWwn(kFcHbaReq)));  // the other fires once
+    EXPECT_FALSE(isError(getHbaByWwn(kFcHbaReq)));
+    EXPECT_TRUE(getHbaByWwn(J(R"({"wwn": "20:00:00:05:1E:5C:6D:70"})")).isNull());  // any case
+    tvrn_sim_clear_faults();
+    EXPECT_FALSE(getHbaByWwn(kHpReq).isNull());
+
+    EXPECT_EQ(-1, tvrn_sim_set_fault("noSuchEntry", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0));
+    EXPECT_EQ(-1, tvrn_sim_set_fault("getNumberOfAdapters", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0));
+    EXPECT_EQ(-1, tvrn_sim_set_fault("getHost", nullptr, 99, 0, nullptr, 0));
+    EXPECT_EQ(-1, tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "", 0));
+}
+
+TEST_F(Control, CallCounters) {
+    getHbaByWwn(kFcHbaReq);
+    getHbaByWwn(J("null"));
+    getNumberOfAdapters();
+    get_agt_version();
+    tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_NON_STANDARD, 1, nullptr, 0);
+    EXPECT_THROW(getHost(Json::Value()), int);
+    EXPECT_EQ(2u, tvrn_sim_call_count("getHbaByWwn"));
+    EXPECT_EQ(1u, tvrn_sim_call_count("getNumberOfAdapters"));
+    EXPECT_EQ(1u, tvrn_sim_call_count("getHost"));  // faulted calls count too
+    EXPECT_EQ(0u, tvrn_sim_call_count("getHbaByMac"));
+    EXPECT_EQ(0u, tvrn_sim_call_count("noSuchEntry"));
+    EXPECT_EQ(5u, tvrn_sim_total_calls());
+    tvrn_sim_reset_counters();
+    EXPECT_EQ(0u, tvrn_sim_total_calls());
+}
+
+TEST_F(Control, ResetDiscardsChanges) {
+    setAdapterState(J(std::string("{\"indexStr\": \"") + kFcHba + "\", \"enableState\": false}"));
+    tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0);
+    getRequestID();
+    ASSERT_EQ(0, tvrn_sim_reset());
+    EXPECT_EQ(0u, tvrn_sim_total_calls());
+    EXPECT_TRUE(getHbaByWwn(kFcHbaReq)["hbaData"]["hbaStatus"].asBool());
+    EXPECT_FALSE(getHost(Json::Value()).isNull());
+    EXPECT_EQ(1, getRequestID());
+}
+
+TEST_F(Control, FixturesByNameAndPath) {
+    EXPECT_EQ(0, tvrn_sim_load_fixture("empty"));
+    EXPECT_EQ(0u, getNumberOfAdapters());
+    EXPECT_EQ(0u, getAllAdaptersIndexString(Json::Value())["indexStrings"].size());
+    EXPECT_EQ(0, tvrn_sim_load_fixture((std::string(tvrn_sim_fixture_dir()) + "/default.json").c_str()));
+    EXPECT_EQ(5u, getNumberOfAdapters());
+    EXPECT_STREQ("", tvrn_sim_last_error());
+}
+
+// A fixture that cannot be used leaves a host without adapters and says why.
+TEST_F(Control, BadFixturesGiveClearErrors) {
+    struct Case {
+        const char* text;
+        const char* says;
+    };
+    const Case cases[] = {
+        {"{ not json", "not valid JSON"},
+        {"[]", "must be a JSON object"},
+        {R"({"adapters": [{"hbaData": {"model": "X"}}]})", "adapters[0].hbaData"},
+        {R"({"adapters": [{"hbaData": {"model": "X", "wwn": "1000000051e0a0b0c"}}]})", "adapters[0].hbaData.wwn"},
+        {R"({"adapters": [{"hbaData": {"model": "X", "wwn": "10:00:00:05:1e:0a:0b:0c"}, "fcPorts": [{"port": {"wwn": "10:00:00:05:1e:0a:0b:0c"}}]}, {"hbaData": {"model": "Y", "wwn": "10:00:00:05:1e:0a:0b:0c"}}]})", "duplicate"},
+        {R"({"adapters": [{"hbaData": {"model": "X", "wwn": "10:00:00:05:1e:0a:0b:0c"}, "ethPorts": [{"ethData": {"mac": "00:05:1e:00:00:01"}}]}]})", "CNA"},
+        {R"({"generate": {"fcHbas": -1}})", "generate.fcHbas"},
+        {R"({"faults": [{"entryPoint": "getHost", "kind": "explode"}]})", "faults[0]"},
+        {R"({"version": 3})", "version"},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.text);
+        testing::internal::CaptureStderr();
+        EXPECT_EQ(-1, tvrn_sim_load_fixture_text(c.text));
+        const std::string err = testing::internal::GetCapturedStderr();
+        EXPECT_NE(std::string::npos, std::string(tvrn_sim_last_error()).find(c.says)) << tvrn_sim_last_error();
+        EXPECT_NE(std::string::npos, err.find(c.says)) << err;
+        EXPECT_EQ(0u, getNumberOfAdapters());
+        EXPECT_EQ(0, init_hba_lib(J(R"({"appId": 2})"))["result"].asInt());
+    }
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(-1, tvrn_sim_load_fixture("/nonexistent/fixture.json"));
+    EXPECT_NE(std::string::npos, testing::internal::GetCapturedStderr().find("/nonexistent/fixture.json"));
+    EXPECT_NE(std::string::npos, std::string(tvrn_sim_last_error()).find("cannot open"));
+}
+
+TEST_F(Control, FixtureVersionFaultsAndDefaults) {
+    ASSERT_EQ(0, tvrn_sim_load_fixture_text(R"({
+        "version": null, "initResult": 5,
+        "faults": [{"entryPoint": "getPortByWwn", "kind": "hbaAgentError", "code": 3, "text": "gone", "key": "10:00:00:05:1e:00:00:01"}],
+        "adapters": [{"hbaData": {"model": "Tavrin-825", "wwn": "20:00:00:05:1e:00:00:01"},
+                      "fcPorts": [{"port": {"wwn": "10:00:00:05:1e:00:00:01"}}, {"port": {"wwn": "10:00:00:05:1e:00:00:02"}}]}]})"))
+        << tvrn_sim_last_error();
+    EXPECT_EQ(nullptr, get_agt_version());
+    EXPECT_EQ(5, init_hba_lib(J(R"({"appId": 2})"))["result"].asInt());
+    EXPECT_THROW(getPortByWwn(J(R"({"wwn": "10:00:00:05:1e:00:00:01"})")), CPTA::HbaAgentError);
+    // A minimal adapter gets every member the inventory reads.
+    Json::Value port = getPortByWwn(J(R"({"wwn": "10:00:00:05:1e:00:00:02"})"));
+    for (const char* m : {"nodeWwn", "operatingSpeed", "supportedPortSpeeds", "portTypeMOFValue", "maxFrameSize",
+                          "portStatusValue", "portStatus", "isMezz", "beaconState"})
+        EXPECT_TRUE(port.isMember(m)) << m;
+    Json::Value d = getHbaByWwn(J(R"({"wwn": "20:00:00:05:1e:00:00:01"})"));
+    EXPECT_EQ(2, d["hbaData"]["portCount"].asInt());
+    EXPECT_TRUE(d["driver"].isMember("storageDriverName"));
+    EXPECT_FALSE(d["driver"].isMember("networkDriverName"));
+}
+
+TEST_F(Control, GeneratedSan) {
+    ASSERT_EQ(0, tvrn_sim_load_fixture("large-san")) << tvrn_sim_last_error();
+    ASSERT_EQ(12u, getNumberOfAdapters());
+    Json::Value all = getAllAdaptersIndexString(Json::Value())["indexStrings"];
+    int ports = 0, disks = 0, tapes = 0, initiators = 0, luns = 0, eth = 0;
+    for (const Json::Value& a : all) {
+        eth += getEthPhyPortIndicesByAdapter(J("{\"indexStr\": \"" + a.asString() + "\"}"))["indexStrings"].size();
+        const Json::Value list = getFcPhyPortIndicesByAdapter(J("{\"indexStr\": \"" + a.asString() + "\"}"))["indexStrings"];
+        for (const Json::Value& p : list) {
+            ++ports;
+            const std::string pl = "{\"pPortWwn\": \"" + p.asString() + "\", \"lPortWwn\": \"" + p.asString() + "\"";
+            for (const Json::Value& r : getAllRemotePorts(J(pl + "}"))) {
+                Json::Value full = getCompleteRemotePort(J(pl + ", \"rPortWwn\": \"" + r["remotePortWwn"].asString() + "\"}"));
+                const std::string type = full["deviceData"]["type"].asString();
+                disks += type == "Disk";
+                tapes += type == "Tape";
+                initiators += !full["deviceData"]["isTarget"].asBool();
+                luns += full["lunList"].size();
+            }
+        }
+    }
+    EXPECT_EQ(24, ports);
+    EXPECT_EQ(8, eth);
+    EXPECT_EQ(24 * 60, disks);
+    EXPECT_EQ(24 * 4, tapes);
+    EXPECT_EQ(24 * 2, initiators);
+    EXPECT_EQ(24 * 64 * 16, luns);
+    // Scaled from parameters given as text.
+    ASSERT_EQ(0, tvrn_sim_load_fixture_text(R"({"generate": {"fcHbas": 300, "cnas": 1, "portsPerAdapter": 1}})"));
+    EXPECT_EQ(301u, getNumberOfAdapters());
+}
+
+}  // namespace
