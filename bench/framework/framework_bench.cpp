@@ -9,8 +9,10 @@
 
 #include "framework/Array.h"
 #include "framework/Datetime.h"
+#include "framework/Instance.h"
 #include "framework/Log.h"
 #include "framework/String.h"
+#include "schema/generated/TAVRIN_FCPort.h"
 
 using namespace CPTA;
 
@@ -45,12 +47,69 @@ static void BM_ArrayAppend(benchmark::State& state) {
 }
 BENCHMARK(BM_ArrayAppend)->Arg(64)->Arg(4096);
 
+static void BM_ArrayAppendString(benchmark::State& state) {
+    const String element("10000000c9a0b1c2");
+    for (auto _ : state) {
+        Array<String> a;
+        for (int i = 0; i < state.range(0); i++)
+            a.append(element);
+        benchmark::DoNotOptimize(a.data());
+    }
+    state.SetItemsProcessed(state.iterations() * state.range(0));
+}
+BENCHMARK(BM_ArrayAppendString)->Arg(64)->Arg(4096);
+
+// TAVRIN_FCPort has 73 features: the widest class the inventory builds.
+static TAVRIN_FCPort* filled_port() {
+    TAVRIN_FCPort* port = create<TAVRIN_FCPort>(true);
+    port->SystemCreationClassName.set("TAVRIN_ComputerSystem");
+    port->SystemName.set("192.168.10.21");
+    port->CreationClassName.set("TAVRIN_FCPort");
+    port->DeviceID.set("100000051e0a0b0c");
+    port->Name.set("200000051e0a0b0c:100000051e0a0b0c");
+    port->ElementName.set("200000051e0a0b0c:100000051e0a0b0c");
+    port->OperationalStatus.set(Array<uint16>());
+    port->OperationalStatus.value.append(2);
+    port->Speed.set(8000000000ULL);
+    return port;
+}
+
+static void BM_InstanceCreateDestroy(benchmark::State& state) {
+    for (auto _ : state) {
+        TAVRIN_FCPort* port = create<TAVRIN_FCPort>(true);
+        benchmark::DoNotOptimize(port);
+        destroy(port);
+    }
+}
+BENCHMARK(BM_InstanceCreateDestroy);
+
+static void BM_InstanceCloneDestroy(benchmark::State& state) {
+    TAVRIN_FCPort* port = filled_port();
+    for (auto _ : state) {
+        TAVRIN_FCPort* copy = clone(port);
+        benchmark::DoNotOptimize(copy);
+        destroy(copy);
+    }
+    destroy(port);
+}
+BENCHMARK(BM_InstanceCloneDestroy);
+
 static void BM_DatetimeParse(benchmark::State& state) {
     Datetime d;
     for (auto _ : state)
         benchmark::DoNotOptimize(d.set("20240131235959.123456+060"));
 }
 BENCHMARK(BM_DatetimeParse);
+
+static void BM_DatetimePrint(benchmark::State& state) {
+    Datetime d("20240131235959.123456+060");
+    char buffer[32];
+    for (auto _ : state) {
+        d.ascii(buffer, false);
+        benchmark::DoNotOptimize(buffer);
+    }
+}
+BENCHMARK(BM_DatetimePrint);
 
 // A message above the configured level, with logging configured and without.
 static void log_bench(benchmark::State& state, const char* config) {
