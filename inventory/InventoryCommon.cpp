@@ -1,0 +1,127 @@
+#include "inventory/InventoryCommon.h"
+
+#include <cstdio>
+#include <vector>
+
+#include "gateway/CIMProviderTfaj.h"
+#include "gateway/GuardedCall.h"
+#include "gateway/JsonAccess.h"
+
+namespace CPTA {
+
+void destroyInstances(Array<Instance*>& instances) {
+    for (size_t i = 0; i < instances.size(); i++)
+        destroy(instances[i]);
+    instances.clear();
+}
+
+void InstanceList::add(Instance* instance) {
+    if (instance == nullptr)
+        return;
+    try {
+        _items.append(instance);
+    } catch (...) {
+        destroy(instance);
+        throw;
+    }
+}
+
+void InstanceList::take(Array<Instance*>& instances) {
+    try {
+        _items.append(instances.data(), instances.size());
+    } catch (...) {
+        destroyInstances(instances);
+        throw;
+    }
+    instances.clear();
+}
+
+Array<Instance*> InstanceList::release() {
+    Array<Instance*> out;
+    out.swap(_items);
+    return out;
+}
+
+void logWalkException(const char* operation, const HbaAgentError* user, const std::exception* stdError) {
+    if (user != nullptr)
+        TVRN_LOG(LL_ERR, "%s ended by User exception %d: %s", operation, user->code,
+                 user->message.c_str());
+    else if (stdError != nullptr)
+        TVRN_LOG(LL_ERR, "%s ended by std exception: %s", operation, stdError->what());
+    else
+        TVRN_LOG(LL_ERR, "%s ended by default exception", operation);
+}
+
+String trimmedText(const String& text, size_t width) {
+    if (width == 0)
+        return String();
+    std::vector<char> buffer(width, '\0');
+    ProviderUtil::trimString(text.c_str(), buffer.data(), width);
+    return String(buffer.data());
+}
+
+String firstChars(const String& text, size_t width) {
+    return text.size() > width ? text.substr(0, width) : text;
+}
+
+Json::Value jsonText(const String& text) {
+    return Json::Value(text.c_str(), text.c_str() + text.size());
+}
+
+Json::Value keyRequest(const char* member, const String& key) {
+    Json::Value request(Json::objectValue);
+    request[member] = jsonText(key);
+    return request;
+}
+
+String decimal(long long value) {
+    char text[24];
+    std::snprintf(text, sizeof(text), "%lld", value);
+    return String(text);
+}
+
+uint16 enabledStateOf(long long portState) {
+    switch (portState) {
+    case 8: return 9;
+    case 9: return 4;
+    case 10: return 3;
+    case 11: return 2;
+    case 13: return 6;
+    default: return 1;
+    }
+}
+
+int listAdapters(Json::Value& answer, bool logCount) {
+    answer = libGetAllAdaptersIndexString(Json::Value());
+    if (!ProviderUtil::isValidJsonResponse(answer) ||
+        !jsonHas(answer, "indexStrings", Json::arrayValue)) {
+        TVRN_LOG(LL_ERR, "libGetAllAdaptersIndexString returns NULL.");
+        return -1;
+    }
+    int count = int(jsonArray(answer, "indexStrings").size());
+    if (logCount)
+        TVRN_LOG(LL_INFO, "Number of Adapters: %d", count);
+    return count;
+}
+
+String adapterKeyAt(const Json::Value& answer, int number) {
+    const Json::Value& keys = jsonArray(answer, "indexStrings");
+    if (number < 1 || Json::ArrayIndex(number) > keys.size())
+        return String();
+    return jsonAsString(keys[Json::ArrayIndex(number - 1)]);
+}
+
+bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
+    const Json::Value colonId = jsonText(colonForm(portId));
+    request = Json::Value(Json::objectValue);
+    request["pPortWwn"] = colonId;
+    request["lPortWwn"] = colonId;
+    guardedCall(LibCall("libGetAllRemotePorts"), libGetAllRemotePorts, request, remotePorts);
+    if (!ProviderUtil::isValidJsonResponse(remotePorts) || !remotePorts.isArray()) {
+        TVRN_LOG(LL_ERR, "libGetAllRemotePorts returns NULL.");
+        return false;
+    }
+    return true;
+}
+
+}  // namespace CPTA
