@@ -12,36 +12,42 @@ using tvrnsim::Library;
 
 namespace {
 
+// The entry points that take no JSON request.
 int intQuery(EntryId id) {
-    Library::count(id);
+    Library& lib = Library::instance();
+    lib.note(id);
     switch (id) {
     case tvrnsim::EP_getRequestID:
-        return Library::instance().nextRequestId();
+        return lib.nextRequestId();
     case tvrnsim::EP_free_hba_lib:
-        return Library::instance().freeLibrary();
+        return lib.freeLibrary();
     default:
         return -1;
     }
 }
 
 unsigned int uintQuery(EntryId id) {
-    Library::count(id);
-    return id == tvrnsim::EP_getNumberOfAdapters ? Library::instance().adapterCount() : 0xFFFFu;
+    Library& lib = Library::instance();
+    lib.note(id);
+    return id == tvrnsim::EP_getNumberOfAdapters ? lib.adapterCount() : 0xFFFFu;
 }
 
 const char* stringQuery(EntryId id) {
-    Library::count(id);
-    return id == tvrnsim::EP_get_agt_version ? Library::instance().version() : nullptr;
+    Library& lib = Library::instance();
+    lib.note(id);
+    return id == tvrnsim::EP_get_agt_version ? lib.version() : nullptr;
 }
 
 void eventCallback(EntryId id, void (*cb)(const char*)) {
-    Library::count(id);
-    Library::instance().setEventCallback(cb);
+    Library& lib = Library::instance();
+    lib.note(id);
+    lib.setEventCallback(cb);
 }
 
 void logCallback(EntryId id, void (*cb)(int, const char*, int, const char*)) {
-    Library::count(id);
-    Library::instance().setLogCallback(cb);
+    Library& lib = Library::instance();
+    lib.note(id);
+    lib.setLogCallback(cb);
 }
 
 // The delivery thread must be gone before the code it runs is unmapped.
@@ -49,11 +55,12 @@ __attribute__((destructor)) void stopOnUnload() {
     if (Library* lib = Library::existing()) lib->shutdown();
 }
 
-thread_local std::string tText;
-
+// Texts handed out by the control interface, one slot per function and thread.
+template <int Slot>
 const char* keep(std::string text) {
-    tText = std::move(text);
-    return tText.c_str();
+    thread_local std::string held;
+    held = std::move(text);
+    return held.c_str();
 }
 
 }  // namespace
@@ -86,9 +93,9 @@ SIM_API int tvrn_sim_load_fixture_text(const char* jsonText) {
 
 SIM_API int tvrn_sim_reset(void) { return Library::instance().reset(); }
 
-SIM_API const char* tvrn_sim_last_error(void) { return keep(Library::instance().lastError()); }
+SIM_API const char* tvrn_sim_last_error(void) { return keep<0>(Library::instance().lastError()); }
 
-SIM_API const char* tvrn_sim_fixture_dir(void) { return keep(Library::fixtureDir()); }
+SIM_API const char* tvrn_sim_fixture_dir(void) { return keep<1>(Library::fixtureDir()); }
 
 SIM_API void tvrn_sim_set_version(const char* text) { Library::instance().setVersion(text); }
 
@@ -108,6 +115,12 @@ SIM_API unsigned long long tvrn_sim_call_count(const char* entryPoint) {
 SIM_API unsigned long long tvrn_sim_total_calls(void) { return Library::instance().totalCalls(); }
 
 SIM_API void tvrn_sim_reset_counters(void) { Library::instance().resetCounters(); }
+
+SIM_API const char* tvrn_sim_recorded_calls(void) { return keep<2>(Library::instance().recordedCalls()); }
+
+SIM_API unsigned long long tvrn_sim_recorded_dropped(void) { return Library::instance().recordedDropped(); }
+
+SIM_API void tvrn_sim_clear_recording(void) { Library::instance().clearRecording(); }
 
 SIM_API int tvrn_sim_emit_event(const char* text) {
     if (!text) return -1;

@@ -1,12 +1,14 @@
 #include "simulator/Library.h"
 
 #include "gateway/HbaAgentError.h"
+#include "simulator/BuiltinFixture.h"
 #include "simulator/SimControl.h"
 
 #include <dlfcn.h>
 #include <sys/stat.h>
 
 #include <cerrno>
+#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -14,15 +16,17 @@
 #include <memory>
 #include <sstream>
 #include <stdexcept>
+#include <thread>
 
 namespace tvrnsim {
-
-std::atomic<std::uint64_t> Library::counters_[EP_COUNT];
 
 namespace {
 
 const char kDefaultVersion[] = "3.2.1";
 const size_t kMaxPendingLogs = 64;
+const size_t kMaxRecordedCalls = 100000;
+const int kMaxDelayMs = 600000;
+const char kBuiltinSource[] = "built-in host";
 
 std::atomic<Library*> gInstance{nullptr};
 
@@ -39,15 +43,21 @@ const KindName kKindNames[] = {
     {"null", TVRN_SIM_FAULT_NULL_ANSWER},          {"error", TVRN_SIM_FAULT_ERROR_OBJECT},
     {"hbaAgentError", TVRN_SIM_FAULT_HBA_AGENT_ERROR}, {"stdException", TVRN_SIM_FAULT_STD_EXCEPTION},
     {"nonStandardException", TVRN_SIM_FAULT_NON_STANDARD}, {"dropMember", TVRN_SIM_FAULT_DROP_MEMBER},
-    {"wrongType", TVRN_SIM_FAULT_WRONG_TYPE},
+    {"wrongType", TVRN_SIM_FAULT_WRONG_TYPE}, {"delay", TVRN_SIM_FAULT_DELAY},
 };
 
-bool validFault(int id, int kind, const std::string& text) {
+bool isMemberFault(int kind) { return kind == TVRN_SIM_FAULT_DROP_MEMBER || kind == TVRN_SIM_FAULT_WRONG_TYPE; }
+
+bool validFault(int id, int kind, int code, const std::string& text) {
     if (id < 0 || kEntries[id].kind != EntryKind::JSON) return false;
-    if (kind < TVRN_SIM_FAULT_NULL_ANSWER || kind > TVRN_SIM_FAULT_WRONG_TYPE) return false;
-    if ((kind == TVRN_SIM_FAULT_DROP_MEMBER || kind == TVRN_SIM_FAULT_WRONG_TYPE) && text.empty()) return false;
+    if (kind < TVRN_SIM_FAULT_NULL_ANSWER || kind > TVRN_SIM_FAULT_DELAY) return false;
+    if (isMemberFault(kind) && text.empty()) return false;
+    if (kind == TVRN_SIM_FAULT_DELAY && (code < 0 || code > kMaxDelayMs)) return false;
     return true;
 }
+
+// "default" and "default.json" name the built-in host.
+bool isBuiltinName(const std::string& name) { return name == "default" || name == "default.json"; }
 
 // The faults a fixture lists: [{"entryPoint", "kind", "key", "code", "text", "times"}].
 std::vector<Fault> parseFaults(const Json::Value& list) {
@@ -67,8 +77,9 @@ std::vector<Fault> parseFaults(const Json::Value& list) {
             throw FixtureError(where + ": \"key\" and \"text\" are texts, \"code\" and \"times\" integers");
         Fault fault{entryIdByName(f["entryPoint"].asCString()), lowerCase(f.get("key", "").asString()), kind,
                     f.get("code", 0).asInt(), f.get("text", "").asString(), f.get("times", 0).asInt()};
-        if (!validFault(fault.entry, kind, fault.text))
-            throw FixtureError(where + ": unknown JSON entry point or fault kind, or a member fault without \"text\"");
+        if (!validFault(fault.entry, kind, fault.code, fault.text))
+            throw FixtureError(where + ": unknown JSON entry point or fault kind, a member fault without \"text\","
+                                       " or a delay \"code\" that is not 0 to 600000 milliseconds");
         out.push_back(fault);
     }
     return out;
@@ -101,8 +112,19 @@ void Library::shutdown() { events_.shutdown(); }
 // ---------------------------------------------------------------------------
 // Entry points
 
+void Library::note(EntryId id, const Json::Value* request) {
+    counters_[id].fetch_add(1, std::memory_order_relaxed);
+    RecordedCall call{id, request ? *request : Json::Value()};
+    std::lock_guard<std::mutex> lock(recordMu_);
+    if (recorded_.size() >= kMaxRecordedCalls) {
+        recorded_.pop_front();
+        ++recordDropped_;
+    }
+    recorded_.push_back(std::move(call));
+}
+
 Json::Value Library::callJson(EntryId id, const Json::Value& request) {
-    count(id);
+    note(id, &request);
     Fault fault;
     const bool faulted = takeFault(id, request, fault);
     if (faulted) {
@@ -117,6 +139,10 @@ Json::Value Library::callJson(EntryId id, const Json::Value& request) {
             throw std::runtime_error(fault.text);
         case TVRN_SIM_FAULT_NON_STANDARD:
             throw fault.code;
+        case TVRN_SIM_FAULT_DELAY:
+            // Outside every lock: other calls go on meanwhile.
+            std::this_thread::sleep_for(std::chrono::milliseconds(fault.code));
+            break;
         default:
             break;
         }
@@ -142,7 +168,8 @@ Json::Value Library::callJson(EntryId id, const Json::Value& request) {
         }
         log(std::move(lines));
     }
-    if (faulted) applyMemberFault(answer, fault.text, fault.kind == TVRN_SIM_FAULT_DROP_MEMBER);
+    if (faulted && isMemberFault(fault.kind))
+        applyMemberFault(answer, fault.text, fault.kind == TVRN_SIM_FAULT_DROP_MEMBER);
     return answer;
 }
 
@@ -236,8 +263,9 @@ std::string Library::fixtureDir() {
 
 int Library::loadFixture(const char* nameOrPath) {
     const char* env = std::getenv("TVRN_SIM_FIXTURE");
-    std::string wanted = nameOrPath ? nameOrPath : (env ? env : "");
-    if (wanted.empty()) wanted = "default.json";
+    const std::string wanted = nameOrPath ? nameOrPath : (env ? env : "");
+    if (wanted.empty() || isBuiltinName(wanted))
+        return loadFixtureText(std::string(kBuiltinFixture, kBuiltinFixtureSize), kBuiltinSource);
     std::string path = wanted;
     if (wanted.find('/') == std::string::npos) {
         path = fixtureDir() + "/" + wanted;
@@ -247,29 +275,15 @@ int Library::loadFixture(const char* nameOrPath) {
     }
     std::ifstream in(path, std::ios::binary);
     if (!in) {
-        const std::string why = std::string("cannot open the file: ") + std::strerror(errno);
-        {
-            std::lock_guard<std::mutex> lock(mu_);
-            reloadPath_ = path;
-            fixtureText_.clear();
-        }
-        fail(path, why);
+        fail(path, std::string("cannot open the file: ") + std::strerror(errno));
         return -1;
     }
     std::stringstream text;
     text << in.rdbuf();
-    const int rc = loadFixtureText(text.str(), path);
-    std::lock_guard<std::mutex> lock(mu_);
-    reloadPath_ = path;
-    return rc;
+    return loadFixtureText(text.str(), path);
 }
 
 int Library::loadFixtureText(const std::string& text, const std::string& source) {
-    {
-        std::lock_guard<std::mutex> lock(mu_);
-        reloadPath_.clear();
-        fixtureText_ = text;
-    }
     Json::Value fixture;
     Json::CharReaderBuilder builder;
     std::unique_ptr<Json::CharReader> reader(builder.newCharReader());
@@ -325,18 +339,13 @@ void Library::fail(const std::string& source, const std::string& why) {
 }
 
 int Library::reset() {
-    std::string path, text;
-    {
-        std::lock_guard<std::mutex> lock(mu_);
-        path = reloadPath_;
-        text = fixtureText_;
-    }
-    const int rc = !path.empty() ? loadFixture(path.c_str()) : loadFixtureText(text, "fixture text");
+    const int rc = loadFixture(nullptr);
     {
         std::lock_guard<std::mutex> lock(mu_);
         state_.nextRequestId = 1;
     }
     resetCounters();
+    clearRecording();
     events_.discardQueued();
     return rc;
 }
@@ -364,7 +373,7 @@ void Library::setInitResult(int result) {
 int Library::setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times) {
     const int id = entryIdByName(entryPoint);
     const std::string t = text ? text : "";
-    if (!validFault(id, kind, t)) return -1;
+    if (!validFault(id, kind, code, t)) return -1;
     std::lock_guard<std::mutex> lock(mu_);
     faults_.push_back(Fault{id, lowerCase(key ? key : ""), kind, code, t, times});
     return 0;
@@ -412,6 +421,32 @@ std::uint64_t Library::totalCalls() {
 
 void Library::resetCounters() {
     for (auto& c : counters_) c.store(0, std::memory_order_relaxed);
+}
+
+std::string Library::recordedCalls() {
+    Json::Value list(Json::arrayValue);
+    {
+        std::lock_guard<std::mutex> lock(recordMu_);
+        list.resize(static_cast<Json::ArrayIndex>(recorded_.size()));
+        Json::ArrayIndex i = 0;
+        for (const RecordedCall& call : recorded_) {
+            Json::Value& e = list[i++];
+            e["entry"] = kEntries[call.id].name;
+            e["request"] = call.request;
+        }
+    }
+    return compact(list);
+}
+
+std::uint64_t Library::recordedDropped() {
+    std::lock_guard<std::mutex> lock(recordMu_);
+    return recordDropped_;
+}
+
+void Library::clearRecording() {
+    std::lock_guard<std::mutex> lock(recordMu_);
+    recorded_.clear();
+    recordDropped_ = 0;
 }
 
 void applyMemberFault(Json::Value& answer, const std::string& path, bool drop) {

@@ -1,5 +1,6 @@
 // The simulated adapter management library: one process-wide object holding
-// the host state, the injected faults, the call counters and the event hub.
+// the host state, the injected faults, the call counters and recording, and
+// the event hub.
 #ifndef TVRN_SIMULATOR_LIBRARY_H
 #define TVRN_SIMULATOR_LIBRARY_H
 
@@ -11,6 +12,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <deque>
 #include <mutex>
 #include <set>
 #include <string>
@@ -37,7 +39,9 @@ public:
     // The object if it was created, else null (used at unload).
     static Library* existing();
 
-    // Entry points.
+    // Entry points. Every call is first noted (counted and recorded); callJson
+    // does that itself.
+    void note(EntryId id, const Json::Value* request = nullptr);
     Json::Value callJson(EntryId id, const Json::Value& request);
     int nextRequestId();
     int freeLibrary();
@@ -49,6 +53,7 @@ public:
     // Control.
     int loadFixture(const char* nameOrPath);
     int loadFixtureText(const std::string& text, const std::string& source);
+    // Back to the start-up host, with counters, recording and queues cleared.
     int reset();
     std::string lastError();
     static std::string fixtureDir();
@@ -56,10 +61,13 @@ public:
     void setInitResult(int result);
     int setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times);
     void clearFaults();
-    static void count(EntryId id) { counters_[id].fetch_add(1, std::memory_order_relaxed); }
     std::uint64_t callCount(const char* entryPoint);
     std::uint64_t totalCalls();
     void resetCounters();
+    // The recorded calls as a JSON array text, and how many did not fit.
+    std::string recordedCalls();
+    std::uint64_t recordedDropped();
+    void clearRecording();
     EventHub& events() { return events_; }
     void shutdown();
 
@@ -77,13 +85,19 @@ private:
     std::vector<Fault> faults_;
     const char* version_ = nullptr;
     std::set<std::string> versions_;  // every text version_ has pointed at stays alive
-    std::string reloadPath_;          // the current host's fixture file, if it came from one
-    std::string fixtureText_;         // else its text
     std::string lastError_;
     std::vector<LogLine> pendingLogs_;  // said before a log callback was registered
     std::atomic<LogCallback> logCb_{nullptr};
     EventHub events_;
-    static std::atomic<std::uint64_t> counters_[EP_COUNT];
+    std::atomic<std::uint64_t> counters_[EP_COUNT] = {};
+
+    struct RecordedCall {
+        EntryId id;
+        Json::Value request;  // null for entry points without a JSON request
+    };
+    std::mutex recordMu_;  // guards the recording only, so that it never waits for a handler
+    std::deque<RecordedCall> recorded_;
+    std::uint64_t recordDropped_ = 0;
 };
 
 // Changes an answer as a drop-member or wrong-type fault says. The path is

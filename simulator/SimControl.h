@@ -16,19 +16,22 @@ enum tvrn_sim_fault_kind {
     TVRN_SIM_FAULT_STD_EXCEPTION = 4,   /* throw std::runtime_error(text) */
     TVRN_SIM_FAULT_NON_STANDARD = 5,    /* throw the int code (no std::exception) */
     TVRN_SIM_FAULT_DROP_MEMBER = 6,     /* remove member text ("a.b", "0.c") from the answer */
-    TVRN_SIM_FAULT_WRONG_TYPE = 7       /* replace member text with a value of another JSON type */
+    TVRN_SIM_FAULT_WRONG_TYPE = 7,      /* replace member text with a value of another JSON type */
+    TVRN_SIM_FAULT_DELAY = 8            /* wait `code` milliseconds, then answer as usual */
 };
 
-/* Loads a fixture: a path (anything with a '/') or a bare name looked up in the
- * fixtures directory next to the library (".json" may be left out). NULL selects
- * what the environment selects: $TVRN_SIM_FIXTURE, else "default.json".
- * Replaces the host, the version text, the init result and the faults; state
- * changes are discarded. Returns 0, or -1 when the fixture cannot be used: the
- * host then has no adapters and tvrn_sim_last_error() says why. */
+/* Loads a fixture: "default" (or "default.json") is the built-in host, compiled
+ * into the library; another bare name is looked up in the fixtures directory
+ * next to the library (".json" may be left out); anything with a '/' is a path.
+ * NULL selects the start-up host: $TVRN_SIM_FIXTURE when set, else the built-in
+ * host. Replaces the host, the version text, the init result and the faults;
+ * state changes are discarded. Returns 0, or -1 when the fixture cannot be
+ * used: the host then has no adapters and tvrn_sim_last_error() says why. */
 int tvrn_sim_load_fixture(const char* nameOrPath);
 /* The same from JSON text. */
 int tvrn_sim_load_fixture_text(const char* jsonText);
-/* Reloads the current fixture and also clears the call counters, diagnostic
+/* Back to the start-up host (as tvrn_sim_load_fixture(NULL)) with no faults,
+ * and clears the call counters, the recorded calls, request ids, diagnostic
  * requests and queued events. Event and callback registrations are kept. */
 int tvrn_sim_reset(void);
 /* Why the last load failed; "" after a successful load. Valid until the next
@@ -47,7 +50,8 @@ void tvrn_sim_set_init_result(int result);
  * it (any case); such faults take precedence over ones without a key. `code`
  * and `text` are used as the kind says. `times` > 0 fires that many times, then
  * the fault is gone; otherwise it stays until cleared. Returns 0, or -1 for an
- * unknown or non-JSON entry point or an unknown kind. */
+ * unknown or non-JSON entry point, an unknown kind, a member fault without
+ * `text`, or a delay outside 0 to 600000 milliseconds. */
 int tvrn_sim_set_fault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times);
 void tvrn_sim_clear_faults(void);
 
@@ -56,6 +60,16 @@ void tvrn_sim_clear_faults(void);
 unsigned long long tvrn_sim_call_count(const char* entryPoint);
 unsigned long long tvrn_sim_total_calls(void);
 void tvrn_sim_reset_counters(void);
+
+/* The calls since the recording was last cleared, oldest first, as the text of
+ * one JSON array: [{"entry": "getHbaByWwn", "request": {"wwn": "..."}}, ...].
+ * Entry points that take no JSON request are listed with a null "request";
+ * faulted calls are listed too. Only the latest 100000 calls are kept. Valid
+ * until the next call of this function on the same thread. */
+const char* tvrn_sim_recorded_calls(void);
+/* Calls that were dropped from the recording because it was full. */
+unsigned long long tvrn_sim_recorded_dropped(void);
+void tvrn_sim_clear_recording(void);
 
 /* Queues an event text for the registered callback, delivered on the
  * simulator's event thread. Returns 1 when queued, 0 when dropped because no

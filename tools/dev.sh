@@ -17,8 +17,9 @@ root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 build=${TVRN_BUILD_DIR:-$root/build}
 jobs=${TVRN_JOBS:-2}
 
+# tftpd-hpa: the TFTP download tests start its in.tftpd on loopback themselves.
 packages=(build-essential cmake pkg-config python3 libjsoncpp-dev
-          libgtest-dev libgmock-dev libbenchmark-dev)
+          libgtest-dev libgmock-dev libbenchmark-dev tftpd-hpa)
 
 install_missing() {
   local missing=() p
@@ -35,6 +36,18 @@ install_missing() {
   echo "Installing: ${missing[*]}"
   DEBIAN_FRONTEND=noninteractive apt-get update -qq
   DEBIAN_FRONTEND=noninteractive $cmd
+  case " ${missing[*]} " in *" tftpd-hpa "*) quiet_tftpd_service ;; esac
+}
+
+# The package installs a system-wide TFTP service on port 69; the tests need
+# only the program, so the service is stopped and kept from starting at boot.
+quiet_tftpd_service() {
+  if command -v systemctl >/dev/null 2>&1 && [ -d /run/systemd/system ]; then
+    systemctl disable --now tftpd-hpa >/dev/null 2>&1 || true
+  else
+    invoke-rc.d tftpd-hpa stop >/dev/null 2>&1 || true
+    update-rc.d tftpd-hpa disable >/dev/null 2>&1 || true
+  fi
 }
 
 configure_and_build() {

@@ -2,6 +2,10 @@
 
 #include <dlfcn.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cstdio>
@@ -10,6 +14,8 @@
 #include <fstream>
 #include <sstream>
 #include <stdexcept>
+
+#include "simulator/SimControl.h"
 
 namespace gwtest {
 
@@ -93,6 +99,17 @@ int LogCapture::count(const std::string& level, const std::string& message) cons
     return n;
 }
 
+int LogCapture::countContaining(const std::string& level, const std::string& text) const {
+    int n = 0;
+    for (const std::string& line : lines()) {
+        size_t body = line.find("): ");
+        if (line.compare(0, level.size() + 2, level + ": ") == 0 && body != std::string::npos &&
+            line.find(text, body + 3) != std::string::npos)
+            n++;
+    }
+    return n;
+}
+
 // ---- files ----------------------------------------------------------------------
 
 ScratchDir::ScratchDir() : _path(makeTempDir("tvrn-gw-")) {}
@@ -137,49 +154,98 @@ Json::Value parseJson(const std::string& text) {
     return value;
 }
 
-// ---- FakeLibrary ----------------------------------------------------------------
+// ---- SimLibrary -----------------------------------------------------------------
 
-FakeLibrary::FakeLibrary(const char* path) : _path(path) {
+SimLibrary::SimLibrary(const char* path) : _path(path) {
     _handle = dlopen(path, RTLD_NOW | RTLD_GLOBAL);
     if (_handle == nullptr)
-        throw std::runtime_error(std::string("cannot load fake library: ") + dlerror());
-    reset();
+        throw std::runtime_error(std::string("cannot load the simulator: ") + dlerror());
 }
 
-template <typename T>
-T FakeLibrary::resolve(const char* name) const {
+void* SimLibrary::resolve(const char* name) const {
     void* address = dlsym(_handle, name);
     if (address == nullptr)
-        throw std::runtime_error(std::string("fake library lacks ") + name);
-    return reinterpret_cast<T>(address);
+        throw std::runtime_error(std::string("the simulator lacks ") + name);
+    return address;
 }
 
-void FakeLibrary::reset() { resolve<void (*)()>("fake_tfaj_reset")(); }
+// The control function `name` of the loaded copy, with its declared type.
+#define SIM_CONTROL(name) reinterpret_cast<decltype(&::name)>(resolve(#name))
 
-void FakeLibrary::on(const char* symbol, const FakeHandler& handler) {
-    resolve<void (*)(const char*, const FakeHandler*)>("fake_tfaj_on")(symbol, &handler);
+void SimLibrary::reset() {
+    if (SIM_CONTROL(tvrn_sim_reset)() != 0)
+        throw std::runtime_error(std::string("simulator reset: ") + SIM_CONTROL(tvrn_sim_last_error)());
 }
 
-int FakeLibrary::calls(const char* symbol) const {
-    return resolve<int (*)(const char*)>("fake_tfaj_calls")(symbol);
+void SimLibrary::loadFixture(const char* nameOrPath) {
+    if (SIM_CONTROL(tvrn_sim_load_fixture)(nameOrPath) != 0)
+        throw std::runtime_error(std::string("simulator fixture: ") + SIM_CONTROL(tvrn_sim_last_error)());
 }
 
-Json::Value FakeLibrary::lastRequest(const char* symbol) const {
-    Json::Value request;
-    resolve<void (*)(const char*, Json::Value*)>("fake_tfaj_last_request")(symbol, &request);
-    return request;
+void SimLibrary::loadFixtureText(const std::string& json) {
+    if (SIM_CONTROL(tvrn_sim_load_fixture_text)(json.c_str()) != 0)
+        throw std::runtime_error(std::string("simulator fixture: ") + SIM_CONTROL(tvrn_sim_last_error)());
 }
 
-void FakeLibrary::setVersion(const char* version) {
-    resolve<void (*)(const char*)>("fake_tfaj_set_version")(version);
+void SimLibrary::setVersion(const char* version) { SIM_CONTROL(tvrn_sim_set_version)(version); }
+
+void SimLibrary::setInitResult(int result) { SIM_CONTROL(tvrn_sim_set_init_result)(result); }
+
+void SimLibrary::setFault(const char* entry, const char* key, int kind, int code, const char* text, int times) {
+    if (SIM_CONTROL(tvrn_sim_set_fault)(entry, key, kind, code, text, times) != 0)
+        throw std::runtime_error(std::string("simulator refused a fault for ") + entry);
 }
 
-void FakeLibrary::setAdapterCount(unsigned int count) {
-    resolve<void (*)(unsigned int)>("fake_tfaj_set_adapter_count")(count);
+unsigned long long SimLibrary::calls(const char* entry) const { return SIM_CONTROL(tvrn_sim_call_count)(entry); }
+
+Json::Value SimLibrary::recorded() const { return parseJson(SIM_CONTROL(tvrn_sim_recorded_calls)()); }
+
+#undef SIM_CONTROL
+
+std::vector<std::string> SimLibrary::entriesCalled() const {
+    std::vector<std::string> names;
+    for (const Json::Value& call : recorded())
+        names.push_back(call["entry"].asString());
+    return names;
 }
 
-FakeLogCB FakeLibrary::logCallback() const {
-    return resolve<FakeLogCB (*)()>("fake_tfaj_log_callback")();
+std::vector<Json::Value> SimLibrary::requests(const char* entry) const {
+    std::vector<Json::Value> found;
+    for (const Json::Value& call : recorded())
+        if (call["entry"].asString() == entry)
+            found.push_back(call["request"]);
+    return found;
+}
+
+Json::Value SimLibrary::lastRequest(const char* entry) const {
+    std::vector<Json::Value> found = requests(entry);
+    return found.empty() ? Json::Value() : found.back();
+}
+
+// ---- fresh processes -------------------------------------------------------------
+
+void inFreshProcess(const std::function<void()>& scenario) {
+    LogCapture::get();  // one log for parent and child, removed by the parent
+    std::fflush(nullptr);
+    pid_t child = fork();
+    ASSERT_NE(child, -1) << "fork failed";
+    if (child == 0) {
+        int rc = 2;
+        try {
+            scenario();
+            rc = ::testing::Test::HasFailure() ? 1 : 0;
+        } catch (const std::exception& e) {
+            std::fprintf(stderr, "scenario threw: %s\n", e.what());
+        } catch (...) {
+            std::fprintf(stderr, "scenario threw\n");
+        }
+        std::fflush(nullptr);
+        _exit(rc);  // no exit handlers: they belong to the parent
+    }
+    int status = 0;
+    ASSERT_EQ(waitpid(child, &status, 0), child);
+    const bool passed = WIFEXITED(status) && WEXITSTATUS(status) == 0;
+    EXPECT_TRUE(passed) << "the scenario failed in its own process (see above); wait status " << status;
 }
 
 }  // namespace gwtest

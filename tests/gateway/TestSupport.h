@@ -1,14 +1,13 @@
-// Shared helpers of the gateway tests: reading the module's log, loading a
-// fake adapter library, and scratch directories.
+// Shared helpers of the gateway tests: reading the module's log, loading the
+// adapter-library simulator, fresh processes, and scratch directories.
 #ifndef TVRN_TESTS_GATEWAY_TESTSUPPORT_H
 #define TVRN_TESTS_GATEWAY_TESTSUPPORT_H
 
+#include <functional>
 #include <string>
 #include <vector>
 
 #include <json/json.h>
-
-#include "tests/gateway/FakeTfaj.h"
 
 namespace gwtest {
 
@@ -31,6 +30,8 @@ public:
     bool has(const std::string& level, const std::string& message) const {
         return count(level, message) > 0;
     }
+    // Number of lines since the mark at this level whose message contains `text`.
+    int countContaining(const std::string& level, const std::string& text) const;
     // All text since the mark, for failure messages.
     std::string text() const;
     const std::string& home() const { return _home; }
@@ -62,28 +63,42 @@ std::string readFile(const std::string& path);
 void writeFile(const std::string& path, const std::string& content);
 bool fileExists(const std::string& path);
 
-// A fake adapter library loaded by path before the binding looks for
-// libdtfaj.so (which then finds it by its soname). Reset on construction.
-class FakeLibrary {
+// The adapter-library simulator (TVRN_SIM_LIBRARY, or a variant of it) loaded
+// by path before the binding looks for libdtfaj.so, which then finds this copy
+// by its soname. Wraps the simulator's control interface.
+class SimLibrary {
 public:
-    explicit FakeLibrary(const char* path);
+    explicit SimLibrary(const char* path);
     const std::string& path() const { return _path; }
     void* handle() const { return _handle; }
 
+    // Back to the built-in host: no faults, counters and recording cleared.
     void reset();
-    void on(const char* symbol, const FakeHandler& handler);
-    int calls(const char* symbol) const;
-    Json::Value lastRequest(const char* symbol) const;
+    void loadFixture(const char* nameOrPath);
+    void loadFixtureText(const std::string& json);
     void setVersion(const char* version);
-    void setAdapterCount(unsigned int count);
-    FakeLogCB logCallback() const;
+    void setInitResult(int result);
+    void setFault(const char* entry, const char* key, int kind, int code = 0, const char* text = nullptr,
+                  int times = 0);
+    unsigned long long calls(const char* entry) const;
+    // The recorded calls: entry point names in order, and the requests of one
+    // entry point in order.
+    std::vector<std::string> entriesCalled() const;
+    std::vector<Json::Value> requests(const char* entry) const;
+    Json::Value lastRequest(const char* entry) const;
 
 private:
-    template <typename T>
-    T resolve(const char* name) const;
+    void* resolve(const char* name) const;
+    Json::Value recorded() const;
     std::string _path;
     void* _handle;
 };
+
+// Runs `scenario` in a child process and fails the current test when the
+// scenario fails there (its failures are printed by the child). The adapter
+// library is bound once per process, so a scenario that starts the library as
+// a freshly loaded module does needs a process of its own.
+void inFreshProcess(const std::function<void()>& scenario);
 
 Json::Value parseJson(const std::string& text);
 

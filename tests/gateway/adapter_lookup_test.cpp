@@ -1,9 +1,13 @@
+// The binding and the adapter look-ups against the simulator's built-in host:
+// Tavrin-825 (FC), an HP OEM Tavrin-1860 (FC) and a Tavrin-1020 CNA.
 #include <gtest/gtest.h>
 
-#include <map>
+#include <dlfcn.h>
 
+#include "gateway/CIMProviderTfaj.h"
 #include "gateway/ProviderUtil.h"
-#include "tests/gateway/BoundFake.h"
+#include "simulator/SimControl.h"
+#include "tests/gateway/BoundSimulator.h"
 
 using namespace CPTA;
 using gwtest::LogCapture;
@@ -11,153 +15,184 @@ using gwtest::parseJson;
 
 namespace {
 
-const char kWwn[] = "10:00:00:05:33:a0:b1:c2";
-const char kMac[] = "00:05:33:aa:bb:cc";
+const char kFc[] = "20:00:00:05:1e:0a:0b:0c";  // adapter 1
+const char kFcRaw[] = "200000051e0a0b0c";
+const char kHp[] = "20:00:00:05:1e:5c:6d:70";  // adapter 2
+const char kHpRaw[] = "200000051e5c6d70";
+const char kCna[] = "00:05:1e:8a:4b:00";  // adapter 3
+const char kCnaRaw[] = "00051e8a4b00";
 
 class AdapterLookup : public ::testing::Test {
 protected:
     void SetUp() override {
-        fake = &gwtest::boundFake();
-        setAdapterList(R"({"indexStrings": ["10:00:00:05:33:a0:b1:c2", "00:05:33:aa:bb:cc"]})");
-        setRecord(kWwn, R"({"hbaData": {"model": "Tavrin-K7M", "serialNumber": "SN100",
-            "oemSerialNum": "ABC123456", "partNum": "ABC", "isCNA": false, "hasEthPort": false},
-            "driver": {"storageDriverVersion": "  3.2.1.0  ", "networkDriverVersion": "9.9"}})");
-        setRecord(kMac, R"({"hbaData": {"model": "Tavrin-1860", "serialNumber": "SN200",
-            "oemSerialNum": "", "partNum": "P", "isCNA": true, "hasEthPort": true}, "driver": {}})");
-        fake->on("getAdapterId", [](const Json::Value& request) {
-            std::string key = request["indexStr"].asString();
-            return parseJson(key == kWwn ? R"({"adapterId": 1})"
-                             : key == kMac ? R"({"adapterId": 2})" : R"({"error": "unknown"})");
-        });
+        sim = &gwtest::boundSimulator();
         LogCapture::get().mark();
     }
-
-    void setAdapterList(const std::string& json) {
-        Json::Value list = json.empty() ? Json::Value() : parseJson(json);
-        fake->on("getAllAdaptersIndexString", [list](const Json::Value&) { return list; });
-    }
-    // The getHbaByWwn answer for one key (empty text: no such adapter).
-    void setRecord(const std::string& key, const std::string& json) {
-        if (json.empty())
-            records.erase(key);
-        else
-            records[key] = parseJson(json);
-        auto copy = records;
-        fake->on("getHbaByWwn", [copy](const Json::Value& request) {
-            auto it = copy.find(request[request.isMember("mac") ? "mac" : "wwn"].asString());
-            return it != copy.end() ? it->second : Json::Value();
-        });
-    }
     bool logged(const char* level, const std::string& text) { return LogCapture::get().has(level, text); }
+    int loggedCount(const char* level, const std::string& text) { return LogCapture::get().count(level, text); }
 
-    gwtest::FakeLibrary* fake = nullptr;
-    std::map<std::string, Json::Value> records;
+    gwtest::SimLibrary* sim = nullptr;
 };
+
+TEST(Binding, EveryEntryPointResolvesIntoTheLibraryOnce) {
+    gwtest::SimLibrary& sim = gwtest::boundSimulator();
+    setupDLLEntryPoints();  // a second call changes nothing
+    EXPECT_TRUE(gTfajLibLoaded);
+    EXPECT_EQ(libHandle, sim.handle());
+    int bound = 0;
+#define ENTRY_POINT(kind, symbol, pointer)                                               \
+    {                                                                                    \
+        Dl_info info;                                                                    \
+        ASSERT_NE(dladdr(reinterpret_cast<const void*>(pointer), &info), 0) << #symbol; \
+        EXPECT_EQ(sim.path(), info.dli_fname) << #symbol;                                \
+        EXPECT_STREQ(info.dli_sname, #symbol);                                           \
+        bound++;                                                                         \
+    }
+#include "gateway/EntryPoints.def"
+#undef ENTRY_POINT
+    EXPECT_EQ(bound, 117);
+    EXPECT_EQ(kEntryPointCount, 117);
+
+    LogCapture& log = LogCapture::get();
+    log.fromStart();
+    EXPECT_EQ(log.count("DBG", "inside setupDLLEntryPoints"), 1);
+    EXPECT_EQ(log.count("DBG", "Error in loading library"), 0);
+    EXPECT_EQ(log.countContaining("ERR", " not found. "), 0);
+}
 
 TEST_F(AdapterLookup, AdapterListAndNumbers) {
     Json::Value list;
-    EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), 2);
-    EXPECT_TRUE(fake->lastRequest("getAllAdaptersIndexString").isNull());
-    EXPECT_TRUE(logged("INFO", "Number of Adapters: 2"));
-    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), kWwn);
-    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(2).c_str(), kMac);
+    EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), 3);
+    EXPECT_EQ(sim->requests("getAllAdaptersIndexString"), std::vector<Json::Value>{Json::Value()});
+    EXPECT_TRUE(logged("INFO", "Number of Adapters: 3"));
+    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), kFc);
+    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(2).c_str(), kHp);
+    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(3).c_str(), kCna);
     EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(0).c_str(), "");
-    EXPECT_TRUE(logged("INFO", "numOfAdapters = 2. Id = 0"));
-    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(3).c_str(), "");
+    EXPECT_TRUE(logged("INFO", "numOfAdapters = 3. Id = 0"));
+    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(4).c_str(), "");
+    EXPECT_TRUE(logged("INFO", "numOfAdapters = 3. Id = 4"));
 
-    for (const char* json : {"", R"({"error": "gone"})", R"({"indexStrings": "x"})"}) {
+    // An unusable list: no answer, an error, "indexStrings" not an array.
+    const std::pair<int, const char*> faults[] = {{TVRN_SIM_FAULT_NULL_ANSWER, nullptr},
+                                                  {TVRN_SIM_FAULT_ERROR_OBJECT, "gone"},
+                                                  {TVRN_SIM_FAULT_WRONG_TYPE, "indexStrings"}};
+    for (const auto& f : faults) {
+        sim->reset();
+        sim->setFault("getAllAdaptersIndexString", nullptr, f.first, 0, f.second);
         LogCapture::get().mark();
-        setAdapterList(json);
-        EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), -1) << json;
-        EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), "") << json;
-        EXPECT_EQ(LogCapture::get().count("ERR", "libGetAllAdaptersIndexString returns NULL."), 2);
+        EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), -1) << f.first;
+        EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), "") << f.first;
+        EXPECT_EQ(loggedCount("ERR", "libGetAllAdaptersIndexString returns NULL."), 2) << f.first;
     }
 }
 
 TEST_F(AdapterLookup, DetailsAskByMacOrWwnAndNeedBothParts) {
     Json::Value details;
-    ASSERT_EQ(ProviderUtil::getAdapterDetails("1000000533a0b1c2", details), 0);
-    EXPECT_EQ(fake->lastRequest("getHbaByWwn"), parseJson(R"({"wwn": "10:00:00:05:33:a0:b1:c2"})"));
-    EXPECT_EQ(details["hbaData"]["model"].asString(), "Tavrin-K7M");
-    ASSERT_EQ(ProviderUtil::getAdapterDetails("000533aabbcc", details), 0);
-    EXPECT_EQ(fake->lastRequest("getHbaByWwn"), parseJson(R"({"mac": "00:05:33:aa:bb:cc"})"));
+    ASSERT_EQ(ProviderUtil::getAdapterDetails(kFcRaw, details), 0);
+    EXPECT_EQ(sim->lastRequest("getHbaByWwn"), parseJson(std::string(R"({"wwn": ")") + kFc + "\"}"));
+    EXPECT_EQ(details["hbaData"]["model"].asString(), "Tavrin-825");
+    ASSERT_EQ(ProviderUtil::getAdapterDetails(kCnaRaw, details), 0);
+    EXPECT_EQ(sim->lastRequest("getHbaByWwn"), parseJson(std::string(R"({"mac": ")") + kCna + "\"}"));
+    EXPECT_EQ(details["hbaData"]["model"].asString(), "Tavrin-1020");
 
-    setRecord(kWwn, R"({"hbaData": {"model": "x"}})");
-    setRecord(kMac, R"({"hbaData": "x", "driver": {}})");
-    EXPECT_EQ(ProviderUtil::getAdapterDetails(kWwn, details), -1);
-    EXPECT_EQ(ProviderUtil::getAdapterDetails(kMac, details), -1);
-    EXPECT_TRUE(logged("ERR", "Unable to get adapater details for 00:05:33:aa:bb:cc"));
+    sim->setFault("getHbaByWwn", kFc, TVRN_SIM_FAULT_DROP_MEMBER, 0, "driver");
+    sim->setFault("getHbaByWwn", kHp, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData");
+    EXPECT_EQ(ProviderUtil::getAdapterDetails(kFc, details), -1);
+    EXPECT_EQ(ProviderUtil::getAdapterDetails(kHp, details), -1);
+    EXPECT_EQ(ProviderUtil::getAdapterDetails("20:00:00:05:1e:ff:ff:ff", details), -1);  // unknown: an error answer
+    EXPECT_TRUE(logged("ERR", std::string("Unable to get adapater details for ") + kFc));
+    EXPECT_TRUE(logged("ERR", std::string("Unable to get adapater details for ") + kHp));
+    EXPECT_TRUE(logged("ERR", "Unable to get adapater details for 20:00:00:05:1e:ff:ff:ff"));
 }
 
 TEST_F(AdapterLookup, LibraryExceptionsStopAtTheDetails) {
-    fake->on("getHbaByWwn", [](const Json::Value&) -> Json::Value { throw HbaAgentError(7, "busy"); });
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kWwn).c_str(), "");
-    EXPECT_TRUE(logged("ERR", "10:00:00:05:33:a0:b1:c2 - libGetHbaByWwn got User exception 7: busy"));
-    EXPECT_TRUE(logged("ERR", "Unable to get Adapter info for 10:00:00:05:33:a0:b1:c2"));
-    fake->on("getHbaByWwn", [](const Json::Value&) -> Json::Value { throw 3; });
-    EXPECT_FALSE(ProviderUtil::isCNA(kWwn));
-    EXPECT_TRUE(logged("ERR", "10:00:00:05:33:a0:b1:c2 - libGetHbaByWwn got default exception"));
+    sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_HBA_AGENT_ERROR, 7, "busy", 1);
+    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kFc).c_str(), "");
+    EXPECT_TRUE(logged("ERR", std::string(kFc) + " - libGetHbaByWwn got User exception 7: busy"));
+    EXPECT_TRUE(logged("ERR", std::string("Unable to get Adapter info for ") + kFc));
+    sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_STD_EXCEPTION, 0, "transport down", 1);
+    EXPECT_FALSE(ProviderUtil::hasEthernetPort(kCna));
+    EXPECT_TRUE(logged("ERR", std::string(kCna) + " - libGetHbaByWwn got std exception: transport down"));
+    sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_NON_STANDARD, 3, nullptr, 1);
+    EXPECT_FALSE(ProviderUtil::isCNA(kCna));
+    EXPECT_TRUE(logged("ERR", std::string(kCna) + " - libGetHbaByWwn got default exception"));
+    EXPECT_TRUE(ProviderUtil::isCNA(kCna));  // each fault fired once
 }
 
 TEST_F(AdapterLookup, SerialNumberOemRule) {
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kWwn).c_str(), "123456");
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kMac).c_str(), "SN200");  // empty OEM number
-    setRecord(kWwn, R"({"hbaData": {"oemSerialNum": "XYZ9", "partNum": "ABC"}, "driver": {}})");
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kWwn).c_str(), "XYZ9");
+    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kHpRaw).c_str(), "8C1234XYZ");  // part number dropped
+    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kFc).c_str(), "TVR825A0001");  // no OEM number
+    sim->loadFixture("variants");  // an OEM number that does not begin with the part number
+    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber("20:00:00:05:1e:7e:8f:90").c_str(), "CN7M2011AB");
 }
 
 TEST_F(AdapterLookup, ModelPresence) {
-    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-K7M"));
+    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-825"));
     EXPECT_TRUE(logged("INFO", "Found the Adapter"));
+    EXPECT_EQ(sim->requests("getHbaByWwn").size(), 1u);  // stops at the first match
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("tavrin-1860"));    // any case
-    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-K7M-2P"));  // adapter model is a prefix
-    EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-K7"));
-
-    setRecord(kWwn, "");  // an unreadable first adapter does not hide the second
-    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1860"));
-    EXPECT_TRUE(logged("INFO", "Unable to get Adapter info 1 - 10:00:00:05:33:a0:b1:c2"));
-    setRecord(kMac, R"({"hbaData": {"model": ""}, "driver": {}})");  // no model matches nothing
-    EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1860"));
-
-    setAdapterList(R"({"indexStrings": []})");
+    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1020-2P"));  // adapter model is a prefix
+    EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-82"));
     EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-K7M"));
+
+    sim->setFault("getHbaByWwn", kFc, TVRN_SIM_FAULT_NULL_ANSWER);  // an unreadable first adapter
+    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1860"));
+    EXPECT_TRUE(logged("INFO", std::string("Unable to get Adapter info 1 - ") + kFc));
+
+    sim->loadFixture("empty");
+    EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-825"));
     EXPECT_TRUE(logged("WARN", "No adapters in the system!"));
 }
 
 TEST_F(AdapterLookup, CnaAndEthernetFlags) {
-    EXPECT_FALSE(ProviderUtil::isCNA("1000000533a0b1c2"));
-    EXPECT_TRUE(ProviderUtil::isCNA("000533aabbcc"));
-    EXPECT_TRUE(ProviderUtil::hasEthernetPort(kMac));
+    EXPECT_FALSE(ProviderUtil::isCNA(kFcRaw));
+    EXPECT_FALSE(ProviderUtil::hasEthernetPort(kHpRaw));
+    EXPECT_TRUE(ProviderUtil::isCNA(kCnaRaw));
+    EXPECT_TRUE(ProviderUtil::hasEthernetPort(kCna));
     EXPECT_TRUE(logged("INFO", "isCNA = 1"));
     EXPECT_TRUE(logged("INFO", "ethFlag = 1"));
-    setRecord(kMac, R"({"hbaData": {"isCNA": "yes"}, "driver": {}})");
-    EXPECT_FALSE(ProviderUtil::isCNA(kMac));
-    EXPECT_FALSE(ProviderUtil::hasEthernetPort(kMac));
-    EXPECT_TRUE(logged("ERR", "Unable to get CNA info for 00:05:33:aa:bb:cc"));
-    EXPECT_TRUE(logged("ERR", "Unable to get Ethernet info 00:05:33:aa:bb:cc"));
+    sim->setFault("getHbaByWwn", kCna, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData.isCNA", 1);
+    EXPECT_FALSE(ProviderUtil::isCNA(kCna));
+    EXPECT_TRUE(logged("ERR", std::string("Unable to get CNA info for ") + kCna));
+    sim->setFault("getHbaByWwn", kCna, TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.hasEthPort");
+    EXPECT_FALSE(ProviderUtil::hasEthernetPort(kCna));
+    EXPECT_TRUE(logged("ERR", std::string("Unable to get Ethernet info ") + kCna));
 }
 
 TEST_F(AdapterLookup, DriverVersionOfTheFirstAdapter) {
-    EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "3.2.1.0");
+    EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "3.2.1.0");  // " 3.2.1.0 " trimmed
     EXPECT_TRUE(logged("INFO", "Driver version is 3.2.1.0"));
-    setRecord(kWwn, R"({"hbaData": {}, "driver": {"storageDriverVersion": 3, "networkDriverVersion": " 2.0"}})");
+    EXPECT_EQ(sim->requests("getHbaByWwn"), std::vector<Json::Value>{parseJson(std::string(R"({"wwn": ")") + kFc + "\"}")});
+
+    sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "driver.storageDriverVersion");
+    EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");  // an FC HBA has no network driver
+    EXPECT_TRUE(logged("ERR", std::string("Unable to get driver version for ") + kFc));
+
+    // A first adapter with only a network driver, or an overlong version.
+    sim->loadFixtureText(R"({"adapters": [{"hbaData": {"model": "Tavrin-1020", "hbaMAC": "00:05:1e:00:00:01"},
+                                           "driver": {"networkDriverVersion": " 2.0 "}}]})");
     EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "2.0");
-    setRecord(kWwn, R"({"hbaData": {}, "driver": {}})");
-    EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");
-    EXPECT_TRUE(logged("ERR", "Unable to get driver version for 10:00:00:05:33:a0:b1:c2"));
-    setRecord(kWwn, R"({"hbaData": {}, "driver": {"storageDriverVersion": ")" + std::string(99, '7') + "\"}}");
+    sim->loadFixtureText(R"({"adapters": [{"hbaData": {"model": "Tavrin-825", "wwn": "20:00:00:05:1e:00:00:01"},
+                                           "driver": {"storageDriverVersion": ")" + std::string(99, '7') + "\"}}]}");
     EXPECT_EQ(ProviderUtil::getDriverVersion().size(), 63u);
+    sim->loadFixture("empty");
+    EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");
 }
 
 TEST_F(AdapterLookup, AdapterIdByAddressLength) {
-    EXPECT_EQ(ProviderUtil::getAdapterId("1000000533a0b1c2"), 1);
-    EXPECT_EQ(fake->lastRequest("getAdapterId"), parseJson(R"({"indexStr": "10:00:00:05:33:a0:b1:c2"})"));
-    EXPECT_EQ(ProviderUtil::getAdapterId("000533aabbcc"), 2);
-    EXPECT_EQ(ProviderUtil::getAdapterId(kMac), -1);  // the colon form is not looked up
+    EXPECT_EQ(ProviderUtil::getAdapterId(kFcRaw), 1);
+    EXPECT_EQ(sim->lastRequest("getAdapterId"), parseJson(std::string(R"({"indexStr": ")") + kFc + "\"}"));
+    EXPECT_EQ(ProviderUtil::getAdapterId(kCnaRaw), 3);
+    EXPECT_EQ(ProviderUtil::getAdapterId(kCna), -1);  // the colon form is not looked up
     EXPECT_TRUE(logged("ERR", "The address passed is not MAC or WWN"));
-    EXPECT_EQ(fake->calls("getAdapterId"), 2);
-    EXPECT_EQ(ProviderUtil::getAdapterId("000533000001"), -1);
-    EXPECT_TRUE(logged("ERR", "libGetAdapterId returns NULL."));
+    EXPECT_EQ(sim->calls("getAdapterId"), 2u);
+    EXPECT_EQ(ProviderUtil::getAdapterId("00051e000001"), 0);  // the library's "no such adapter"
+    sim->setFault("getAdapterId", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "adapterId", 1);
+    sim->setFault("getAdapterId", kFc, TVRN_SIM_FAULT_ERROR_OBJECT, 3, "gone", 1);
+    EXPECT_EQ(ProviderUtil::getAdapterId(kHpRaw), -1);
+    EXPECT_EQ(ProviderUtil::getAdapterId(kFcRaw), -1);
+    EXPECT_EQ(loggedCount("ERR", "libGetAdapterId returns NULL."), 2);
 }
 
 }  // namespace

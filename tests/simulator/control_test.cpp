@@ -1,11 +1,21 @@
-// The control interface: fixtures, version and init result, fault injection
-// and call counters.
+// The control interface: fixtures, version and init result, fault injection,
+// call counters and the call recording.
 #include "tests/simulator/SimTestSupport.h"
 
 #include "gateway/HbaAgentError.h"
 
-#include <fstream>
+#include <dlfcn.h>
+#include <stdlib.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <chrono>
+#include <cstring>
+#include <filesystem>
+#include <map>
 #include <stdexcept>
+#include <thread>
+#include <vector>
 
 using namespace simtest;
 
@@ -117,24 +127,138 @@ TEST_F(Control, CallCounters) {
     EXPECT_EQ(0u, tvrn_sim_total_calls());
 }
 
-TEST_F(Control, ResetDiscardsChanges) {
+TEST_F(Control, ResetReturnsToTheBuiltInHost) {
     setAdapterState(J(std::string("{\"indexStr\": \"") + kFcHba + "\", \"enableState\": false}"));
     tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0);
+    tvrn_sim_set_version("2.9.9");
     getRequestID();
     ASSERT_EQ(0, tvrn_sim_reset());
     EXPECT_EQ(0u, tvrn_sim_total_calls());
+    EXPECT_STREQ("[]", tvrn_sim_recorded_calls());
     EXPECT_TRUE(getHbaByWwn(kFcHbaReq)["hbaData"]["hbaStatus"].asBool());
     EXPECT_FALSE(getHost(Json::Value()).isNull());
     EXPECT_EQ(1, getRequestID());
+    EXPECT_STREQ("3.2.1", get_agt_version());
+
+    // From any other fixture, too.
+    ASSERT_EQ(0, tvrn_sim_load_fixture("variants"));
+    ASSERT_EQ(5u, getNumberOfAdapters());
+    ASSERT_EQ(0, tvrn_sim_reset());
+    EXPECT_EQ(3u, getNumberOfAdapters());
 }
 
 TEST_F(Control, FixturesByNameAndPath) {
     EXPECT_EQ(0, tvrn_sim_load_fixture("empty"));
     EXPECT_EQ(0u, getNumberOfAdapters());
     EXPECT_EQ(0u, getAllAdaptersIndexString(Json::Value())["indexStrings"].size());
-    EXPECT_EQ(0, tvrn_sim_load_fixture((std::string(tvrn_sim_fixture_dir()) + "/default.json").c_str()));
+    EXPECT_EQ(0, tvrn_sim_load_fixture("variants.json"));
     EXPECT_EQ(5u, getNumberOfAdapters());
+    EXPECT_EQ(0, tvrn_sim_load_fixture("default"));
+    EXPECT_EQ(3u, getNumberOfAdapters());
+    EXPECT_EQ(0, tvrn_sim_load_fixture("empty"));
+    // The file the built-in host is made from reads the same.
+    EXPECT_EQ(0, tvrn_sim_load_fixture((std::string(tvrn_sim_fixture_dir()) + "/default.json").c_str()));
+    EXPECT_EQ(3u, getNumberOfAdapters());
+    EXPECT_EQ("simhost01", getHost(Json::Value())["result"]["hostName"].asString());
     EXPECT_STREQ("", tvrn_sim_last_error());
+}
+
+// A copy of the library in a directory without fixtures still serves the
+// built-in host; only fixtures named by file are missing.
+TEST(BuiltInHost, NeedsNoFiles) {
+    namespace fs = std::filesystem;
+    char dir[] = "/tmp/tvrn-sim-copy-XXXXXX";
+    ASSERT_NE(nullptr, mkdtemp(dir));
+    const fs::path copy = fs::path(dir) / "libdtfaj.so";
+    fs::copy_file(TVRN_SIM_LIBRARY, copy);
+    void* lib = dlopen(copy.c_str(), RTLD_NOW | RTLD_LOCAL);
+    fs::remove_all(dir);
+    ASSERT_NE(nullptr, lib) << dlerror();
+    auto adapters = reinterpret_cast<unsigned (*)()>(dlsym(lib, "getNumberOfAdapters"));
+    auto load = reinterpret_cast<int (*)(const char*)>(dlsym(lib, "tvrn_sim_load_fixture"));
+    auto lastError = reinterpret_cast<const char* (*)()>(dlsym(lib, "tvrn_sim_last_error"));
+    ASSERT_TRUE(adapters && load && lastError);
+    EXPECT_EQ(3u, adapters());
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(-1, load("variants"));
+    testing::internal::GetCapturedStderr();
+    EXPECT_NE(std::string::npos, std::string(lastError()).find("cannot open")) << lastError();
+    EXPECT_EQ(0u, adapters());
+    EXPECT_EQ(0, load("default"));
+    EXPECT_EQ(3u, adapters());
+    dlclose(lib);
+}
+
+TEST_F(Control, DelayFaultHoldsOnlyThatCall) {
+    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", kHpHba, TVRN_SIM_FAULT_DELAY, 300, nullptr, 1));
+    std::atomic<bool> slowDone{false};
+    Json::Value slowAnswer;
+    std::chrono::steady_clock::duration slowTook{};
+    std::thread slow([&] {
+        const auto start = std::chrono::steady_clock::now();
+        slowAnswer = getHbaByWwn(kHpReq);
+        slowTook = std::chrono::steady_clock::now() - start;
+        slowDone = true;
+    });
+    while (tvrn_sim_call_count("getHbaByWwn") == 0) std::this_thread::yield();
+    // Other calls, even of the same entry point, are answered meanwhile.
+    EXPECT_EQ("Tavrin-825", getHbaByWwn(kFcHbaReq)["hbaData"]["model"].asString());
+    EXPECT_FALSE(getHost(Json::Value()).isNull());
+    EXPECT_FALSE(slowDone);
+    slow.join();
+    EXPECT_GE(slowTook, std::chrono::milliseconds(300));
+    EXPECT_EQ("Tavrin-1860", slowAnswer["hbaData"]["model"].asString());  // answered as usual
+    const auto start = std::chrono::steady_clock::now();
+    getHbaByWwn(kHpReq);  // fired once only
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::milliseconds(300));
+
+    EXPECT_EQ(-1, tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_DELAY, -1, nullptr, 0));
+    EXPECT_EQ(-1, tvrn_sim_load_fixture_text(R"({"faults": [{"entryPoint": "getHost", "kind": "delay", "code": 700000}]})"));
+    EXPECT_EQ(0, tvrn_sim_load_fixture_text(R"({"faults": [{"entryPoint": "getHost", "kind": "delay", "code": 1}]})"));
+}
+
+TEST_F(Control, RecordsEveryCallInOrder) {
+    getHbaByWwn(kFcHbaReq);
+    getNumberOfAdapters();
+    tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0);
+    getHost(J(R"({"list": [1, "two", null], "flag": true})"));
+    registerLogMsgCb(nullptr);
+    const Json::Value expected = J(std::string(R"([
+        {"entry": "getHbaByWwn", "request": {"wwn": ")") + kFcHba + R"("}},
+        {"entry": "getNumberOfAdapters", "request": null},
+        {"entry": "getHost", "request": {"list": [1, "two", null], "flag": true}},
+        {"entry": "registerLogMsgCb", "request": null}])");
+    EXPECT_EQ(expected, J(tvrn_sim_recorded_calls()));
+    EXPECT_EQ(nullptr, std::strchr(tvrn_sim_recorded_calls(), '\n'));  // compact
+    tvrn_sim_reset_counters();  // counters and recording are separate
+    EXPECT_EQ(4u, J(tvrn_sim_recorded_calls()).size());
+    tvrn_sim_clear_recording();
+    EXPECT_STREQ("[]", tvrn_sim_recorded_calls());
+}
+
+TEST_F(Control, RecordingKeepsTheLatestCalls) {
+    getHbaByWwn(kFcHbaReq);
+    for (int i = 0; i < 100000; ++i) getNumberOfAdapters();
+    EXPECT_EQ(1u, tvrn_sim_recorded_dropped());
+    const Json::Value calls = J(tvrn_sim_recorded_calls());
+    ASSERT_EQ(100000u, calls.size());
+    EXPECT_EQ("getNumberOfAdapters", calls[0]["entry"].asString());
+    tvrn_sim_clear_recording();
+    EXPECT_EQ(0u, tvrn_sim_recorded_dropped());
+}
+
+TEST_F(Control, RecordingFromManyThreads) {
+    const char* keys[] = {kFcHba, kHpHba, kCna};
+    std::vector<std::thread> threads;
+    for (const char* key : keys)
+        threads.emplace_back([key] {
+            for (int i = 0; i < 500; ++i) getAdapterId(J(std::string("{\"indexStr\": \"") + key + "\"}"));
+        });
+    for (std::thread& t : threads) t.join();
+    std::map<std::string, int> perKey;
+    for (const Json::Value& c : J(tvrn_sim_recorded_calls())) perKey[c["request"]["indexStr"].asString()]++;
+    EXPECT_EQ((std::map<std::string, int>{{kFcHba, 500}, {kHpHba, 500}, {kCna, 500}}), perKey);
+    EXPECT_EQ(1500u, tvrn_sim_total_calls());
 }
 
 // A fixture that cannot be used leaves a host without adapters and says why.

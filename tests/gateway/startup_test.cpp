@@ -1,0 +1,171 @@
+// Start-up of the adapter library against the simulator. Each scenario runs in
+// a process of its own, as the module's load does: the binding happens once.
+#include <gtest/gtest.h>
+
+#include <dlfcn.h>
+#include <stdlib.h>
+
+#include "gateway/CIMProviderTfaj.h"
+#include "gateway/ProviderInit.h"
+#include "gateway/ProviderUtil.h"
+#include "simulator/SimControl.h"
+#include "tests/gateway/TestSupport.h"
+
+using namespace CPTA;
+using gwtest::LogCapture;
+using gwtest::parseJson;
+using gwtest::SimLibrary;
+
+namespace {
+
+// What the simulator logs while it initialises; it reaches our log only when
+// our callback is registered.
+const char kSimulatorInitMessage[] = "library initialised for application 2: 3 adapter(s)";
+
+// The log from here on.
+LogCapture& freshLog() {
+    LogCapture::get().mark();
+    return LogCapture::get();
+}
+
+TEST(LogCallbackVersion, ThreeCharacterComparisons) {
+    EXPECT_TRUE(ProviderInit::acceptsLogCallback("3.2.1"));
+    for (const char* version : {"2.9.9", "3.10.0", "4.0.5", "3.2", "", static_cast<const char*>(nullptr)})
+        EXPECT_FALSE(ProviderInit::acceptsLogCallback(version)) << (version ? version : "null");
+}
+
+TEST(StartUp, BuiltInHostStartsAndTheLibraryLogsThroughUs) {
+    gwtest::inFreshProcess([] {
+        SimLibrary sim(TVRN_SIM_LIBRARY);
+        LogCapture& log = freshLog();
+        {
+            ProviderInit init;
+            EXPECT_EQ(ProviderInit::getDriverStatus(), 0);
+            EXPECT_EQ(sim.entriesCalled(), (std::vector<std::string>{"get_agt_version", "registerLogMsgCb",
+                                                                     "init_hba_lib", "getNumberOfAdapters"}));
+            EXPECT_EQ(sim.lastRequest("init_hba_lib"), parseJson(R"({"appId": 2})"));
+            EXPECT_TRUE(sim.lastRequest("init_hba_lib")["appId"].isInt());
+            EXPECT_EQ(sim.calls("free_hba_lib"), 0u);
+        }
+        EXPECT_EQ(sim.calls("free_hba_lib"), 1u);
+        EXPECT_TRUE(log.has("DBG", "Inside ProviderInit Constructor."));
+        EXPECT_EQ(log.count("DBG", "inside setupDLLEntryPoints"), 1);
+        EXPECT_EQ(log.countContaining("ERR", " not found. "), 0);
+        EXPECT_TRUE(log.has("INFO", "TFAJ Library version: 3.2.1"));
+        EXPECT_EQ(log.countContaining("INFO", kSimulatorInitMessage), 1) << log.text();
+        EXPECT_TRUE(log.has("DBG", "Adapter Count = 3"));
+        EXPECT_TRUE(log.has("DBG", "Inside ProviderInit Destructor."));
+    });
+}
+
+TEST(StartUp, OlderLibraryVersionGetsNoLogCallback) {
+    gwtest::inFreshProcess([] {
+        SimLibrary sim(TVRN_SIM_LIBRARY);
+        sim.setVersion("2.9.9");
+        LogCapture& log = freshLog();
+        { ProviderInit init; }
+        EXPECT_EQ(ProviderInit::driverStatus, 0);
+        EXPECT_EQ(sim.calls("registerLogMsgCb"), 0u);
+        EXPECT_TRUE(log.has("INFO", "TFAJ Library version: 2.9.9"));
+        EXPECT_EQ(log.countContaining("INFO", kSimulatorInitMessage), 0) << log.text();
+    });
+}
+
+// Every way the initialisation can fail gives status 1, and the adapters are
+// never counted. (One process: none of these registers a callback.)
+TEST(StartUp, FailedInitialisationNeverAsksForAdapters) {
+    gwtest::inFreshProcess([] {
+        SimLibrary sim(TVRN_SIM_LIBRARY);
+        struct Case {
+            int kind;  // a fault of init_hba_lib, or 0 for an init result of 5
+            int code;
+            const char* text;
+            const char* level;
+            const char* logged;
+        };
+        const Case cases[] = {
+            {0, 0, nullptr, "ERR", "libInitHbaLib is failed - 5 "},
+            {TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, "ERR", "libInitHbaLib returns NULL response or has error"},
+            {TVRN_SIM_FAULT_ERROR_OBJECT, 3, "no driver", "ERR", "libInitHbaLib returns NULL response or has error"},
+            {TVRN_SIM_FAULT_WRONG_TYPE, 0, "result", "ERR", "libInitHbaLib is failed - -1 "},
+            {TVRN_SIM_FAULT_DROP_MEMBER, 0, "result", "ERR", "libInitHbaLib is failed - -1 "},
+            {TVRN_SIM_FAULT_HBA_AGENT_ERROR, 19, "no driver", "ERR", "libInitHbaLib got User exception 19: no driver"},
+            {TVRN_SIM_FAULT_NON_STANDARD, 1, nullptr, "ERR", "libInitHbaLib got default exception"},
+        };
+        for (const Case& c : cases) {
+            SCOPED_TRACE(c.logged);
+            sim.reset();
+            sim.setVersion("2.9.9");
+            if (c.kind == 0)
+                sim.setInitResult(5);
+            else
+                sim.setFault("init_hba_lib", nullptr, c.kind, c.code, c.text);
+            LogCapture& log = freshLog();
+            ProviderInit::driverStatus = -7;  // so that each start visibly records its own
+            EXPECT_NO_THROW({ ProviderInit init; });
+            EXPECT_EQ(ProviderInit::driverStatus, 1);
+            EXPECT_EQ(log.count(c.level, c.logged), 1) << log.text();
+            EXPECT_EQ(sim.calls("init_hba_lib"), 1u);
+            EXPECT_EQ(sim.calls("getNumberOfAdapters"), 0u);
+        }
+        // A library without a version text is named "Unknown".
+        sim.reset();
+        sim.setVersion(nullptr);
+        LogCapture& log = freshLog();
+        { ProviderInit init; }
+        EXPECT_TRUE(log.has("INFO", "TFAJ Library version: Unknown"));
+        EXPECT_EQ(sim.calls("registerLogMsgCb"), 0u);
+    });
+}
+
+TEST(StartUp, HostWithoutAdaptersGivesStatusOne) {
+    gwtest::inFreshProcess([] {
+        setenv("TVRN_SIM_FIXTURE", "empty", 1);  // read when the simulator is first used
+        SimLibrary sim(TVRN_SIM_LIBRARY);
+        LogCapture& log = freshLog();
+        { ProviderInit init; }
+        EXPECT_EQ(ProviderInit::driverStatus, 1);
+        EXPECT_TRUE(log.has("DBG", "Adapter Count = 0"));
+        // Status 1 still lets requests through to the library; 2 and 3 do not.
+        EXPECT_TRUE(ProviderUtil::getDriverStatus());
+        Json::Value adapters;
+        EXPECT_EQ(ProviderUtil::getNumberOfAdapters(adapters), 0);
+        for (int refused : {2, 3}) {
+            ProviderInit::driverStatus = refused;
+            EXPECT_FALSE(ProviderUtil::getDriverStatus());
+        }
+    });
+}
+
+TEST(StartUp, LibraryLackingOneEntryPoint) {
+    gwtest::inFreshProcess([] {
+        SimLibrary sim(TVRN_SIM_NO_GETCEE);
+        LogCapture& log = freshLog();
+        { ProviderInit init; }
+        EXPECT_EQ(ProviderInit::driverStatus, 0);
+        EXPECT_EQ(log.count("ERR", "getCee not found. "), 1) << log.text();
+        EXPECT_EQ(log.countContaining("ERR", " not found. "), 1);
+
+        EXPECT_TRUE(libGetCee == default_JsonReqFP);  // never an empty pointer
+        EXPECT_TRUE(libGetCee(Json::Value(Json::objectValue)).isNull());
+        EXPECT_EQ(sim.calls("getCee"), 0u);
+        int fromLibrary = 0;
+#define ENTRY_POINT(kind, symbol, pointer)                                                   \
+    {                                                                                        \
+        Dl_info info;                                                                        \
+        fromLibrary += dladdr(reinterpret_cast<const void*>(pointer), &info) != 0 &&        \
+                       sim.path() == info.dli_fname;                                         \
+    }
+#include "gateway/EntryPoints.def"
+#undef ENTRY_POINT
+        EXPECT_EQ(fromLibrary, 116);
+
+        // Everything else answers from the library.
+        Json::Value request(Json::objectValue);
+        request["wwn"] = "10:00:00:05:1e:0a:0b:0c";
+        EXPECT_EQ(libGetPortByWwn(request)["wwn"].asString(), "10:00:00:05:1e:0a:0b:0c");
+        EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber("200000051e5c6d70").c_str(), "8C1234XYZ");
+    });
+}
+
+}  // namespace
