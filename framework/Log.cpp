@@ -8,10 +8,12 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <ctime>
 
 #include "framework/Buffer.h"
 #include "framework/Datetime.h"
 #include "framework/File_Lock.h"
+#include "framework/String.h"
 
 namespace CPTA {
 
@@ -57,12 +59,68 @@ bool _path(char (&buffer)[PATH_SIZE], const char* format, const char* a, const c
     return n >= 0 && size_t(n) < PATH_SIZE;
 }
 
+// While logging is off every message looks at the configuration again. A
+// configuration that was missing or named no level is remembered by the
+// file's identity, so that the next message only has to stat() it: any
+// change to the file (or its appearance) is still seen at the next message.
+struct Config_Identity {
+    bool known;
+    time_t seen;  // when the identity was taken
+    bool exists;
+    char path[PATH_SIZE];
+    dev_t dev;
+    ino_t ino;
+    off_t size;
+    struct timespec mtime;
+    struct timespec ctime;
+};
+
+Config_Identity _unusable_config = {false, 0, false, {0}, 0, 0, 0, {0, 0}, {0, 0}};
+
+bool _same_time(const struct timespec& a, const struct timespec& b) {
+    return a.tv_sec == b.tv_sec && a.tv_nsec == b.tv_nsec;
+}
+
+// Fills id from the file at path; false when the file cannot be stat()ed.
+void _identify(Config_Identity& id, const char* path) {
+    struct stat st;
+    id.known = true;
+    id.seen = time(nullptr);
+    id.exists = stat(path, &st) == 0;
+    strlcpy(id.path, path, sizeof(id.path));
+    if (!id.exists)
+        return;
+    id.dev = st.st_dev;
+    id.ino = st.st_ino;
+    id.size = st.st_size;
+    id.mtime = st.st_mtim;
+    id.ctime = st.st_ctim;
+}
+
+bool _same_identity(const Config_Identity& a, const Config_Identity& b) {
+    if (!a.known || !b.known || a.exists != b.exists || strcmp(a.path, b.path) != 0)
+        return false;
+    if (!a.exists)
+        return true;
+    // A file changed within the second before it was looked at may change
+    // again without its size or time stamps showing it: trust it only later.
+    if (b.ctime.tv_sec >= b.seen - 1)
+        return false;
+    return a.dev == b.dev && a.ino == b.ino && a.size == b.size &&
+           _same_time(a.mtime, b.mtime) && _same_time(a.ctime, b.ctime);
+}
+
 // The value of the first LOG_LEVEL line of the configuration file, or -1.
 int _read_level(const char* home) {
     char path[PATH_SIZE];
     if (!_path(path, "%s/%src", home, ".cimple"))
         return -1;
-    FILE* is = fopen(path, "re");
+    Config_Identity id;
+    _identify(id, path);
+    if (_same_identity(id, _unusable_config))
+        return -1;
+    _unusable_config = id;
+    FILE* is = id.exists ? fopen(path, "re") : nullptr;
     if (!is)
         return -1;
 
@@ -94,6 +152,8 @@ int _read_level(const char* home) {
         break;
     }
     fclose(is);
+    if (level >= 0)
+        _unusable_config.known = false;
     return level;
 }
 

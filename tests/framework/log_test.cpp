@@ -108,6 +108,22 @@ TEST_F(Log_Test, NothingIsWrittenWithoutAValidConfiguration) {
     EXPECT_FALSE(exists(dir()));
 }
 
+// While logging is off, every message looks at the configuration again: a
+// file that appears, or is rewritten at once with the same size, takes effect
+// at the next message.
+TEST_F(Log_Test, AChangedConfigurationIsSeenAtTheNextMessage) {
+    TVRN_LOG(LL_FATAL, "no configuration yet");
+    configure("LOG_LEVEL=VERBOSE\n");
+    TVRN_LOG(LL_FATAL, "unknown level");
+    TVRN_LOG(LL_FATAL, "unknown level again");
+    EXPECT_FALSE(exists(dir()));
+
+    std::ofstream(_home + "/.cimplerc") << "LOG_LEVEL=DBG    \n";  // same size
+    TVRN_LOG(LL_DBG, "now configured");
+    ASSERT_EQ(1u, lines().size());
+    EXPECT_NE(std::string::npos, lines()[0].find("now configured"));
+}
+
 TEST_F(Log_Test, ConfigurationLines) {
     const struct {
         std::string config;
