@@ -1,45 +1,20 @@
 #include "host/cli.h"
 
+#include <cmpidt.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <climits>
+#include <cstdlib>
 #include <fstream>
 #include <iostream>
 #include <map>
 #include <sstream>
 
+#include "host/mof.h"
+
 namespace tvrnhost {
 namespace cli {
-
-const char kUsage[] =
-    "usage: tvrncli [--module PATH] [--reg FILE] [-n NAMESPACE] [--seed FILE]...\n"
-    "               [--props P1,P2,...] [--principal NAME] COMMAND ARGS\n"
-    "\n"
-    "commands:\n"
-    "  ei CLASS                      enumerate instances\n"
-    "  ein CLASS                     enumerate instance names\n"
-    "  gi PATH                       get an instance\n"
-    "  ci PATH [PROP=VALUE]...       create an instance (keys from PATH)\n"
-    "  mi PATH [PROP=VALUE]...       modify the listed properties of an instance\n"
-    "  di PATH                       delete an instance\n"
-    "  ai PATH [--assoc C] [--result-class C] [--role R] [--result-role R]\n"
-    "                                associated instances\n"
-    "  ain PATH [same options]       associated instance names\n"
-    "  ri PATH [--assoc C] [--role R]\n"
-    "                                referencing association instances\n"
-    "  rin PATH [same options]       referencing association names\n"
-    "  im PATH METHOD [ARG=VALUE]... invoke a method; prints the return value and\n"
-    "                                the output arguments\n"
-    "  ind CLASS [SECONDS]           subscribe and print indications (default 10 s)\n"
-    "  help                          this text\n"
-    "\n"
-    "PATH: [//host/][namespace:]Class.Key=\"value\",Key2=5 (namespace defaults to -n)\n"
-    "VALUE: \"text\", 5, -1, 2.5, TRUE, NULL, {1, 2}, or typed as uint16:5,\n"
-    "       datetime:\"20240101000000.000000+000\", string[]:{\"a\"}; a bare word is a\n"
-    "       string\n"
-    "--seed FILE: instances (in the printed text form) for classes that no\n"
-    "       provider serves\n";
 
 Defaults defaultsFor(const std::string &exePath)
 {
@@ -53,7 +28,372 @@ Defaults defaultsFor(const std::string &exePath)
     return d;
 }
 
+// ---------------------------------------------------------------------------
+// Printing
+// ---------------------------------------------------------------------------
+std::string formatInstance(const Instance &inst)
+{
+    return "// " + inst.path().toString() + '\n' + mofInstance(inst);
+}
+
+std::string formatInstances(const std::vector<Instance> &items)
+{
+    std::string s;
+    for (size_t i = 0; i < items.size(); ++i) {
+        if (i)
+            s += '\n';
+        s += formatInstance(items[i]);
+    }
+    return s;
+}
+
+std::string formatPaths(const std::vector<ObjectPath> &items)
+{
+    std::string s;
+    for (const auto &p : items)
+        s += p.toString() + '\n';
+    return s;
+}
+
+std::string formatMethodResult(const MethodResult &r)
+{
+    std::string s = "ReturnValue = " + mofValue(r.returnValue) + ";\n";
+    for (const auto &arg : r.out)
+        s += arg.name + " = " + mofValue(arg.value) + ";\n";
+    return s;
+}
+
+std::string formatFailure(const Status &st)
+{
+    std::string s = "tvrncli: " + rcName(st.rc) + " (" + std::to_string(st.rc) + ")";
+    if (!st.msg.empty()) {
+        std::string msg = st.msg;
+        std::replace(msg.begin(), msg.end(), '\n', ' ');
+        s += ": " + msg;
+    }
+    return s;
+}
+
+// ---------------------------------------------------------------------------
+// Commands
+// ---------------------------------------------------------------------------
 namespace {
+
+// A command's own arguments: positional ones and --name value options.
+struct CommandArgs {
+    std::vector<std::string> positional;
+    std::map<std::string, std::string> options;
+    std::string option(const std::string &name) const
+    {
+        auto it = options.find(name);
+        return it == options.end() ? std::string() : it->second;
+    }
+    std::vector<std::string> from(size_t i) const
+    {
+        return std::vector<std::string>(positional.begin() + static_cast<long>(i),
+                                        positional.end());
+    }
+};
+
+struct Env {
+    Host &host;
+    const Invocation &inv;
+    std::ostream &out, &err;
+};
+
+using Handler = int (*)(Env &, const CommandArgs &);
+
+struct Command {
+    const char *name;
+    const char *synopsis;  // the arguments, as in the help text
+    const char *summary;
+    std::vector<std::string> options;  // --name VALUE options it accepts
+    size_t minArgs, maxArgs;           // positional arguments
+    bool usesModule;
+    bool hidden;  // an alias left out of the help text
+    Handler run;
+};
+
+int failed(std::ostream &err, const Status &st)
+{
+    err << formatFailure(st) << '\n';
+    return 1;
+}
+
+// Prints what a request returned, or its failure.
+template <class R, class Print>
+int report(Env &e, const R &r, Print print)
+{
+    if (!r.ok())
+        return failed(e.err, r);
+    e.out << print(r);
+    return 0;
+}
+
+int reportStatus(Env &e, const Status &st) { return st.ok() ? 0 : failed(e.err, st); }
+
+ObjectPath pathArg(const Env &e, const std::string &text)
+{
+    ObjectPath p;
+    try {
+        p = ObjectPath::parse(text);
+    } catch (const ParseError &x) {
+        std::string why = x.what();
+        const std::string prefix = "object path: ";
+        if (why.compare(0, prefix.size(), prefix) == 0)
+            why.erase(0, prefix.size());
+        throw ParseError("malformed object path '" + text + "': " + why);
+    }
+    if (p.nameSpace().empty())
+        p.setNameSpace(e.inv.nameSpace);
+    return p;
+}
+
+const auto printInstances = [](const auto &r) { return formatInstances(r.items); };
+const auto printPaths = [](const auto &r) { return formatPaths(r.items); };
+
+int cmdEnumerate(Env &e, const CommandArgs &a)
+{
+    return report(e, e.host.enumerateInstances(e.inv.nameSpace, a.positional[0], e.inv.props),
+                  printInstances);
+}
+
+int cmdEnumerateNames(Env &e, const CommandArgs &a)
+{
+    return report(e, e.host.enumerateInstanceNames(e.inv.nameSpace, a.positional[0]),
+                  printPaths);
+}
+
+int cmdGet(Env &e, const CommandArgs &a)
+{
+    return report(e, e.host.getInstance(pathArg(e, a.positional[0]), e.inv.props),
+                  [](const InstanceResult &r) { return formatInstance(r.instance); });
+}
+
+int cmdDelete(Env &e, const CommandArgs &a)
+{
+    return reportStatus(e, e.host.deleteInstance(pathArg(e, a.positional[0])));
+}
+
+// The instance of `ci` and `mi`: keys from the path, then the assignments.
+Instance assignedInstance(Env &e, const CommandArgs &a, std::vector<std::string> &names)
+{
+    Instance inst(pathArg(e, a.positional[0]));
+    for (const auto &k : inst.path().keys())
+        inst.set(k.name, k.value);
+    for (auto &prop : parseAssignments(a.from(1))) {
+        names.push_back(prop.name);
+        inst.set(prop.name, prop.value);
+    }
+    return inst;
+}
+
+int cmdCreate(Env &e, const CommandArgs &a)
+{
+    std::vector<std::string> names;
+    return report(e, e.host.createInstance(assignedInstance(e, a, names)),
+                  [](const PathResult &r) { return r.path.toString() + '\n'; });
+}
+
+int cmdModify(Env &e, const CommandArgs &a)
+{
+    std::vector<std::string> names;
+    const Instance inst = assignedInstance(e, a, names);
+    return reportStatus(e, e.host.modifyInstance(inst, names));
+}
+
+int cmdAssociators(Env &e, const CommandArgs &a)
+{
+    return report(e,
+                  e.host.associators(pathArg(e, a.positional[0]), a.option("assoc"),
+                                     a.option("result-class"), a.option("role"),
+                                     a.option("result-role"), e.inv.props),
+                  printInstances);
+}
+
+int cmdAssociatorNames(Env &e, const CommandArgs &a)
+{
+    return report(e,
+                  e.host.associatorNames(pathArg(e, a.positional[0]), a.option("assoc"),
+                                         a.option("result-class"), a.option("role"),
+                                         a.option("result-role")),
+                  printPaths);
+}
+
+int cmdReferences(Env &e, const CommandArgs &a)
+{
+    return report(e,
+                  e.host.references(pathArg(e, a.positional[0]), a.option("result-class"),
+                                    a.option("role"), e.inv.props),
+                  printInstances);
+}
+
+int cmdReferenceNames(Env &e, const CommandArgs &a)
+{
+    return report(e,
+                  e.host.referenceNames(pathArg(e, a.positional[0]), a.option("result-class"),
+                                        a.option("role")),
+                  printPaths);
+}
+
+int cmdCallMethod(Env &e, const CommandArgs &a)
+{
+    const ObjectPath p = pathArg(e, a.positional[0]);
+    const PropertyVector in = parseAssignments(a.from(2));
+    return report(e, e.host.invokeMethod(p, a.positional[1], in), formatMethodResult);
+}
+
+int cmdIndications(Env &e, const CommandArgs &a)
+{
+    double seconds = 10;
+    if (a.positional.size() == 2) {
+        char *end = nullptr;
+        seconds = std::strtod(a.positional[1].c_str(), &end);
+        if (!end || *end || seconds < 0)
+            throw ParseError("SECONDS must be a non-negative number");
+    }
+    const std::string &ns = e.inv.nameSpace, &cls = a.positional[0];
+    e.host.clearIndications();
+    Status st = e.host.subscribe(ns, cls);
+    if (!st.ok())
+        return failed(e.err, st);
+    const auto deadline = std::chrono::steady_clock::now() +
+                          std::chrono::milliseconds(static_cast<long long>(seconds * 1000));
+    size_t printed = 0;
+    for (;;) {
+        const auto now = std::chrono::steady_clock::now();
+        if (now >= deadline)
+            break;
+        e.host.waitForIndications(
+            printed + 1, std::chrono::duration_cast<std::chrono::milliseconds>(deadline - now));
+        const auto all = e.host.indications();
+        for (; printed < all.size(); ++printed)
+            e.out << (printed ? "\n" : "") << formatInstance(all[printed].instance) << std::flush;
+    }
+    return reportStatus(e, e.host.unsubscribe(ns, cls));
+}
+
+const ClassCatalog &catalog(const Env &e)
+{
+    static const struct None : ClassCatalog {
+        std::vector<std::string> classNames() const override { return {}; }
+        std::optional<std::string> classMof(const std::string &) const override
+        {
+            return std::nullopt;
+        }
+    } none;
+    return e.inv.catalog ? *e.inv.catalog : none;
+}
+
+int cmdClasses(Env &e, const CommandArgs &)
+{
+    for (const auto &name : catalog(e).classNames())
+        e.out << name << '\n';
+    return 0;
+}
+
+int cmdGetClass(Env &e, const CommandArgs &a)
+{
+    const auto mof = catalog(e).classMof(a.positional[0]);
+    if (!mof)
+        return failed(e.err, Status{CMPI_RC_ERR_INVALID_CLASS, "no class " + a.positional[0]});
+    e.out << *mof;
+    return 0;
+}
+
+int cmdHelp(Env &e, const CommandArgs &)
+{
+    e.out << usage();
+    return 0;
+}
+
+const std::vector<std::string> kAssocOptions = {"assoc", "result-class", "role", "result-role"};
+const std::vector<std::string> kRefOptions = {"result-class", "role"};
+
+const Command kCommands[] = {
+    {"ei", "CLASS", "enumerate instances", {}, 1, 1, true, false, cmdEnumerate},
+    {"ein", "CLASS", "enumerate instance names", {}, 1, 1, true, false, cmdEnumerateNames},
+    {"gi", "PATH", "get an instance", {}, 1, 1, true, false, cmdGet},
+    {"ci", "PATH [PROP=VALUE]...", "create an instance (keys from PATH)", {}, 1, SIZE_MAX, true,
+     false, cmdCreate},
+    {"mi", "PATH [PROP=VALUE]...", "modify the listed properties of an instance", {}, 1,
+     SIZE_MAX, true, false, cmdModify},
+    {"di", "PATH", "delete an instance", {}, 1, 1, true, false, cmdDelete},
+    {"ai", "PATH [--assoc C] [--result-class C] [--role R] [--result-role R]",
+     "associated instances", kAssocOptions, 1, 1, true, false, cmdAssociators},
+    {"ain", "PATH [same options as ai]", "associated instance names", kAssocOptions, 1, 1, true,
+     false, cmdAssociatorNames},
+    {"ri", "PATH [--result-class ASSOC] [--role R]", "referencing association instances",
+     kRefOptions, 1, 1, true, false, cmdReferences},
+    {"rin", "PATH [same options as ri]", "referencing association names", kRefOptions, 1, 1,
+     true, false, cmdReferenceNames},
+    {"cm", "PATH METHOD [ARG=VALUE]...",
+     "call a method, print return value and outputs", {}, 2, SIZE_MAX, true,
+     false, cmdCallMethod},
+    {"im", "PATH METHOD [ARG=VALUE]...", "", {}, 2, SIZE_MAX, true, true, cmdCallMethod},
+    {"ind", "CLASS [SECONDS]", "subscribe and print indications (default 10 s)", {}, 1, 2, true,
+     false, cmdIndications},
+    {"gc", "CLASS", "print a class of the module's class schema as MOF", {}, 1, 1, false, false,
+     cmdGetClass},
+    {"classes", "", "list the classes of the module's class schema", {}, 0, 0, false, false,
+     cmdClasses},
+    {"help", "", "this text", {}, 0, 0, false, false, cmdHelp},
+};
+
+const Command *findCommand(const std::string &name)
+{
+    for (const auto &c : kCommands)
+        if (name == c.name)
+            return &c;
+    return nullptr;
+}
+
+// Notes on the argument kinds, shown with the usage of the commands that
+// take them.
+const struct {
+    const char *word;
+    const char *note;
+} kNotes[] = {
+    {"PATH",
+     "PATH: [//host/][namespace:]Class.Key=\"value\",Key2=5 (namespace defaults to -n)\n"},
+    {"VALUE",
+     "VALUE: \"text\", 5, -1, 2.5, TRUE, NULL, {1, 2}, or typed as uint16:5,\n"
+     "       datetime:\"20240101000000.000000+000\", string[]:{\"a\"}; a bare word is a\n"
+     "       string; a reference is a quoted PATH\n"},
+};
+
+std::string commandUsage(const Command &c)
+{
+    std::string s = std::string("usage: tvrncli [OPTIONS] ") + c.name;
+    if (*c.synopsis)
+        s += std::string(" ") + c.synopsis;
+    s += '\n';
+    for (const auto &n : kNotes)
+        if (std::string(c.synopsis).find(n.word) != std::string::npos)
+            s += n.note;
+    return s;
+}
+
+CommandArgs splitArgs(const Command &c, const std::vector<std::string> &args)
+{
+    CommandArgs r;
+    for (size_t i = 0; i < args.size(); ++i) {
+        const std::string &a = args[i];
+        if (a.compare(0, 2, "--") != 0) {
+            r.positional.push_back(a);
+            continue;
+        }
+        const std::string name = a.substr(2);
+        if (std::find(c.options.begin(), c.options.end(), name) == c.options.end())
+            throw ParseError("unknown option " + a);
+        if (i + 1 >= args.size())
+            throw ParseError(a + " needs a value");
+        r.options[name] = args[++i];
+    }
+    if (r.positional.size() < c.minArgs || r.positional.size() > c.maxArgs)
+        throw ParseError(std::string("wrong number of arguments for ") + c.name);
+    return r;
+}
 
 std::vector<std::string> splitList(const std::string &s)
 {
@@ -76,58 +416,48 @@ std::string readFile(const std::string &path)
     return ss.str();
 }
 
-ObjectPath pathArg(const std::string &text, const std::string &ns)
-{
-    ObjectPath p = ObjectPath::parse(text);
-    if (p.nameSpace().empty())
-        p.setNameSpace(ns);
-    return p;
-}
-
-// Splits a command's arguments into positional ones and --name value options.
-struct CommandArgs {
-    std::vector<std::string> positional;
-    std::map<std::string, std::string> options;
-    std::string option(const std::string &name) const
-    {
-        auto it = options.find(name);
-        return it == options.end() ? std::string() : it->second;
-    }
-};
-
-CommandArgs splitArgs(const std::vector<std::string> &args,
-                      const std::vector<std::string> &allowed)
-{
-    CommandArgs r;
-    for (size_t i = 0; i < args.size(); ++i) {
-        const std::string &a = args[i];
-        if (a.compare(0, 2, "--") != 0) {
-            r.positional.push_back(a);
-            continue;
-        }
-        const std::string name = a.substr(2);
-        if (std::find(allowed.begin(), allowed.end(), name) == allowed.end())
-            throw ParseError("unknown option " + a);
-        if (i + 1 >= args.size())
-            throw ParseError(a + " needs a value");
-        r.options[name] = args[++i];
-    }
-    return r;
-}
-
-void expectCount(const CommandArgs &a, size_t min, size_t max, const std::string &cmd)
-{
-    if (a.positional.size() < min || a.positional.size() > max)
-        throw ParseError("wrong number of arguments for " + cmd + " (see tvrncli help)");
-}
-
-int failed(std::ostream &err, const Status &st)
-{
-    err << "tvrncli: " << st.toString() << "\n";
-    return 1;
-}
-
 }  // namespace
+
+std::string usage()
+{
+    std::string s =
+        "usage: tvrncli [OPTIONS] COMMAND ARGS\n"
+        "\n"
+        "options:\n"
+        "  --module PATH      provider library (default: lib/libtvrnprovider.so beside bin/)\n"
+        "  --reg FILE         registration file\n"
+        "  -n NAMESPACE       namespace of requests and of paths without one\n"
+        "  --props P1,P2,...  properties to return\n"
+        "  --principal NAME   user the requests run as (default: root)\n"
+        "  --seed FILE        instances for classes that no provider serves, typed:\n"
+        "                       instance ns:Class.Key=\"v\" {\n"
+        "                           string Key = \"v\";\n"
+        "                           uint16[] Codes = {2, 3};\n"
+        "                       }\n"
+        "\n"
+        "commands:\n";
+    const size_t column = 32;
+    for (const auto &c : kCommands) {
+        if (c.hidden)
+            continue;
+        std::string line = std::string("  ") + c.name + (*c.synopsis ? " " : "") + c.synopsis;
+        if (line.size() + 2 > column)
+            line += '\n' + std::string(column, ' ');
+        else
+            line.resize(column, ' ');
+        s += line + c.summary + '\n';
+    }
+    s += '\n';
+    for (const auto &n : kNotes)
+        s += n.note;
+    return s;
+}
+
+bool usesModule(const std::string &command)
+{
+    const Command *c = findCommand(command);
+    return c && c->usesModule;
+}
 
 PropertyVector parseAssignments(const std::vector<std::string> &args)
 {
@@ -148,41 +478,13 @@ PropertyVector parseAssignments(const std::vector<std::string> &args)
     return r;
 }
 
-std::string formatInstances(const std::vector<Instance> &items)
-{
-    std::string s;
-    for (size_t i = 0; i < items.size(); ++i) {
-        if (i)
-            s += '\n';
-        s += items[i].toString();
-    }
-    return s;
-}
-
-std::string formatPaths(const std::vector<ObjectPath> &items)
-{
-    std::string s;
-    for (const auto &p : items)
-        s += p.toString() + '\n';
-    return s;
-}
-
-std::string formatMethodResult(const MethodResult &r)
-{
-    return declarations(PropertyVector{{"ReturnValue", r.returnValue}}) + declarations(r.out);
-}
-
-std::string formatIndication(const Indication &ind)
-{
-    return "// " + ind.nameSpace + '\n' + ind.instance.toString();
-}
-
 Invocation parseInvocation(const std::vector<std::string> &args, const Defaults &d)
 {
     Invocation inv;
     inv.module = d.module;
     inv.reg = d.reg;
     inv.nameSpace = d.nameSpace;
+    inv.catalog = d.catalog;
     size_t i = 0;
     auto value = [&](const std::string &opt) -> std::string {
         if (i + 1 >= args.size())
@@ -201,6 +503,8 @@ Invocation parseInvocation(const std::vector<std::string> &args, const Defaults 
             inv.seeds.push_back(value(a));
         else if (a == "--props")
             inv.props = splitList(value(a));
+        else if (a == "--principal")
+            inv.principal = value(a);
         else if (a == "-h" || a == "--help") {
             inv.command = "help";
             return inv;
@@ -236,150 +540,16 @@ void seedStores(Host &host, const Invocation &inv)
 
 int execute(Host &host, const Invocation &inv, std::ostream &out, std::ostream &err)
 {
-    const std::string &cmd = inv.command;
-    const std::string &ns = inv.nameSpace;
-    try {
-        if (cmd == "help") {
-            out << kUsage;
-            return 0;
-        }
-        if (cmd == "ei" || cmd == "ein") {
-            CommandArgs a = splitArgs(inv.args, {});
-            expectCount(a, 1, 1, cmd);
-            if (cmd == "ei") {
-                auto r = host.enumerateInstances(ns, a.positional[0], inv.props);
-                if (!r.ok())
-                    return failed(err, r);
-                out << formatInstances(r.items);
-            } else {
-                auto r = host.enumerateInstanceNames(ns, a.positional[0]);
-                if (!r.ok())
-                    return failed(err, r);
-                out << formatPaths(r.items);
-            }
-            return 0;
-        }
-        if (cmd == "gi" || cmd == "di") {
-            CommandArgs a = splitArgs(inv.args, {});
-            expectCount(a, 1, 1, cmd);
-            const ObjectPath p = pathArg(a.positional[0], ns);
-            if (cmd == "di") {
-                Status st = host.deleteInstance(p);
-                return st.ok() ? 0 : failed(err, st);
-            }
-            auto r = host.getInstance(p, inv.props);
-            if (!r.ok())
-                return failed(err, r);
-            out << r.instance.toString();
-            return 0;
-        }
-        if (cmd == "ci" || cmd == "mi") {
-            CommandArgs a = splitArgs(inv.args, {});
-            expectCount(a, 1, SIZE_MAX, cmd);
-            const ObjectPath p = pathArg(a.positional[0], ns);
-            Instance inst(p);
-            for (const auto &k : p.keys())
-                inst.set(k.name, k.value);
-            const PropertyVector assigned = parseAssignments(
-                std::vector<std::string>(a.positional.begin() + 1, a.positional.end()));
-            std::vector<std::string> names;
-            for (const auto &prop : assigned) {
-                inst.set(prop.name, prop.value);
-                names.push_back(prop.name);
-            }
-            if (cmd == "ci") {
-                auto r = host.createInstance(inst);
-                if (!r.ok())
-                    return failed(err, r);
-                out << r.path.toString() << '\n';
-                return 0;
-            }
-            Status st = host.modifyInstance(inst, names);
-            return st.ok() ? 0 : failed(err, st);
-        }
-        if (cmd == "ai" || cmd == "ain") {
-            CommandArgs a = splitArgs(inv.args, {"assoc", "result-class", "role", "result-role"});
-            expectCount(a, 1, 1, cmd);
-            const ObjectPath p = pathArg(a.positional[0], ns);
-            if (cmd == "ai") {
-                auto r = host.associators(p, a.option("assoc"), a.option("result-class"),
-                                          a.option("role"), a.option("result-role"), inv.props);
-                if (!r.ok())
-                    return failed(err, r);
-                out << formatInstances(r.items);
-            } else {
-                auto r = host.associatorNames(p, a.option("assoc"), a.option("result-class"),
-                                              a.option("role"), a.option("result-role"));
-                if (!r.ok())
-                    return failed(err, r);
-                out << formatPaths(r.items);
-            }
-            return 0;
-        }
-        if (cmd == "ri" || cmd == "rin") {
-            CommandArgs a = splitArgs(inv.args, {"assoc", "role"});
-            expectCount(a, 1, 1, cmd);
-            const ObjectPath p = pathArg(a.positional[0], ns);
-            if (cmd == "ri") {
-                auto r = host.references(p, a.option("assoc"), a.option("role"), inv.props);
-                if (!r.ok())
-                    return failed(err, r);
-                out << formatInstances(r.items);
-            } else {
-                auto r = host.referenceNames(p, a.option("assoc"), a.option("role"));
-                if (!r.ok())
-                    return failed(err, r);
-                out << formatPaths(r.items);
-            }
-            return 0;
-        }
-        if (cmd == "im") {
-            CommandArgs a = splitArgs(inv.args, {});
-            expectCount(a, 2, SIZE_MAX, cmd);
-            const ObjectPath p = pathArg(a.positional[0], ns);
-            const PropertyVector in = parseAssignments(
-                std::vector<std::string>(a.positional.begin() + 2, a.positional.end()));
-            auto r = host.invokeMethod(p, a.positional[1], in);
-            if (!r.ok())
-                return failed(err, r);
-            out << formatMethodResult(r);
-            return 0;
-        }
-        if (cmd == "ind") {
-            CommandArgs a = splitArgs(inv.args, {});
-            expectCount(a, 1, 2, cmd);
-            double seconds = 10;
-            if (a.positional.size() == 2) {
-                char *end = nullptr;
-                seconds = std::strtod(a.positional[1].c_str(), &end);
-                if (!end || *end || seconds < 0)
-                    throw ParseError("SECONDS must be a non-negative number");
-            }
-            host.clearIndications();
-            Status st = host.subscribe(ns, a.positional[0]);
-            if (!st.ok())
-                return failed(err, st);
-            const auto deadline =
-                std::chrono::steady_clock::now() +
-                std::chrono::milliseconds(static_cast<long long>(seconds * 1000));
-            size_t printed = 0;
-            for (;;) {
-                const auto now = std::chrono::steady_clock::now();
-                if (now >= deadline)
-                    break;
-                host.waitForIndications(
-                    printed + 1, std::chrono::duration_cast<std::chrono::milliseconds>(deadline - now));
-                const auto all = host.indications();
-                for (; printed < all.size(); ++printed)
-                    out << (printed ? "\n" : "") << formatIndication(all[printed]) << std::flush;
-            }
-            st = host.unsubscribe(ns, a.positional[0]);
-            return st.ok() ? 0 : failed(err, st);
-        }
-        err << "tvrncli: unknown command '" << cmd << "' (see tvrncli help)\n";
+    const Command *c = findCommand(inv.command);
+    if (!c) {
+        err << "tvrncli: unknown command '" << inv.command << "' (see tvrncli help)\n";
         return 2;
+    }
+    Env env{host, inv, out, err};
+    try {
+        return c->run(env, splitArgs(*c, inv.args));
     } catch (const ParseError &e) {
-        err << "tvrncli: " << e.what() << "\n";
+        err << "tvrncli: " << e.what() << '\n' << commandUsage(*c);
         return 2;
     }
 }
@@ -391,14 +561,14 @@ int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &e
     try {
         inv = parseInvocation(args, d);
     } catch (const ParseError &e) {
-        err << "tvrncli: " << e.what() << "\n" << kUsage;
+        err << "tvrncli: " << e.what() << "\n" << usage();
         return 2;
     }
-    if (inv.command == "help") {
-        out << kUsage;
-        return 0;
-    }
-    Host host;
+    HostOptions options;
+    options.principal = inv.principal;
+    Host host(options);
+    if (!usesModule(inv.command))
+        return execute(host, inv, out, err);
     Status st = host.load(inv.module, inv.reg);
     if (!st.ok())
         return failed(err, st);
@@ -415,19 +585,19 @@ int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &e
     return rc;
 }
 
-int main(int argc, char **argv)
+int main(int argc, char **argv, const ClassCatalog *catalog)
 {
     std::string exe = argc > 0 ? argv[0] : "tvrncli";
     char buf[PATH_MAX];
     const ssize_t n = readlink("/proc/self/exe", buf, sizeof buf - 1);
     if (n > 0)
         exe.assign(buf, static_cast<size_t>(n));
+    Defaults d = defaultsFor(exe);
+    d.catalog = catalog;
     try {
-        return run(std::vector<std::string>(argv + 1, argv + argc), std::cout, std::cerr,
-                   defaultsFor(exe));
+        return run(std::vector<std::string>(argv + 1, argv + argc), std::cout, std::cerr, d);
     } catch (const std::exception &e) {
-        std::cerr << "tvrncli: " << e.what() << "\n";
-        return 1;
+        return failed(std::cerr, Status{CMPI_RC_ERR_FAILED, e.what()});
     }
 }
 

@@ -1,6 +1,7 @@
 // Host-side CIM values: typed values, date-times, object paths and
 // instances, with a stable text form (printing and parsing) shared by the
-// tests, the golden files and tvrncli.
+// tests, the golden files, tvrncli's object paths and its --seed files.
+// (tvrncli prints instances and values in MOF instead, see host/mof.h.)
 //
 // Text forms:
 //   object path   //host/root/ns:Class.Key1="v",Key2=5   (host and namespace

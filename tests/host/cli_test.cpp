@@ -1,8 +1,9 @@
 // tvrncli: its commands run in-process against the test provider (output
-// compared verbatim), and the installed program run as a child process.
+// compared verbatim), and the built program run as a child process.
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <fstream>
@@ -26,10 +27,10 @@ std::vector<std::string> withModule(std::vector<std::string> args)
     return args;
 }
 
-Output runCli(const std::vector<std::string> &args)
+Output runCli(const std::vector<std::string> &args, const cli::Defaults &d = {})
 {
     std::ostringstream out, err;
-    const int st = cli::run(withModule(args), out, err, cli::Defaults{});
+    const int st = cli::run(withModule(args), out, err, d);
     return Output{st, out.str(), err.str()};
 }
 
@@ -44,66 +45,135 @@ protected:
     }
 };
 
-TEST(Cli, EnumeratesAndGets)
+TEST(Cli, PrintsInstancesAsMofInTheProvidersOrder)
 {
     Output o = runCli({"ein", "Test_Gadget"});
     EXPECT_EQ(o.status, 0) << o.err;
     EXPECT_EQ(o.out, "root/test:Test_Gadget.Name=\"g1\"\nroot/test:Test_Gadget.Name=\"g2\"\n");
 
-    o = runCli({"--props", "Weight", "ei", "Test_Gadget"});
-    EXPECT_EQ(o.out,
-              "instance root/test:Test_Gadget.Name=\"g1\" {\n"
-              "    string Name = \"g1\";\n"
-              "    uint32 Weight = 5;\n"
-              "}\n"
+    // Properties as the provider set them (not sorted), null ones (w2's
+    // Label and Tags) left out.
+    o = runCli({"ei", "Test_Widget"});
+    EXPECT_EQ(o.status, 0) << o.err;
+    EXPECT_EQ(o.out.substr(0, o.out.find("// root/test:Test_Widget.Id=\"w3\"")),
+              "// root/test:Test_Widget.Id=\"w1\"\n"
+              "instance of Test_Widget {\n"
+              "    Id = \"w1\";\n"
+              "    Count = 1;\n"
+              "    Size = 10;\n"
+              "    Flags = true;\n"
+              "    Ratio = 0.5;\n"
+              "    Created = \"20231114221320.000000+000\";\n"
+              "    Label = \"first\";\n"
+              "    Tags = {\"a\", \"b\"};\n"
+              "};\n"
               "\n"
-              "instance root/test:Test_Gadget.Name=\"g2\" {\n"
-              "    string Name = \"g2\";\n"
-              "    uint32 Weight = 7;\n"
-              "}\n");
+              "// root/test:Test_Widget.Id=\"w2\"\n"
+              "instance of Test_Widget {\n"
+              "    Id = \"w2\";\n"
+              "    Count = 2;\n"
+              "    Size = 20;\n"
+              "    Flags = false;\n"
+              "    Ratio = 1.5;\n"
+              "    Created = \"20231114221420.000000+000\";\n"
+              "};\n"
+              "\n");
 
     o = runCli({"--props", "Size", "gi", "Test_Widget.Id=\"w2\""});
     EXPECT_EQ(o.out,
-              "instance root/test:Test_Widget.Id=\"w2\" {\n"
-              "    string Id = \"w2\";\n"
-              "    uint16 Size = 20;\n"
-              "}\n");
+              "// root/test:Test_Widget.Id=\"w2\"\n"
+              "instance of Test_Widget {\n"
+              "    Id = \"w2\";\n"
+              "    Size = 20;\n"
+              "};\n");
+
+    o = runCli({"--props", "Weight", "ei", "Test_Gadget"});
+    EXPECT_EQ(o.out,
+              "// root/test:Test_Gadget.Name=\"g1\"\n"
+              "instance of Test_Gadget {\n"
+              "    Name = \"g1\";\n"
+              "    Weight = 5;\n"
+              "};\n"
+              "\n"
+              "// root/test:Test_Gadget.Name=\"g2\"\n"
+              "instance of Test_Gadget {\n"
+              "    Name = \"g2\";\n"
+              "    Weight = 7;\n"
+              "};\n");
 }
 
-TEST(Cli, FailuresExitNonZeroWithTheCodeName)
+TEST(Cli, AFailedRequestIsOneLineWithTheStatusCode)
 {
-    Output o = runCli({"gi", "Test_Widget.Id=\"zz\""});
-    EXPECT_EQ(o.status, 1);
-    EXPECT_EQ(o.err, "tvrncli: CMPI_RC_ERR_NOT_FOUND: no widget zz\n");
-    EXPECT_EQ(o.out, "");
-
-    o = runCli({"ei", "Nope"});
-    EXPECT_EQ(o.status, 1);
-    EXPECT_EQ(o.err.rfind("tvrncli: CMPI_RC_ERR_INVALID_CLASS", 0), 0u) << o.err;
-
-    struct Usage {
+    struct Case {
         std::vector<std::string> args;
-        const char *message;
-    } usage[] = {
-        {{"frobnicate"}, "unknown command"},
-        {{"gi"}, "wrong number of arguments"},
-        {{"gi", "1bad"}, "bad class name"},
-        {{"ci", "Test_Widget.Id=\"w9\"", "Size=uint8:300"}, "Size: "},
-        {{"ai", "Test_Widget.Id=\"w1\"", "--colour", "red"}, "unknown option --colour"},
-        {{"--seed"}, "--seed needs a value"},
+        const char *line;
+    } cases[] = {
+        {{"gi", "Test_Widget.Id=\"zz\""}, "tvrncli: CMPI_RC_ERR_NOT_FOUND (6): no widget zz\n"},
+        {{"ei", "Nope"},
+         "tvrncli: CMPI_RC_ERR_INVALID_CLASS (5): class Nope is not served in root/test\n"},
+        {{"di", "Test_Widget.Id=\"zz\""}, "tvrncli: CMPI_RC_ERR_NOT_FOUND (6)\n"},
     };
-    for (const auto &u : usage) {
-        SCOPED_TRACE(u.message);
-        o = runCli(u.args);
-        EXPECT_EQ(o.status, 2);
-        EXPECT_NE(o.err.find(u.message), std::string::npos) << o.err;
+    for (const auto &c : cases) {
+        SCOPED_TRACE(c.line);
+        Output o = runCli(c.args);
+        EXPECT_EQ(o.status, 1);
+        EXPECT_EQ(o.err, c.line);
+        EXPECT_EQ(o.out, "");
     }
     std::ostringstream out, err;
     EXPECT_EQ(cli::run({"--module", "/nonexistent/libtvrnprovider.so", "--reg", TVRN_TESTPROV_REG,
                         "ein", "Test_Gadget"},
                        out, err, {}),
               1);
-    EXPECT_NE(err.str().find("cannot load /nonexistent/libtvrnprovider.so"), std::string::npos);
+    const std::string line = err.str();
+    EXPECT_EQ(line.rfind("tvrncli: CMPI_RC_ERR_FAILED (1): cannot load "
+                         "/nonexistent/libtvrnprovider.so",
+                         0),
+              0u)
+        << line;
+    EXPECT_EQ(std::count(line.begin(), line.end(), '\n'), 1);
+}
+
+TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage)
+{
+    const std::string pathNote = "PATH: [//host/][namespace:]Class.Key=";
+    struct Case {
+        std::vector<std::string> args;
+        const char *message;
+        const char *usage;  // the usage line that follows, if any
+    } cases[] = {
+        {{"gi", "1bad"}, "tvrncli: malformed object path '1bad': bad class name", "gi PATH"},
+        {{"ain", "Test_Widget.Id=\"w1"}, "tvrncli: malformed object path 'Test_Widget.Id=\"w1'",
+         "ain PATH"},
+        {{"cm", "Test_Widget.Id=", "Echo"}, "tvrncli: malformed object path", "cm PATH METHOD"},
+        {{"di", "root/test:"}, "tvrncli: malformed object path", "di PATH"},
+        {{"gi"}, "tvrncli: wrong number of arguments for gi", "gi PATH"},
+        {{"classes", "extra"}, "tvrncli: wrong number of arguments for classes", "classes\n"},
+        {{"ci", "Test_Widget.Id=\"w9\"", "Size=uint8:300"}, "tvrncli: Size: ", "ci PATH"},
+        {{"cm", "Test_Widget.Id=\"w1\"", "Echo", "noequals"},
+         "tvrncli: expected NAME=VALUE: noequals", "cm PATH"},
+        {{"ai", "Test_Widget.Id=\"w1\"", "--colour", "red"}, "tvrncli: unknown option --colour",
+         "ai PATH"},
+        {{"ri", "Test_Widget.Id=\"w1\"", "--result-role", "X"},
+         "tvrncli: unknown option --result-role", "ri PATH"},
+        {{"frobnicate"}, "tvrncli: unknown command 'frobnicate'", nullptr},
+    };
+    for (const auto &c : cases) {
+        SCOPED_TRACE(c.message);
+        Output o = runCli(c.args);
+        EXPECT_EQ(o.status, 2);
+        EXPECT_EQ(o.out, "");
+        EXPECT_EQ(o.err.find(c.message), 0u) << o.err;
+        if (c.usage) {
+            EXPECT_NE(o.err.find(c.usage), std::string::npos) << o.err;
+            const bool takesPath = std::string(c.usage).find("PATH") != std::string::npos;
+            EXPECT_EQ(o.err.find(pathNote) != std::string::npos, takesPath) << o.err;
+        }
+    }
+    // A misused global option: the message and the whole help text.
+    Output o = runCli({"--seed"});
+    EXPECT_EQ(o.status, 2);
+    EXPECT_EQ(o.err, "tvrncli: --seed needs a value\n" + cli::usage());
 }
 
 TEST_F(CliSession, CreateModifyDeleteWithTypedValues)
@@ -113,46 +183,88 @@ TEST_F(CliSession, CreateModifyDeleteWithTypedValues)
     EXPECT_EQ(o.out, "root/test:Test_Widget.Id=\"w7\"\n");
     o = exec({"mi", "Test_Widget.Id=\"w7\"", "Label=NULL", "Size=uint16:3"});
     ASSERT_EQ(o.status, 0) << o.err;
+    EXPECT_EQ(o.out, "");
     o = exec({"--props", "Count,Label,Size", "gi", "root/test:Test_Widget.Id=\"w7\""});
     EXPECT_EQ(o.out,
-              "instance root/test:Test_Widget.Id=\"w7\" {\n"
-              "    uint32 Count = 4;\n"
-              "    string Id = \"w7\";\n"
-              "    string Label = NULL;\n"
-              "    uint16 Size = 3;\n"
-              "}\n");
+              "// root/test:Test_Widget.Id=\"w7\"\n"
+              "instance of Test_Widget {\n"
+              "    Id = \"w7\";\n"
+              "    Count = 4;\n"
+              "    Size = 3;\n"
+              "};\n");
     EXPECT_EQ(exec({"di", "Test_Widget.Id=\"w7\""}).status, 0);
     EXPECT_EQ(exec({"di", "Test_Widget.Id=\"w7\""}).status, 1);
 }
 
-TEST_F(CliSession, AssociationsAndMethods)
+TEST_F(CliSession, AssociationsWithTheirFilters)
 {
     Output o = exec({"ain", "Test_Gadget.Name=\"g1\"", "--result-class", "Test_Widget", "--role",
-                     "Gadget"});
+                     "Gadget", "--result-role", "Widget"});
     EXPECT_EQ(o.out, "root/test:Test_Widget.Id=\"w1\"\nroot/test:Test_Widget.Id=\"w2\"\n");
-    o = exec({"rin", "Test_Widget.Id=\"w2\"", "--assoc", "Test_WidgetGadget"});
+    o = exec({"ain", "Test_Gadget.Name=\"g1\"", "--role", "Widget"});
+    EXPECT_EQ(o.out, "");
+    o = exec({"rin", "Test_Widget.Id=\"w2\"", "--result-class", "Test_WidgetGadget"});
     EXPECT_EQ(o.out,
               "root/test:Test_WidgetGadget.Gadget=\"root/test:Test_Gadget.Name=\\\"g1\\\"\","
               "Widget=\"root/test:Test_Widget.Id=\\\"w2\\\"\"\n");
-    o = exec({"--props", "Weight", "ai", "Test_Widget.Id=\"w2\""});
+    // References print as quoted object paths.
+    o = exec({"ri", "Test_Widget.Id=\"w2\"", "--role", "Widget"});
     EXPECT_EQ(o.out,
-              "instance root/test:Test_Gadget.Name=\"g1\" {\n"
-              "    string Name = \"g1\";\n"
-              "    uint32 Weight = 5;\n"
-              "}\n");
+              "// root/test:Test_WidgetGadget.Gadget=\"root/test:Test_Gadget.Name=\\\"g1\\\"\","
+              "Widget=\"root/test:Test_Widget.Id=\\\"w2\\\"\"\n"
+              "instance of Test_WidgetGadget {\n"
+              "    Widget = \"root/test:Test_Widget.Id=\\\"w2\\\"\";\n"
+              "    Gadget = \"root/test:Test_Gadget.Name=\\\"g1\\\"\";\n"
+              "    Strength = 3;\n"
+              "};\n");
+    o = exec({"--props", "Weight", "ai", "Test_Widget.Id=\"w2\"", "--assoc", "Test_WidgetGadget"});
+    EXPECT_EQ(o.out,
+              "// root/test:Test_Gadget.Name=\"g1\"\n"
+              "instance of Test_Gadget {\n"
+              "    Name = \"g1\";\n"
+              "    Weight = 5;\n"
+              "};\n");
+}
 
-    o = exec({"im", "Test_Widget.Id=\"w1\"", "Describe",
-              "Target=\"root/test:Test_Gadget.Name=\\\"g2\\\"\"",
-              "When=datetime:\"20240101000000.000000+000\"", "Values=uint16[]:{1,2,3}"});
+TEST_F(CliSession, MethodCallsPrintTheReturnValueAndOutputs)
+{
+    Output o = exec({"cm", "Test_Widget.Id=\"w1\"", "Describe",
+                     "Target=\"root/test:Test_Gadget.Name=\\\"g2\\\"\"",
+                     "When=datetime:\"20240101000000.000000+000\"", "Values=uint16[]:{1,2,3}"});
     ASSERT_EQ(o.status, 0) << o.err;
     EXPECT_EQ(o.out,
-              "string ReturnValue = \"Test_Gadget keys=1 when=20240101000000.000000+000 "
+              "ReturnValue = \"Test_Gadget keys=1 when=20240101000000.000000+000 "
               "interval=0 sum=6\";\n"
-              "uint16[] Doubled = {2, 4, 6};\n"
-              "datetime Later = \"20240101000001.000000+000\";\n"
-              "ref Target = \"root/test:Test_Gadget.Name=\\\"g2\\\"\";\n");
-    o = exec({"im", "Test_Widget.Id=\"w1\"", "ReadManager"});
-    EXPECT_EQ(o.out, "string ReturnValue = \"the manager\";\n");
+              "Doubled = {2, 4, 6};\n"
+              "Later = \"20240101000001.000000+000\";\n"
+              "Target = \"root/test:Test_Gadget.Name=\\\"g2\\\"\";\n");
+
+    // Echo returns its inputs as outputs: the MOF literal of each kind.
+    o = exec({"cm", "Test_Widget.Id=\"w1\"", "Echo", "C=char16:'x'", "S=\"a\\\"b\\\\c\\n\"",
+              "B=TRUE", "N=NULL", "R=real32:2.5", "I=-4", "A={\"x\", NULL}"});
+    ASSERT_EQ(o.status, 0) << o.err;
+    EXPECT_EQ(o.out,
+              "ReturnValue = 7;\n"
+              "C = 'x';\n"
+              "S = \"a\\\"b\\\\c\\n\";\n"
+              "B = true;\n"
+              "N = NULL;\n"
+              "R = 2.5;\n"
+              "I = -4;\n"
+              "A = {\"x\", NULL};\n");
+
+    o = exec({"im", "Test_Widget.Id=\"w1\"", "ReadManager"});  // the former name
+    EXPECT_EQ(o.out, "ReturnValue = \"the manager\";\n");
+    o = exec({"cm", "Test_Widget.Id=\"w1\"", "NoSuchMethod"});
+    EXPECT_EQ(o.status, 1);
+    EXPECT_EQ(o.err.rfind("tvrncli: CMPI_RC_ERR_METHOD_NOT_FOUND (17)", 0), 0u) << o.err;
+}
+
+TEST(Cli, RequestsRunAsThePrincipalGiven)
+{
+    EXPECT_EQ(runCli({"cm", "Test_Widget.Id=\"w1\"", "WhoAmI"}).out, "ReturnValue = \"root\";\n");
+    EXPECT_EQ(runCli({"--principal", "alice", "cm", "Test_Widget.Id=\"w1\"", "WhoAmI"}).out,
+              "ReturnValue = \"alice\";\n");
 }
 
 TEST_F(CliSession, PrintsIndicationsForTheGivenTime)
@@ -161,12 +273,15 @@ TEST_F(CliSession, PrintsIndicationsForTheGivenTime)
     ASSERT_EQ(o.status, 0) << o.err;
     std::istringstream lines(o.out);
     std::string line;
-    int headers = 0;
-    while (std::getline(lines, line))
-        headers += line == "// root/test";
+    int headers = 0, bodies = 0;
+    while (std::getline(lines, line)) {
+        headers += line == "// root/test:Test_Alert";
+        bodies += line == "instance of Test_Alert {";
+    }
     EXPECT_EQ(headers, 3) << o.out;
-    EXPECT_EQ(parseInstances(o.out).size(), 3u);  // the output reads back
-    EXPECT_TRUE(host->indications().size() == 3);
+    EXPECT_EQ(bodies, 3) << o.out;
+    EXPECT_NE(o.out.find("    Message = \"alert 2\";\n"), std::string::npos) << o.out;
+    EXPECT_EQ(host->indications().size(), 3u);
 }
 
 TEST(Cli, SeedsTheStoreFromAFile)
@@ -184,11 +299,48 @@ TEST(Cli, SeedsTheStoreFromAFile)
                            "instance Test_Local.Id=1 {\n"
                            "    uint8 Id = 1;\n"
                            "}\n";
-    Output o = runCli({"--seed", seed, "im", "Test_Widget.Id=\"w1\"", "ReadManager"});
-    EXPECT_EQ(o.out, "string ReturnValue = \"seeded\";\n") << o.err;
+    Output o = runCli({"--seed", seed, "cm", "Test_Widget.Id=\"w1\"", "ReadManager"});
+    EXPECT_EQ(o.out, "ReturnValue = \"seeded\";\n") << o.err;
     o = runCli({"--seed", seed, "ein", "Test_Local"});  // namespace from -n
     EXPECT_EQ(o.out, "root/test:Test_Local.Id=1\n") << o.err;
     std::remove(seed.c_str());
+}
+
+// A catalog of two classes, to see what `classes` and `gc` do with one.
+struct TwoClasses : cli::ClassCatalog {
+    std::vector<std::string> classNames() const override { return {"Test_A", "Test_B"}; }
+    std::optional<std::string> classMof(const std::string &name) const override
+    {
+        if (name != "Test_A")
+            return std::nullopt;
+        return std::string("class Test_A {\n};\n");
+    }
+};
+
+TEST(Cli, ClassCommandsUseTheCatalogWithoutLoadingTheModule)
+{
+    const TwoClasses catalog;
+    cli::Defaults d;
+    d.catalog = &catalog;
+    auto run = [&](std::vector<std::string> args, const cli::Defaults &defaults) {
+        args.insert(args.begin(), {"--module", "/nonexistent/lib.so"});
+        std::ostringstream out, err;
+        const int st = cli::run(args, out, err, defaults);
+        return Output{st, out.str(), err.str()};
+    };
+    Output o = run({"classes"}, d);
+    EXPECT_EQ(o.status, 0) << o.err;
+    EXPECT_EQ(o.out, "Test_A\nTest_B\n");
+    o = run({"gc", "Test_A"}, d);
+    EXPECT_EQ(o.status, 0) << o.err;
+    EXPECT_EQ(o.out, "class Test_A {\n};\n");
+    o = run({"gc", "Test_B"}, d);
+    EXPECT_EQ(o.status, 1);
+    EXPECT_EQ(o.err, "tvrncli: CMPI_RC_ERR_INVALID_CLASS (5): no class Test_B\n");
+    // Without a catalog there are no classes.
+    o = run({"gc", "Test_A"}, {});
+    EXPECT_EQ(o.status, 1);
+    EXPECT_EQ(run({"classes"}, {}).out, "");
 }
 
 Output runProgram(const std::string &args)
@@ -207,11 +359,14 @@ Output runProgram(const std::string &args)
     return o;
 }
 
+size_t lineCount(const std::string &s) { return std::count(s.begin(), s.end(), '\n'); }
+
 TEST(CliProgram, RunsAsAChildProcess)
 {
     Output o = runProgram("help");
     EXPECT_EQ(o.status, 0);
     EXPECT_EQ(o.out.rfind("usage: tvrncli", 0), 0u) << o.out;
+    EXPECT_EQ(o.out.find("\n  im "), std::string::npos) << "the alias is not listed";
 
     o = runProgram(std::string("--module ") + TVRN_TESTPROV_LIB + " --reg " + TVRN_TESTPROV_REG +
                    " -n root/other ein Test_Gadget");
@@ -225,6 +380,23 @@ TEST(CliProgram, RunsAsAChildProcess)
     EXPECT_EQ(o.status, 1);
     EXPECT_NE(o.out.find("cannot load " TVRN_TEST_BUILD_DIR "/bin/../lib/lib"), std::string::npos)
         << o.out;
+}
+
+TEST(CliProgram, DescribesTheModulesClasses)
+{
+    Output o = runProgram("--module /nonexistent/lib.so classes");
+    EXPECT_EQ(o.status, 0) << o.out;
+    EXPECT_EQ(lineCount(o.out), 178u);
+    EXPECT_NE(o.out.find("\nTAVRIN_FCPort\n"), std::string::npos);
+
+    o = runProgram("gc tavrin_fcport");
+    EXPECT_EQ(o.status, 0) << o.out;
+    EXPECT_EQ(o.out.rfind("class TAVRIN_FCPort : CIM_FCPort {\n", 0), 0u) << o.out;
+    EXPECT_EQ(lineCount(o.out), 73u + 2);
+
+    o = runProgram("gc TAVRIN_NoSuchClass");
+    EXPECT_EQ(o.status, 1);
+    EXPECT_EQ(o.out, "tvrncli: CMPI_RC_ERR_INVALID_CLASS (5): no class TAVRIN_NoSuchClass\n");
 }
 
 }  // namespace
