@@ -1,0 +1,505 @@
+// Association, method and indication entries of the CMPI adapter.
+#include <time.h>
+
+#include <atomic>
+#include <cerrno>
+#include <vector>
+
+#include "cmpi/CMPI_Adapter.h"
+#include "cmpi/CMPI_Containers.h"
+#include "cmpi/CMPI_Entry.h"
+#include "cmpi/Converter.h"
+#include "framework/Assert.h"
+#include "framework/Slot.h"
+
+namespace CPTA {
+
+namespace {
+
+String _string_or_empty(const char* s) {
+    return String(s ? s : "");
+}
+
+// What the association callbacks of one request share.
+struct Association_Data {
+    const CMPIBroker* broker;
+    const CMPIContext* context;
+    const CMPIResult* result;
+    String name_space;
+    const char* const* properties;
+    bool stopped;
+};
+
+// The name space that a delivered object goes out with: its own, else the
+// request's.
+const char* _name_space_for(const Association_Data* data, const Instance* instance) {
+    return instance->__name_space.size() ? instance->__name_space.c_str()
+                                         : data->name_space.c_str();
+}
+
+int _return_path(Association_Data* data, const Instance* instance) {
+    CMPIObjectPath* op = nullptr;
+    int rc = make_cmpi_object_path(data->broker, instance, _name_space_for(data, instance), op);
+    if (rc != CMPI_RC_OK)
+        return rc;
+    Cmpi_Hold<CMPIObjectPath> hold(op);
+    return CMReturnObjectPath(data->result, op).rc;
+}
+
+int _return_instance(Association_Data* data, const Instance* instance) {
+    const char* ns = _name_space_for(data, instance);
+    CMPIObjectPath* op = nullptr;
+    int rc = make_cmpi_object_path(data->broker, instance, ns, op);
+    if (rc != CMPI_RC_OK)
+        return rc;
+    Cmpi_Hold<CMPIObjectPath> hold_op(op);
+    CMPIInstance* ci = nullptr;
+    rc = make_cmpi_instance(data->broker, instance, ns, op, data->properties, ci);
+    if (rc != CMPI_RC_OK)
+        return rc;
+    Cmpi_Hold<CMPIInstance> hold_ci(ci);
+    return CMReturnInstance(data->result, ci).rc;
+}
+
+// Runs one result through f unless an earlier one failed.
+template <class F>
+bool _deliver(Instance* instance, void* client_data, F f) {
+    Association_Data* data = static_cast<Association_Data*>(client_data);
+    if (!instance)
+        return false;
+    Ref<> hold(instance);
+    if (data->stopped)
+        return false;
+    try {
+        if (f(data, instance) != CMPI_RC_OK)
+            data->stopped = true;
+    } catch (...) {
+        data->stopped = true;
+    }
+    return !data->stopped;
+}
+
+bool _associator_names_proc(Instance* instance, Enum_Associator_Names_Status, void* data) {
+    return _deliver(instance, data, _return_path);
+}
+
+bool _associators_proc(Instance* instance, Enum_Associators_Status, void* data) {
+    return _deliver(instance, data, _return_instance);
+}
+
+// The fallback of associators: the full instance of each associated object,
+// from the server.
+bool _associator_instances_proc(Instance* instance, Enum_Associator_Names_Status, void* data) {
+    return _deliver(instance, data, [](Association_Data* d, Instance* object) -> int {
+        CMPIObjectPath* op = nullptr;
+        int rc = make_cmpi_object_path(d->broker, object, _name_space_for(d, object), op);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Cmpi_Hold<CMPIObjectPath> hold_op(op);
+        CMPIStatus st = {CMPI_RC_OK, nullptr};
+        CMPIInstance* ci = CBGetInstance(d->broker, d->context, op,
+                                         const_cast<const char**>(d->properties), &st);
+        if (!ci)
+            return CMPI_RC_ERR_NOT_FOUND;
+        Cmpi_Hold<CMPIInstance> hold_ci(ci);
+        if (st.rc != CMPI_RC_OK)
+            return st.rc;
+        return CMReturnInstance(d->result, ci).rc;
+    });
+}
+
+bool _reference_names_proc(Instance* instance, Enum_References_Status, void* data) {
+    return _deliver(instance, data, _return_path);
+}
+
+bool _names_listed(const char* const* properties, const char* name) {
+    for (; *properties; properties++) {
+        if (String(*properties).equali(name))
+            return true;
+    }
+    return false;
+}
+
+// Leaves only the listed properties (and reference arrays) of a result
+// instance; the listed ones keep their values, null or not.
+void _restrict_properties(Instance* instance, const char* const* properties) {
+    const Meta_Class* mc = instance->meta_class;
+    for (size_t i = 0; i < mc->num_meta_features; i++) {
+        const Meta_Feature* mf = mc->meta_features[i];
+        if (_names_listed(properties, mf->name))
+            continue;
+        if (__is_property(mf)) {
+            const Meta_Property* mp = __as_property(mf);
+            __null_flag(__slot(instance, mp->offset), mp) = 1;
+        } else if (__is_reference(mf) && __as_reference(mf)->subscript) {
+            __ref_array_null(__slot(instance, __as_reference(mf)->offset)) = 1;
+        }
+    }
+}
+
+bool _references_proc(Instance* instance, Enum_References_Status, void* data) {
+    return _deliver(instance, data, [](Association_Data* d, Instance* association) -> int {
+        const char* ns = _name_space_for(d, association);
+        CMPIObjectPath* op = nullptr;
+        int rc = make_cmpi_object_path(d->broker, association, ns, op);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Cmpi_Hold<CMPIObjectPath> hold_op(op);
+        if (d->properties)
+            _restrict_properties(association, d->properties);
+        CMPIInstance* ci = nullptr;
+        rc = make_cmpi_instance(d->broker, association, ns, op, d->properties, ci);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Cmpi_Hold<CMPIInstance> hold_ci(ci);
+        return CMReturnInstance(d->result, ci).rc;
+    });
+}
+
+Entry_Status _map_associator_names(Enum_Associator_Names_Status status,
+                                   const CMPIResult* result) {
+    switch (status) {
+        case ENUM_ASSOCIATOR_NAMES_FAILED: return CMPI_RC_ERR_FAILED;
+        case ENUM_ASSOCIATOR_NAMES_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+        case ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+        default: break;
+    }
+    CMReturnDone(result);
+    return CMPI_RC_OK;
+}
+
+Entry_Status _map_references(Enum_References_Status status, const CMPIResult* result) {
+    switch (status) {
+        case ENUM_REFERENCES_FAILED: return CMPI_RC_ERR_FAILED;
+        case ENUM_REFERENCES_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+        case ENUM_REFERENCES_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+        default: break;
+    }
+    CMReturnDone(result);
+    return CMPI_RC_OK;
+}
+
+// The key-only source object of an association request.
+int _source(CMPI_Adapter* adapter, const CMPIObjectPath* op, Instance*& source) {
+    source = nullptr;
+    const Meta_Class* mc = nullptr;
+    if (_request_class(adapter, op, mc) != CMPI_RC_OK)
+        return CMPI_RC_ERR_INVALID_CLASS;
+    return make_cimple_reference(adapter->broker(), mc, op, source);
+}
+
+}  // namespace
+
+//------------------------------------------------------------------------------
+// Associations
+//------------------------------------------------------------------------------
+
+CMPIStatus CMPI_Adapter::associators(CMPIAssociationMI* mi, const CMPIContext* context,
+                                     const CMPIResult* result, const CMPIObjectPath* op,
+                                     const char*, const char* result_class, const char* role,
+                                     const char* result_role, const char** properties) {
+    return run_entry("associators", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
+        Instance* source = nullptr;
+        int rc = _source(adapter, op, source);
+        if (rc == CMPI_RC_ERR_INVALID_CLASS)
+            return CMPI_RC_OK;  // nothing is associated with an unknown class
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Ref<> hold(source);
+
+        String rcls = _string_or_empty(result_class), rl = _string_or_empty(role),
+               rrl = _string_or_empty(result_role);
+        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
+                                 name_space_of(op), properties, false};
+        Enum_Associators_Status status =
+            adapter->enum_associators(source, rcls, rl, rrl, _associators_proc, &data);
+        switch (status) {
+            case ENUM_ASSOCIATORS_FAILED: return CMPI_RC_ERR_FAILED;
+            case ENUM_ASSOCIATORS_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+            case ENUM_ASSOCIATORS_UNSUPPORTED: break;
+            default: CMReturnDone(result); return CMPI_RC_OK;
+        }
+        return _map_associator_names(
+            adapter->enum_associator_names(source, rcls, rl, rrl, _associator_instances_proc,
+                                           &data),
+            result);
+    });
+}
+
+CMPIStatus CMPI_Adapter::associatorNames(CMPIAssociationMI* mi, const CMPIContext* context,
+                                         const CMPIResult* result, const CMPIObjectPath* op,
+                                         const char*, const char* result_class,
+                                         const char* role, const char* result_role) {
+    return run_entry("associatorNames", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
+        Instance* source = nullptr;
+        int rc = _source(adapter, op, source);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Ref<> hold(source);
+
+        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
+                                 name_space_of(op), nullptr, false};
+        return _map_associator_names(
+            adapter->enum_associator_names(source, _string_or_empty(result_class),
+                                           _string_or_empty(role),
+                                           _string_or_empty(result_role),
+                                           _associator_names_proc, &data),
+            result);
+    });
+}
+
+CMPIStatus CMPI_Adapter::references(CMPIAssociationMI* mi, const CMPIContext* context,
+                                    const CMPIResult* result, const CMPIObjectPath* op,
+                                    const char*, const char* role, const char** properties) {
+    return run_entry("references", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
+        Instance* source = nullptr;
+        int rc = _source(adapter, op, source);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Ref<> hold(source);
+        Ref<> model(create(adapter->_meta_class, false));  // every property wanted
+        if (!model)
+            return CMPI_RC_ERR_FAILED;
+
+        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
+                                 name_space_of(op), properties, false};
+        return _map_references(adapter->enum_references(source, model.ptr(),
+                                                        _string_or_empty(role),
+                                                        _references_proc, &data),
+                               result);
+    });
+}
+
+CMPIStatus CMPI_Adapter::referenceNames(CMPIAssociationMI* mi, const CMPIContext* context,
+                                        const CMPIResult* result, const CMPIObjectPath* op,
+                                        const char*, const char* role) {
+    return run_entry("referenceNames", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
+        Instance* source = nullptr;
+        int rc = _source(adapter, op, source);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        Ref<> hold(source);
+        Ref<> model(create(adapter->_meta_class, false));
+        if (!model)
+            return CMPI_RC_ERR_FAILED;
+        __set_null_flags(model.ptr(), false, true, true);  // only the keys are wanted
+
+        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
+                                 name_space_of(op), nullptr, false};
+        return _map_references(adapter->enum_references(source, model.ptr(),
+                                                        _string_or_empty(role),
+                                                        _reference_names_proc, &data),
+                               result);
+    });
+}
+
+//------------------------------------------------------------------------------
+// Methods
+//------------------------------------------------------------------------------
+
+CMPIStatus CMPI_Adapter::invokeMethod(CMPIMethodMI* mi, const CMPIContext* context,
+                                      const CMPIResult* result, const CMPIObjectPath* op,
+                                      const char* method, const CMPIArgs* in, CMPIArgs* out) {
+    return run_entry("invokeMethod", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+        const Meta_Class* mc = nullptr;
+        Entry_Status cls = _target_class(adapter, op, mc);
+        if (cls.rc == CMPI_RC_ERR_FAILED)
+            return Entry_Status(CMPI_RC_ERR_FAILED, "MetaClass not found");
+        if (cls.rc != CMPI_RC_OK)
+            return cls;
+
+        const Meta_Method* mm = method ? find_method(mc, method) : nullptr;
+        if (!mm)
+            return Entry_Status(CMPI_RC_ERR_METHOD_NOT_FOUND, _string_or_empty(method));
+
+        Instance* target = nullptr;
+        int rc = make_cimple_reference(adapter->_broker, mc, op, target);
+        if (rc != CMPI_RC_OK)
+            return Entry_Status(rc, "CIMPLE reference creation failed");
+        Ref<> hold_target(target);
+
+        Instance* meth = nullptr;
+        rc = make_cimple_method(adapter->_broker, mc, mm, op, in, meth);
+        if (rc != CMPI_RC_OK)
+            return Entry_Status(rc, "CIMPLE make_cimple_method function failed");
+        Ref<> hold_meth(meth);
+
+        switch (adapter->invoke_method(target, meth)) {
+            case INVOKE_METHOD_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+            case INVOKE_METHOD_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+            case INVOKE_METHOD_FAILED: return CMPI_RC_ERR_FAILED;
+            case -1:
+                // The provider does not know the method (a subclass's method
+                // on a provider of its superclass).
+                return Entry_Status(CMPI_RC_ERR_METHOD_NOT_FOUND, mm->name);
+            default: break;
+        }
+
+        String ns = name_space_of(op);
+        CMPIValue return_value;
+        CMPIType return_type;
+        Cmpi_Objects made;
+        rc = make_cmpi_method(adapter->_broker, ns.c_str(), meth, out, return_value, return_type,
+                              &made);
+        if (rc != CMPI_RC_OK)
+            return rc;
+        if (return_type != CMPI_null)
+            CMReturnData(result, &return_value, return_type);
+        CMReturnDone(result);
+        return CMPI_RC_OK;
+    });
+}
+
+//------------------------------------------------------------------------------
+// Indications
+//------------------------------------------------------------------------------
+
+CMPIStatus CMPI_Adapter::authorizeFilter(CMPIIndicationMI* mi, const CMPIContext* context,
+                                         const CMPISelectExp*, const char*,
+                                         const CMPIObjectPath*, const char*) {
+    return run_entry("authorizeFilter", mi ? mi->hdl : nullptr, context,
+                     [](CMPI_Adapter*, Entry_Scope&) -> Entry_Status { return CMPI_RC_OK; });
+}
+
+CMPIStatus CMPI_Adapter::mustPoll(CMPIIndicationMI* mi, const CMPIContext* context,
+                                  const CMPISelectExp*, const char*, const CMPIObjectPath*) {
+    return run_entry("mustPoll", mi ? mi->hdl : nullptr, context,
+                     [](CMPI_Adapter*, Entry_Scope&) -> Entry_Status { return CMPI_RC_OK; });
+}
+
+CMPIStatus CMPI_Adapter::activateFilter(CMPIIndicationMI* mi, const CMPIContext* context,
+                                        const CMPISelectExp*, const char*,
+                                        const CMPIObjectPath* class_path, CMPIBoolean) {
+    return run_entry("activateFilter", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+        if (!class_path)
+            return Entry_Status(CMPI_RC_ERR_INVALID_PARAMETER, "no class path");
+        Name_Space_Entry entry = {name_space_of(class_path), 1};
+        size_t pos = adapter->_name_spaces.find(entry);
+        if (pos == size_t(-1))
+            adapter->_name_spaces.append(entry);
+        else
+            adapter->_name_spaces[pos].count++;
+        return CMPI_RC_OK;
+    });
+}
+
+CMPIStatus CMPI_Adapter::deactivateFilter(CMPIIndicationMI* mi, const CMPIContext* context,
+                                          const CMPISelectExp*, const char*,
+                                          const CMPIObjectPath* class_path, CMPIBoolean) {
+    return run_entry("deactivateFilter", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+        if (!class_path)
+            return Entry_Status(CMPI_RC_ERR_INVALID_PARAMETER, "no class path");
+        Name_Space_Entry entry = {name_space_of(class_path), 0};
+        size_t pos = adapter->_name_spaces.find(entry);
+        if (pos != size_t(-1)) {
+            if (adapter->_name_spaces[pos].count <= 1)
+                adapter->_name_spaces.remove(pos);
+            else
+                adapter->_name_spaces[pos].count--;
+        }
+        return CMPI_RC_OK;
+    });
+}
+
+CMPIStatus CMPI_Adapter::enableIndications(CMPIIndicationMI* mi, const CMPIContext* context) {
+    return run_entry("enableIndications", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+        if (adapter->_indications_enabled)
+            return CMPI_RC_OK;
+        adapter->_indications_enabled = true;
+        if (adapter->enable_indications(_indication_proc, adapter) ==
+            ENABLE_INDICATIONS_FAILED) {
+            // Not enabled: a later request must ask the provider again.
+            adapter->_indications_enabled = false;
+            return CMPI_RC_ERR_FAILED;
+        }
+        return CMPI_RC_OK;
+    });
+}
+
+CMPIStatus CMPI_Adapter::disableIndications(CMPIIndicationMI* mi, const CMPIContext* context) {
+    return run_entry("disableIndications", mi ? mi->hdl : nullptr, context,
+                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+        if (!adapter->_indications_enabled)
+            return CMPI_RC_OK;
+        struct Disabling {
+            std::atomic<bool>& flag;
+            explicit Disabling(std::atomic<bool>& f) : flag(f) { flag = true; }
+            ~Disabling() { flag = false; }
+        } disabling(adapter->_disabling);
+        Disable_Indications_Status status = adapter->disable_indications();
+        adapter->_indications_enabled = false;
+        return status == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK;
+    });
+}
+
+namespace {
+
+// Takes the adapter's mutex for a delivery; false (without it) when the
+// provider is being told to stop while someone else holds the mutex.
+bool _lock_for_delivery(Mutex& mutex, const std::atomic<bool>& disabling) {
+    for (;;) {
+        int r = mutex.try_lock();
+        if (r == 0)
+            return true;
+        if (disabling)
+            return false;
+        if (r != EBUSY) {
+            mutex.lock();
+            return true;
+        }
+        struct timespec pause = {0, 1000000};  // 1 ms
+        nanosleep(&pause, nullptr);
+    }
+}
+
+}  // namespace
+
+bool CMPI_Adapter::_indication_proc(Instance* indication, void* client_data) {
+    if (!indication)
+        return false;
+    Ref<> hold(indication);
+    CMPI_Adapter* adapter = static_cast<CMPI_Adapter*>(client_data);
+    if (!adapter)
+        return false;
+    try {
+        if (!_lock_for_delivery(adapter->_mutex, adapter->_disabling)) {
+            TVRN_LOG(LL_INFO, "indication dropped: indications are being disabled");
+            return false;
+        }
+        struct Unlock {
+            Mutex& mutex;
+            ~Unlock() { mutex.unlock(); }
+        } unlock{adapter->_mutex};
+
+        CMPI_Thread_Context* thread_context = CMPI_Thread_Context::top();
+        CPTA_ASSERT(thread_context != 0);
+        const CMPIBroker* broker = thread_context->cmpi_broker();
+
+        for (size_t i = 0; i < adapter->_name_spaces.size(); i++) {
+            const char* ns = adapter->_name_spaces[i].name_space.c_str();
+            CMPIObjectPath* op = nullptr;
+            if (make_cmpi_object_path(broker, indication, ns, op) != CMPI_RC_OK)
+                continue;
+            Cmpi_Hold<CMPIObjectPath> hold_op(op);
+            CMPIInstance* ci = nullptr;
+            if (make_cmpi_instance(broker, indication, ns, op, nullptr, ci) != CMPI_RC_OK)
+                continue;
+            Cmpi_Hold<CMPIInstance> hold_ci(ci);
+            CBDeliverIndication(broker, thread_context->cmpi_context(), ns, ci);
+        }
+        return true;
+    } catch (...) {
+        TVRN_LOG(LL_ERR, "indication delivery failed");
+        return false;
+    }
+}
+
+}  // namespace CPTA

@@ -1,0 +1,133 @@
+// The frame around every request entry of a CMPI adapter: find the adapter,
+// install a thread context for the request, serialise on the adapter's
+// mutex, log entry and exit, and keep every exception inside the module.
+#ifndef CPTA_CMPI_CMPI_ENTRY_H
+#define CPTA_CMPI_CMPI_ENTRY_H
+
+#include <cmpimacs.h>
+
+#include <exception>
+#include <memory>
+
+#include "cmpi/CMPI_Adapter.h"
+#include "cmpi/CMPI_Thread_Context.h"
+#include "framework/Log.h"
+
+namespace CPTA {
+
+// What an entry answers: a CMPI code and, for some failures, a message.
+struct Entry_Status {
+    int rc;
+    String message;
+
+    Entry_Status(int rc_ = CMPI_RC_OK) : rc(rc_) {}
+    Entry_Status(int rc_, const String& message_) : rc(rc_), message(message_) {}
+};
+
+// Installs a thread context for the request and holds the adapter's mutex.
+class Entry_Scope {
+public:
+    Entry_Scope(CMPI_Adapter* adapter, const CMPIContext* context)
+        : _adapter(adapter),
+          _context(new CMPI_Thread_Context(adapter->broker(), context, adapter)) {
+        Thread_Context::push(_context.get());
+        _adapter->mutex().lock();
+    }
+
+    ~Entry_Scope() {
+        _adapter->mutex().unlock();
+        // Contexts that the provider left behind are taken off the stack too.
+        while (Thread_Context* top = Thread_Context::top()) {
+            Thread_Context::pop();
+            if (top == _context.get())
+                break;
+        }
+    }
+
+    Entry_Scope(const Entry_Scope&) = delete;
+    Entry_Scope& operator=(const Entry_Scope&) = delete;
+
+    const CMPIContext* cmpi_context() const { return _context->cmpi_context(); }
+
+private:
+    CMPI_Adapter* _adapter;
+    std::unique_ptr<CMPI_Thread_Context> _context;
+};
+
+inline CMPIStatus _make_status(const CMPIBroker* broker, const Entry_Status& status) {
+    CMPIStatus result = {CMPIrc(status.rc), nullptr};
+    if (status.message.size() && broker) {
+        try {
+            result.msg = CMNewString(broker, status.message.c_str(), nullptr);
+        } catch (...) {
+        }
+    }
+    return result;
+}
+
+// The entry and exit lines of an entry (logged as the adapter's).
+void _log_enter(const char* name);
+void _log_return(const char* name, const Entry_Status& status);
+
+// Runs body(adapter, scope) as the entry called name.
+template <class F>
+CMPIStatus run_entry(const char* name, void* hdl, const CMPIContext* context, F&& body) {
+    const CMPIBroker* broker = nullptr;
+    Entry_Status status;
+    try {
+        CMPI_Adapter* adapter = CMPI_Adapter::from_handle(hdl);
+        if (!adapter) {
+            status = Entry_Status(CMPI_RC_ERR_FAILED, "provider is not loaded");
+        } else {
+            broker = adapter->broker();
+            Entry_Scope scope(adapter, context);
+            _log_enter(name);
+            try {
+                status = body(adapter, scope);
+            } catch (const std::exception& e) {
+                status = Entry_Status(CMPI_RC_ERR_FAILED, e.what());
+            } catch (...) {
+                status = Entry_Status(CMPI_RC_ERR_FAILED, "unexpected exception");
+            }
+            _log_return(name, status);
+            return _make_status(broker, status);
+        }
+    } catch (const std::exception& e) {
+        status = Entry_Status(CMPI_RC_ERR_FAILED, e.what());
+    } catch (...) {
+        status = Entry_Status(CMPI_RC_ERR_FAILED, "unexpected exception");
+    }
+    _log_return(name, status);
+    return _make_status(broker, status);
+}
+
+// Releases a broker object when the scope ends.
+template <class T>
+class Cmpi_Hold {
+public:
+    explicit Cmpi_Hold(T* p = nullptr) : _p(p) {}
+    ~Cmpi_Hold() {
+        if (_p)
+            CMRelease(_p);
+    }
+    Cmpi_Hold(const Cmpi_Hold&) = delete;
+    Cmpi_Hold& operator=(const Cmpi_Hold&) = delete;
+    T* get() const { return _p; }
+
+private:
+    T* _p;
+};
+
+// The class of a request's object path in the provider's repository
+// (CMPI_RC_ERR_FAILED when the repository has no such class).
+int _request_class(CMPI_Adapter* adapter, const CMPIObjectPath* op, const Meta_Class*& mc);
+
+// The same for requests that hand the provider an instance of the class: a
+// class above the provider's class is served as the provider's class; a
+// class outside its line is refused with CMPI_RC_ERR_INVALID_CLASS.
+Entry_Status _target_class(CMPI_Adapter* adapter, const CMPIObjectPath* op,
+                           const Meta_Class*& mc);
+
+}  // namespace CPTA
+
+#endif

@@ -1,0 +1,507 @@
+// Conversion between CMPI data and model instances, against the embedded
+// host's broker (and, where a server could send what the host never does,
+// against small stand-ins for the server's objects).
+#include <gtest/gtest.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "cmpi/CMPI_Containers.h"
+#include "cmpi/Converter.h"
+#include "host/host.h"
+#include "tests/cmpi/test_classes.h"
+#include "tests/cmpi/test_support.h"
+
+using namespace CPTA;
+using tvrntest::Log_Watch;
+
+namespace {
+
+const char* const NS = "root/test";
+
+std::string dump(const Instance* instance) {
+    char* text = nullptr;
+    size_t size = 0;
+    FILE* os = open_memstream(&text, &size);
+    fprint(os, instance);
+    fclose(os);
+    std::string s(text, size);
+    free(text);
+    return s;
+}
+
+std::string dump(const Value& value) {
+    char* text = nullptr;
+    size_t size = 0;
+    FILE* os = open_memstream(&text, &size);
+    value.fprint(os);
+    fclose(os);
+    std::string s(text, size);
+    free(text);
+    return s;
+}
+
+bool contains(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+TVRNTEST_Gadget* make_gadget() {
+    TVRNTEST_Gadget* g = create<TVRNTEST_Gadget>(false);
+    g->Name.set("g1");
+    g->Port.set(80);
+    g->Index.set(5);
+    g->Label.set("label");
+    Array<String> tags;
+    tags.append("a");
+    tags.append("b");
+    g->Tags.set(tags);
+    g->Ratio.set(0.25);
+    g->Flag.set(true);
+    g->Initial.set(char16('q'));
+    g->When.set(Datetime("20240131235959.123456+060"));
+    TVRNTEST_Owner* owner = create<TVRNTEST_Owner>(false);
+    owner->Id.set("o1");
+    owner->Name.set("the owner");
+    g->Owner = owner;
+    g->Detail = clone(owner);
+    return g;
+}
+
+class Conversion : public ::testing::Test {
+protected:
+    const CMPIBroker* broker() { return host.broker(); }
+
+    tvrnhost::Host host;
+};
+
+//------------------------------------------------------------------------------
+// Values
+//------------------------------------------------------------------------------
+
+TEST_F(Conversion, EveryTypeOfValueSurvivesTheWayThereAndBack) {
+    std::vector<std::pair<Value, uint32>> values;
+    auto add = [&](const Value& v, uint32 flags = 0) { values.push_back({v, flags}); };
+    Value v;
+    v.set_value(true); add(v);
+    v.set_value(uint8(200)); add(v);
+    v.set_value(sint8(-100)); add(v);
+    v.set_value(uint16(65000)); add(v);
+    v.set_value(sint16(-32000)); add(v);
+    v.set_value(uint32(4000000000u)); add(v);
+    v.set_value(sint32(-2000000000)); add(v);
+    v.set_value(uint64(1ull << 63)); add(v);
+    v.set_value(sint64(-(1ll << 62))); add(v);
+    v.set_value(real32(1.5f)); add(v);
+    v.set_value(real64(-2.25)); add(v);
+    v.set_value(char16(0x263A)); add(v);
+    v.set_value("text"); add(v);
+    v.set_value(Datetime("00000001020304.000005:000")); add(v);
+    v.set_value(Datetime("20240131235959.123456-300")); add(v);
+    Array<uint16> numbers;
+    numbers.append(1);
+    numbers.append(2);
+    v.set_value(numbers); add(v);
+    Array<String> strings;
+    strings.append("x");
+    strings.append("");
+    v.set_value(strings); add(v);
+    Array<Datetime> times;
+    times.append(Datetime("20240131235959.123456+000"));
+    v.set_value(times); add(v);
+    v.set_value(Array<real64>()); add(v);
+    v.set_value(uint32(0));
+    v.null(true);
+    add(v);
+    v.set_value(Array<String>());
+    v.null(true);
+    add(v);
+
+    Ref<TVRNTEST_Gadget> gadget(make_gadget());
+    Instance* owner = gadget->Owner;
+    ref(owner);
+    v.set_value(owner);
+    add(v);                        // a reference: keys only on the way back
+    add(v, FLAG_EMBEDDED_INSTANCE);  // an embedded instance: every property
+    Array<Instance*> owners;
+    ref(owner);
+    ref(owner);
+    owners.append(owner);
+    owners.append(owner);
+    v.set_value(owners);
+    add(v);
+
+    size_t live = tvrnhost::Host::liveObjects();
+    for (const auto& [value, flags] : values) {
+        CMPIData data;
+        Cmpi_Objects made;
+        ASSERT_EQ(_to_cmpi_data(&tvrntest_repository, broker(), NS, value, flags, data, &made), 0)
+            << dump(value);
+        Value back;
+        ASSERT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, back), 0)
+            << dump(value);
+        made.release();
+        EXPECT_EQ(back.type(), value.type());
+        EXPECT_EQ(back.null(), value.null());
+        if (value.type() != Value::INSTANCE && value.type() != Value::INSTANCE_ARRAY) {
+            EXPECT_EQ(dump(back), dump(value));
+            continue;
+        }
+        std::string text = dump(back);
+        EXPECT_TRUE(contains(text, "string Id = \"o1\";")) << text;
+        EXPECT_TRUE(contains(text, "__name_space = \"root/test\"")) << text;
+        EXPECT_EQ(contains(text, "the owner"), flags == FLAG_EMBEDDED_INSTANCE) << text;
+    }
+    EXPECT_EQ(tvrnhost::Host::liveObjects(), live);
+}
+
+TEST_F(Conversion, InstancesAndPathsMapOntoEachOther) {
+    Ref<TVRNTEST_Gadget> gadget(make_gadget());
+    size_t live = tvrnhost::Host::liveObjects();
+
+    CMPIObjectPath* op = nullptr;
+    ASSERT_EQ(make_cmpi_object_path(broker(), gadget.ptr(), NS, op), CMPI_RC_OK);
+    EXPECT_EQ(CMGetKeyCount(op, nullptr), 3u);
+    CMPIInstance* ci = nullptr;
+    ASSERT_EQ(make_cmpi_instance(broker(), gadget.ptr(), NS, op, nullptr, ci), CMPI_RC_OK);
+
+    Instance* back = nullptr;
+    ASSERT_EQ(make_cimple_instance(broker(), &TVRNTEST_Gadget::static_meta_class, op, ci, back),
+              CMPI_RC_OK);
+    Ref<> hold(back);
+    gadget->__name_space = NS;
+    gadget->Owner->__name_space = NS;
+    gadget->Detail->__name_space = NS;
+    EXPECT_EQ(dump(back), [&] {
+        // A reference carries only the keys of the referenced instance.
+        gadget->Owner->Name.clear();
+        return dump(gadget.ptr());
+    }());
+
+    Instance* keys = nullptr;
+    ASSERT_EQ(make_cimple_reference(broker(), &TVRNTEST_Gadget::static_meta_class, op, keys),
+              CMPI_RC_OK);
+    Ref<> hold_keys(keys);
+    std::string text = dump(keys);
+    EXPECT_TRUE(contains(text, "uint16 Port = 80;")) << text;
+    EXPECT_TRUE(contains(text, "string Label = NULL;")) << text;
+
+    CMRelease(ci);
+    CMRelease(op);
+    EXPECT_EQ(tvrnhost::Host::liveObjects(), live);
+}
+
+TEST_F(Conversion, KeysArrivingAs64BitIntegersAreNarrowed) {
+    CMPIObjectPath* op = CMNewObjectPath(broker(), NS, "TVRNTEST_Gadget", nullptr);
+    CMPIValue v;
+    v.string = CMNewString(broker(), "g1", nullptr);
+    CMAddKey(op, "Name", &v, CMPI_string);
+    v.uint64 = 300;
+    CMAddKey(op, "Port", &v, CMPI_uint64);
+    v.sint64 = 7;
+    CMAddKey(op, "Index", &v, CMPI_sint64);
+
+    Instance* keys = nullptr;
+    ASSERT_EQ(make_cimple_reference(broker(), &TVRNTEST_Gadget::static_meta_class, op, keys),
+              CMPI_RC_OK);
+    std::string text = dump(keys);
+    unref(keys);
+    EXPECT_TRUE(contains(text, "uint16 Port = 300;")) << text;
+    EXPECT_TRUE(contains(text, "uint32 Index = 7;")) << text;
+
+    // Other mismatches are not mended.
+    Log_Watch log;
+    v.string = CMNewString(broker(), "80", nullptr);
+    CMAddKey(op, "Port", &v, CMPI_string);
+    ASSERT_EQ(make_cimple_reference(broker(), &TVRNTEST_Gadget::static_meta_class, op, keys),
+              CMPI_RC_OK);
+    text = dump(keys);
+    unref(keys);
+    EXPECT_TRUE(contains(text, "uint16 Port = NULL;")) << text;
+    EXPECT_TRUE(log.has("type mismatch on Port: string/uint16")) << log.text();
+    EXPECT_TRUE(log.has("conversion error: TVRNTEST_Gadget.Port")) << log.text();
+    CMRelease(op);
+}
+
+//------------------------------------------------------------------------------
+// What a server may send that the host never does
+//------------------------------------------------------------------------------
+
+// A date-time object of a server, holding any text.
+struct Fake_Datetime {
+    CMPIDateTime object;
+    const CMPIBroker* broker;
+    const char* text;
+
+    static CMPIString* string_format(const CMPIDateTime* dt, CMPIStatus* rc) {
+        const Fake_Datetime* self = reinterpret_cast<const Fake_Datetime*>(dt);
+        if (rc)
+            rc->rc = CMPI_RC_OK;
+        return CMNewString(self->broker, self->text, nullptr);
+    }
+
+    Fake_Datetime(const CMPIBroker* b, const char* t) : broker(b), text(t) {
+        static CMPIDateTimeFT ft = {100, nullptr, nullptr, nullptr, string_format, nullptr};
+        object.hdl = this;
+        object.ft = &ft;
+    }
+};
+
+// An instance of a server: properties given as raw CMPI data.
+struct Fake_Instance {
+    CMPIInstance object;
+    const CMPIBroker* broker;
+    std::vector<std::pair<std::string, CMPIData>> properties;
+
+    static const Fake_Instance* self(const CMPIInstance* i) {
+        return reinterpret_cast<const Fake_Instance*>(i);
+    }
+    static CMPICount count(const CMPIInstance* i, CMPIStatus* rc) {
+        if (rc)
+            rc->rc = CMPI_RC_OK;
+        return CMPICount(self(i)->properties.size());
+    }
+    static CMPIData at(const CMPIInstance* i, CMPICount n, CMPIString** name, CMPIStatus* rc) {
+        const auto& p = self(i)->properties.at(n);
+        if (name)
+            *name = CMNewString(self(i)->broker, p.first.c_str(), nullptr);
+        if (rc)
+            rc->rc = CMPI_RC_OK;
+        return p.second;
+    }
+
+    explicit Fake_Instance(const CMPIBroker* b) : broker(b) {
+        static CMPIInstanceFT ft = [] {
+            CMPIInstanceFT t;
+            std::memset(&t, 0, sizeof(t));
+            t.ftVersion = 100;
+            t.getPropertyAt = at;
+            t.getPropertyCount = count;
+            return t;
+        }();
+        object.hdl = this;
+        object.ft = &ft;
+    }
+
+    void add(const char* name, CMPIType type, CMPIValue value,
+             CMPIValueState state = CMPI_goodValue) {
+        CMPIData d;
+        d.type = type;
+        d.state = state;
+        d.value = value;
+        properties.push_back({name, d});
+    }
+};
+
+TEST_F(Conversion, ADatetimeThatDoesNotParseIsLeftNull) {
+    Fake_Datetime short_text(broker(), "2024013123595.123456+060");  // 24 characters
+    Fake_Datetime good_text(broker(), "20240131235959.123456+060");
+    Fake_Instance server(broker());
+    CMPIValue v;
+    v.dateTime = &short_text.object;
+    server.add("When", CMPI_dateTime, v);
+    v.string = CMNewString(broker(), "still here", nullptr);
+    server.add("Label", CMPI_string, v);
+
+    Log_Watch log;
+    Instance* gadget = nullptr;
+    ASSERT_EQ(make_cimple_instance(broker(), &TVRNTEST_Gadget::static_meta_class, nullptr,
+                                   &server.object, gadget),
+              CMPI_RC_OK);
+    std::string text = dump(gadget);
+    unref(gadget);
+    EXPECT_TRUE(contains(text, "datetime When = NULL;")) << text;
+    EXPECT_TRUE(contains(text, "string Label = \"still here\";")) << text;
+    EXPECT_TRUE(log.has("WARN: CMPI_Containers.cpp")) << log.text();
+    EXPECT_TRUE(log.has(": conversion error\n") || log.has(": conversion error")) << log.text();
+    EXPECT_TRUE(log.has("conversion error: TVRNTEST_Gadget.When")) << log.text();
+
+    CMPIData data;
+    data.type = CMPI_dateTime;
+    data.state = CMPI_goodValue;
+    data.value.dateTime = &good_text.object;
+    Value value;
+    ASSERT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), 0);
+    Datetime dt;
+    ASSERT_EQ(value.get_value(dt), 0);
+    EXPECT_EQ(dt.ascii(), String("20240131235959.123456+060"));
+}
+
+TEST_F(Conversion, AStringWithoutItsObjectReadsAsEmpty) {
+    Log_Watch log;
+    CMPIData data;
+    data.type = CMPI_string;
+    data.state = CMPI_goodValue;
+    data.value.string = nullptr;
+    Value value;
+    ASSERT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), 0);
+    String s("x");
+    ASSERT_EQ(value.get_value(s), 0);
+    EXPECT_EQ(s, "");
+    EXPECT_FALSE(value.null());
+    EXPECT_TRUE(log.has("INFO: CMPI_Containers.cpp")) << log.text();
+    EXPECT_TRUE(log.has("ignored null CMPI string")) << log.text();
+
+    data.state = CMPI_nullValue;
+    ASSERT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), 0);
+    EXPECT_TRUE(value.null());
+    EXPECT_EQ(value.type(), Value::STRING);
+
+    // Types that are not taken.
+    data.type = CMPI_chars;
+    data.state = CMPI_goodValue;
+    data.value.chars = const_cast<char*>("x");
+    EXPECT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), -1);
+    EXPECT_TRUE(log.has("unknown cmpi type 5888")) << log.text();
+}
+
+TEST_F(Conversion, ObjectsThatCannotBeReadAreRefused) {
+    Log_Watch log;
+    CMPIObjectPath* op = CMNewObjectPath(broker(), NS, "CIM_Unknown", nullptr);
+    CMPIData data;
+    data.type = CMPI_ref;
+    data.state = CMPI_goodValue;
+    data.value.ref = op;
+    Value value;
+    EXPECT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), -1);
+    EXPECT_TRUE(log.has("failed to find meta class: CIM_Unknown")) << log.text();
+    data.value.ref = nullptr;
+    EXPECT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), -1);
+
+    CMPIObjectPath_Container keys(&tvrntest_repository, broker(), NS, op);
+    EXPECT_EQ(keys.get_value(0, Value::STRING, value), -1);
+    EXPECT_TRUE(log.has("bounds error")) << log.text();
+    CMRelease(op);
+}
+
+TEST_F(Conversion, ArraysWithNullElementsAreRefused) {
+    Log_Watch log;
+    CMPIArray* array = CMNewArray(broker(), 2, CMPI_uint16, nullptr);
+    CMPIValue v;
+    v.uint16 = 4;
+    CMSetArrayElementAt(array, 0, &v, CMPI_uint16);
+    CMPIData data;
+    data.type = CMPI_uint16A;
+    data.state = CMPI_goodValue;
+    data.value.array = array;
+    Value value;
+    EXPECT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), -1);
+    EXPECT_TRUE(log.has("encountered null array element")) << log.text();
+
+    CMSetArrayElementAt(array, 1, &v, CMPI_uint16);
+    ASSERT_EQ(cmpi_to_cimple_value(&tvrntest_repository, broker(), NS, data, value), 0);
+    Array<uint16> numbers;
+    ASSERT_EQ(value.get_value(numbers), 0);
+    EXPECT_EQ(numbers.size(), 2u);
+    CMRelease(array);
+}
+
+//------------------------------------------------------------------------------
+// Results
+//------------------------------------------------------------------------------
+
+// A broker whose new instances record the order of the calls made on them.
+struct Spy_Broker {
+    CMPIBroker broker;
+    CMPIBrokerEncFT eft;
+    static const CMPIBroker* real;
+    static std::vector<std::string> calls;
+    static CMPIInstanceFT instance_ft;
+
+    static CMPIInstance* new_instance(const CMPIBroker*, const CMPIObjectPath* op,
+                                      CMPIStatus* rc) {
+        CMPIInstance* i = CMNewInstance(real, op, rc);
+        instance_ft = *i->ft;
+        instance_ft.setProperty = set_property;
+        instance_ft.setPropertyFilter = set_filter;
+        i->ft = &instance_ft;
+        return i;
+    }
+    static CMPIStatus set_property(const CMPIInstance* i, const char* name, const CMPIValue* v,
+                                   CMPIType t) {
+        calls.push_back(std::string("set ") + name);
+        return original.setProperty(i, name, v, t);
+    }
+    static CMPIStatus set_filter(CMPIInstance* i, const char** props, const char** keys) {
+        std::string call = "filter";
+        for (const char** k = keys; k && *k; k++)
+            call += std::string(" ") + *k;
+        calls.push_back(call);
+        return original.setPropertyFilter(i, props, keys);
+    }
+    static CMPIInstanceFT original;
+
+    explicit Spy_Broker(const CMPIBroker* b) {
+        real = b;
+        broker = *b;
+        eft = *b->eft;
+        eft.newInstance = new_instance;
+        broker.eft = &eft;
+        CMPIObjectPath* op = CMNewObjectPath(b, NS, "X", nullptr);
+        CMPIInstance* probe = CMNewInstance(b, op, nullptr);
+        original = *probe->ft;
+        CMRelease(probe);
+        CMRelease(op);
+        calls.clear();
+    }
+};
+
+const CMPIBroker* Spy_Broker::real;
+std::vector<std::string> Spy_Broker::calls;
+CMPIInstanceFT Spy_Broker::instance_ft;
+CMPIInstanceFT Spy_Broker::original;
+
+TEST_F(Conversion, ThePropertyFilterIsSetBeforeAnyProperty) {
+    Spy_Broker spy(broker());
+    Ref<TVRNTEST_Gadget> gadget(make_gadget());
+    const char* properties[] = {"Label", nullptr};
+    Log_Watch log;
+    CMPIInstance* ci = nullptr;
+    ASSERT_EQ(make_cmpi_instance(&spy.broker, gadget.ptr(), NS, nullptr, properties, ci),
+              CMPI_RC_OK);
+    ASSERT_FALSE(Spy_Broker::calls.empty());
+    EXPECT_EQ(Spy_Broker::calls[0], "filter Name Port Index");
+    EXPECT_GT(Spy_Broker::calls.size(), 5u);
+    EXPECT_TRUE(log.has("No ObjectPath built before call to make_CMPI_instance")) << log.text();
+
+    // What the filter lets through: the listed property and the keys.
+    EXPECT_EQ(CMGetPropertyCount(ci, nullptr), 4u);
+    CMRelease(ci);
+}
+
+TEST_F(Conversion, MethodOutputsLeaveTheReturnValueApart) {
+    Ref<> meth(create(&TVRNTEST_Gadget_Configure_method::static_meta_class));
+    __set_null_flags(meth.ptr(), true, true, true);
+    TVRNTEST_Gadget_Configure_method* r = static_cast<TVRNTEST_Gadget_Configure_method*>(meth.ptr());
+    r->Level.set(3);  // an input: not sent back
+    r->Report.set("done");
+    TVRNTEST_Owner* owner = create<TVRNTEST_Owner>(false);
+    owner->Id.set("o1");
+    r->Result = owner;
+    r->return_value.set(42);
+
+    CMPIArgs* out = CMNewArgs(broker(), nullptr);
+    CMPIValue rv;
+    CMPIType rt;
+    ASSERT_EQ(make_cmpi_method(broker(), NS, meth.ptr(), out, rv, rt), CMPI_RC_OK);
+    EXPECT_EQ(rt, CMPI_uint32);
+    EXPECT_EQ(rv.uint32, 42u);
+    EXPECT_EQ(CMGetArgCount(out, nullptr), 2u);
+    CMPIStatus rc = {CMPI_RC_OK, nullptr};
+    CMGetArg(out, "return_value", &rc);
+    EXPECT_NE(rc.rc, CMPI_RC_OK);
+    CMPIData result = CMGetArg(out, "Result", &rc);
+    ASSERT_EQ(rc.rc, CMPI_RC_OK);
+    EXPECT_EQ(result.type, CMPI_ref);
+    CMRelease(out);
+
+    r->return_value.clear();
+    out = CMNewArgs(broker(), nullptr);
+    ASSERT_EQ(make_cmpi_method(broker(), NS, meth.ptr(), out, rv, rt), CMPI_RC_OK);
+    EXPECT_EQ(rt, CMPI_null);
+    CMRelease(out);
+}
+
+}  // namespace

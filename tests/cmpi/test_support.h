@@ -1,0 +1,126 @@
+// Helpers shared by the tests that load provider modules into the embedded
+// host: a private HOME whose .cimplerc turns logging on (set before any
+// module logs), a reader for the messages logged since a mark, and access to
+// functions a loaded module exports.
+#ifndef TVRN_TESTS_CMPI_TEST_SUPPORT_H
+#define TVRN_TESTS_CMPI_TEST_SUPPORT_H
+
+#include <dlfcn.h>
+#include <stdlib.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace tvrntest {
+
+// The HOME of the test process, with LOG_LEVEL=DBG.
+// Removed when the program ends.
+inline const std::string& log_home() {
+    static char dir[] = "/tmp/tvrn-cmpi-test-XXXXXX";
+    static const std::string home = [] {
+        if (!mkdtemp(dir))
+            throw std::runtime_error("mkdtemp failed");
+        std::ofstream(std::string(dir) + "/.cimplerc") << "LOG_LEVEL=DBG\n";
+        setenv("HOME", dir, 1);
+        std::atexit([] {
+            std::error_code ignored;
+            std::filesystem::remove_all(dir, ignored);
+        });
+        return std::string(dir);
+    }();
+    return home;
+}
+
+// Installed while the test program starts, before any module is loaded.
+struct Log_Home_Setup {
+    Log_Home_Setup() { log_home(); }
+};
+static Log_Home_Setup _log_home_setup;
+
+// The lines logged from the moment of construction (or of mark()).
+class Log_Watch {
+public:
+    Log_Watch() { mark(); }
+
+    void mark() { _start = _size(); }
+
+    std::vector<std::string> lines() const {
+        std::ifstream is(_path());
+        is.seekg(std::streamoff(_start));
+        std::vector<std::string> result;
+        std::string line;
+        while (std::getline(is, line))
+            result.push_back(line);
+        return result;
+    }
+
+    // Number of lines that contain text.
+    size_t count(const std::string& text) const {
+        auto l = lines();
+        return size_t(std::count_if(l.begin(), l.end(), [&](const std::string& s) {
+            return s.find(text) != std::string::npos;
+        }));
+    }
+
+    bool has(const std::string& text) const { return count(text) > 0; }
+
+    // Position of the first line containing text (lines().size() if none).
+    size_t find(const std::string& text) const {
+        auto l = lines();
+        for (size_t i = 0; i < l.size(); i++)
+            if (l[i].find(text) != std::string::npos)
+                return i;
+        return l.size();
+    }
+
+    std::string text() const {
+        std::string all;
+        for (const auto& l : lines())
+            all += l + "\n";
+        return all;
+    }
+
+private:
+    static std::string _path() { return log_home() + "/.cimple/messages"; }
+    static size_t _size() {
+        std::ifstream is(_path(), std::ios::ate);
+        return is ? size_t(is.tellg()) : 0;
+    }
+
+    size_t _start = 0;
+};
+
+// A symbol of a module that is already loaded (by the host); the handle is
+// held only while the symbol is used.
+class Loaded_Module {
+public:
+    explicit Loaded_Module(const std::string& path)
+        : _handle(dlopen(path.c_str(), RTLD_NOW | RTLD_NOLOAD)) {}
+    ~Loaded_Module() {
+        if (_handle)
+            dlclose(_handle);
+    }
+    Loaded_Module(const Loaded_Module&) = delete;
+    Loaded_Module& operator=(const Loaded_Module&) = delete;
+
+    explicit operator bool() const { return _handle != nullptr; }
+
+    template <class F>
+    F symbol(const char* name) const {
+        return _handle ? reinterpret_cast<F>(dlsym(_handle, name)) : nullptr;
+    }
+
+private:
+    void* _handle;
+};
+
+}  // namespace tvrntest
+
+#endif
