@@ -40,7 +40,8 @@ void ProviderInit::start() {
     // Keep our own copy: the library owns the text.
     String versionText(version);
     if (acceptsLogCallback(version))
-        guardedCall(LibCall("libRegisterLogMsgCb"), [] { libRegisterLogMsgCb(&ProviderUtil::logMsg); });
+        _logCallbackRegistered = guardedCall(LibCall("libRegisterLogMsgCb"),
+                                             [] { libRegisterLogMsgCb(&ProviderUtil::logMsg); });
 
     const char* shown = versionText.c_str();
     if (version == nullptr)
@@ -73,6 +74,10 @@ void ProviderInit::start() {
 ProviderInit::~ProviderInit() {
     TVRN_LOG(LL_DBG, "Inside ProviderInit Destructor.");
     guardedCall(LibCall("libFreeHbaLib"), [] { libFreeHbaLib(); });
+    // The library stays mapped after the module is gone: it must not keep a
+    // callback into code that is about to be unmapped.
+    if (_logCallbackRegistered)
+        guardedCall(LibCall("libRegisterLogMsgCb"), [] { libRegisterLogMsgCb(nullptr); });
 }
 
 int ProviderInit::getDriverStatus() { return driverStatus; }

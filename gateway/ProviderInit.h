@@ -34,6 +34,8 @@ public:
 
 private:
     void start();
+
+    bool _logCallbackRegistered = false;
 };
 
 // The module's single instance (defined in the module, not in this library).

@@ -1,11 +1,15 @@
 // The provider of TAVRIN_LogicalPortGroup.
-#include "providers/Provider_Base.h"
+#include "providers/Inventory_Provider.h"
 #include "providers/generated/TAVRIN_LogicalPortGroup_Methods.h"
 
 namespace CPTA {
 
+const Inventory_Source TAVRIN_LogicalPortGroup_Source = {
+    CID_LOGICAL_PORT_GROUP, fromFCHBAManager, "No Logical Port Groups found!", LL_WARN, ANNOUNCED,
+    TVRN_SOURCE_FILE, __LINE__};
+
 class TAVRIN_LogicalPortGroup_Provider
-    : public Instance_Provider<TAVRIN_LogicalPortGroup>,
+    : public Inventory_Provider<TAVRIN_LogicalPortGroup, TAVRIN_LogicalPortGroup_Source>,
       public TAVRIN_LogicalPortGroup_Methods {};
 
 }  // namespace CPTA

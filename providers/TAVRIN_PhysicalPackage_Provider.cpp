@@ -1,11 +1,15 @@
 // The provider of TAVRIN_PhysicalPackage.
-#include "providers/Provider_Base.h"
+#include "providers/Inventory_Provider.h"
 #include "providers/generated/TAVRIN_PhysicalPackage_Methods.h"
 
 namespace CPTA {
 
+const Inventory_Source TAVRIN_PhysicalPackage_Source = {
+    CID_PHYSICAL_PACKAGE, fromFCHBAManager, "No Adapter Found!", LL_ERR, ANNOUNCED,
+    TVRN_SOURCE_FILE, __LINE__};
+
 class TAVRIN_PhysicalPackage_Provider
-    : public Instance_Provider<TAVRIN_PhysicalPackage>,
+    : public Inventory_Provider<TAVRIN_PhysicalPackage, TAVRIN_PhysicalPackage_Source>,
       public TAVRIN_PhysicalPackage_Methods {};
 
 }  // namespace CPTA

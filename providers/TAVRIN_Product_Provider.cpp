@@ -1,11 +1,15 @@
 // The provider of TAVRIN_Product.
-#include "providers/Provider_Base.h"
+#include "providers/Inventory_Provider.h"
 #include "providers/generated/TAVRIN_Product_Methods.h"
 
 namespace CPTA {
 
+const Inventory_Source TAVRIN_Product_Source = {
+    CID_PRODUCT, fromFCHBAManager, "No Adapter Found!", LL_ERR, ANNOUNCED,
+    TVRN_SOURCE_FILE, __LINE__};
+
 class TAVRIN_Product_Provider
-    : public Instance_Provider<TAVRIN_Product>,
+    : public Inventory_Provider<TAVRIN_Product, TAVRIN_Product_Source>,
       public TAVRIN_Product_Methods {};
 
 }  // namespace CPTA

@@ -225,10 +225,12 @@ TEST_F(Loaded, TheMisOfOneProviderShareOneAdapter) {
 }
 
 //------------------------------------------------------------------------------
-// The providers as they stand: nothing to enumerate, nothing to change
+// The providers on a host without adapters (this program runs on the
+// simulator's "empty" host): nothing to enumerate but the host itself,
+// nothing to change, no method but SetAlarmState
 //------------------------------------------------------------------------------
 
-TEST_F(Loaded, EveryProviderAnswersWithItsSkeleton) {
+TEST_F(Loaded, EveryProviderAnswersWithoutAdapters) {
     Registrations regs;
     std::map<std::string, const CPTA::Meta_Class*> classes;
     for (CPTA::Registration* r : regs.list)
@@ -241,12 +243,13 @@ TEST_F(Loaded, EveryProviderAnswersWithItsSkeleton) {
         ObjectPath path = keyed_path(mc);
         if (reg.kinds & kInstanceMI) {
             instance_classes++;
+            const size_t expected = reg.className == "TAVRIN_ComputerSystem" ? 1 : 0;
             Result<Instance> all = host.enumerateInstances(NS, reg.className);
             EXPECT_TRUE(all.ok()) << all.toString();
-            EXPECT_TRUE(all.items.empty());
+            EXPECT_EQ(all.items.size(), expected);
             Result<ObjectPath> names = host.enumerateInstanceNames(NS, reg.className);
             EXPECT_TRUE(names.ok()) << names.toString();
-            EXPECT_TRUE(names.items.empty());
+            EXPECT_EQ(names.items.size(), expected);
             EXPECT_EQ(host.getInstance(path).rc, CMPI_RC_ERR_NOT_FOUND);
             Instance i(path);
             EXPECT_EQ(host.createInstance(i).rc, CMPI_RC_ERR_NOT_SUPPORTED);
@@ -265,7 +268,10 @@ TEST_F(Loaded, EveryProviderAnswersWithItsSkeleton) {
         }
         for (const std::string& method : methods_of(mc)) {
             methods++;
-            EXPECT_EQ(host.invokeMethod(path, method).rc, CMPI_RC_ERR_NOT_SUPPORTED) << method;
+            const bool served = reg.className == "TAVRIN_AlarmDevice" && method == "SetAlarmState";
+            EXPECT_EQ(host.invokeMethod(path, method).rc,
+                      served ? CMPI_RC_OK : CMPI_RC_ERR_NOT_SUPPORTED)
+                << method;
         }
         MethodResult unknown = host.invokeMethod(path, "NoSuchMethod");
         EXPECT_EQ(unknown.rc, CMPI_RC_ERR_METHOD_NOT_FOUND);

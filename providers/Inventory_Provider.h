@@ -1,0 +1,123 @@
+// The inventory instance providers. Each one serves a class whose instances
+// an inventory dispatcher builds; a provider's source only says where they
+// come from and what to log when there are none:
+//
+//   const Inventory_Source TAVRIN_FCPort_Source = {
+//       CID_FC_PORT, fromFCHBAManager, "No FC Ports Found!", LL_ERR, ANNOUNCED,
+//       TVRN_SOURCE_FILE, __LINE__};
+//
+//   class TAVRIN_FCPort_Provider
+//       : public Inventory_Provider<TAVRIN_FCPort, TAVRIN_FCPort_Source>,
+//         public TAVRIN_FCPort_Methods {};
+//
+// Its log lines name the provider's source file and the line of that
+// declaration. get_instance stays unsupported, so the binding serves it by
+// enumerating and comparing keys; the writes stay unsupported too.
+#ifndef CPTA_PROVIDERS_INVENTORY_PROVIDER_H
+#define CPTA_PROVIDERS_INVENTORY_PROVIDER_H
+
+#include "framework/Array.h"
+#include "framework/Instance.h"
+#include "framework/Log.h"
+#include "framework/Meta_Lookup.h"
+#include "gateway/ProviderUtil.h"
+#include "inventory/FCHBAManager.h"
+#include "inventory/HostIdentityScope.h"
+#include "inventory/InventoryCommon.h"
+#include "providers/Provider_Base.h"
+
+namespace CPTA {
+
+inline Array<Instance*> fromFCHBAManager(classId_t classId) {
+    return FCHBAManager::getFCHBAManager()->getInstances(classId);
+}
+
+inline Array<Instance*> fromHDRManager(classId_t classId) {
+    return HDRManager::getHDRManager()->getInstances(classId);
+}
+
+// How the instances of a request are handed on.
+enum Inventory_Delivery {
+    ANNOUNCED,  // logs "Returning instances" first
+    QUIET,      // does not
+    SINGLE      // exactly one instance or the request fails
+};
+
+struct Inventory_Source {
+    classId_t classId;
+    Array<Instance*> (*dispatcher)(classId_t classId);
+    // Logged when the dispatcher finds no instance (for SINGLE: not exactly one).
+    const char* noInstances;
+    Log_Level noInstancesLevel;
+    Inventory_Delivery delivery;
+    // Where the provider's log lines say they come from.
+    const char* file;
+    int line;
+};
+
+// The instances a dispatcher returned: whatever has not been taken when it
+// goes (also when a delivery throws) is destroyed.
+class Inventory_Answer {
+public:
+    explicit Inventory_Answer(const Array<Instance*>& instances) : _instances(instances) {}
+    ~Inventory_Answer() { destroyInstances(_instances); }
+    Inventory_Answer(const Inventory_Answer&) = delete;
+    Inventory_Answer& operator=(const Inventory_Answer&) = delete;
+
+    size_t size() const { return _instances.size(); }
+    Instance* take(size_t i) {
+        Instance* instance = _instances[i];
+        _instances[i] = nullptr;
+        return instance;
+    }
+
+private:
+    Array<Instance*> _instances;
+};
+
+// One request of the provider: asks the dispatcher and hands each instance
+// of `meta_class` (or of a subclass) to `deliver`, which takes it over.
+// Every other instance the dispatcher returned is destroyed.
+template <class Deliver>
+Enum_Instances_Status enumerate_inventory(const Inventory_Source& source,
+                                          const Meta_Class* meta_class, Deliver&& deliver) {
+    HostIdentityScope scope;
+    log(LL_DBG, source.file, source.line, "Entering: %s", "enum_instances");
+    Inventory_Answer answer(source.dispatcher(source.classId));
+
+    const bool found = source.delivery == SINGLE ? answer.size() == 1 : answer.size() != 0;
+    if (!found) {
+        log(source.noInstancesLevel, source.file, source.line, "%s", source.noInstances);
+        log(LL_DBG, source.file, source.line, "Returning: %s", "enum_instances");
+        return source.delivery == SINGLE ? ENUM_INSTANCES_FAILED : ENUM_INSTANCES_OK;
+    }
+
+    if (source.delivery != QUIET)
+        log(LL_DBG, source.file, source.line, "Returning instances");
+    for (size_t i = 0; i < answer.size(); i++) {
+        // The dispatcher's instances are ours: handing one on hands over our
+        // reference, as a copy would.
+        Instance* instance = answer.take(i);
+        if (instance != nullptr && is_subclass(meta_class, instance->meta_class))
+            deliver(instance);
+        else
+            destroy(instance);
+    }
+    log(LL_DBG, source.file, source.line, "Returning: %s", "enum_instances");
+    return ENUM_INSTANCES_OK;
+}
+
+template <class C, const Inventory_Source& SOURCE>
+class Inventory_Provider : public Instance_Provider<C> {
+public:
+    // The model (the properties asked for) is not looked at, nor whether the
+    // handler wants more: every instance is delivered whole.
+    Enum_Instances_Status enum_instances(const C*, Enum_Instances_Handler<C>* handler) {
+        return enumerate_inventory(SOURCE, &C::static_meta_class,
+                                   [handler](Instance* instance) { handler->handle(static_cast<C*>(instance)); });
+    }
+};
+
+}  // namespace CPTA
+
+#endif

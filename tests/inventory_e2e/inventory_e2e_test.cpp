@@ -1,0 +1,476 @@
+// The inventory as a CIM server sees it: the computer system and the fifteen
+// inventory instance providers of libtvrnprovider.so, loaded into the
+// embedded host on top of the adapter-library simulator. Whole instances of
+// the default and variants hosts are in the golden files (tests/golden/);
+// these tests hold what the golden files cannot say by themselves.
+#include <cmpidt.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "tests/e2e/Module_Session.h"
+
+using namespace tvrne2e;
+using tvrnhost::Value;
+
+namespace {
+
+struct Inventory_Class {
+    const char* name;
+    size_t onDefaultHost;     // instances of the simulator's built-in host
+    const char* noInstances;  // what its provider logs when there are none
+};
+
+const Inventory_Class kClasses[] = {
+    {"TAVRIN_ComputerSystem", 1, nullptr},
+    {"TAVRIN_PortController", 3, "No Adapter Found!"},
+    {"TAVRIN_FCPort", 6, "No FC Ports Found!"},
+    {"TAVRIN_SCSIProtocolEndpoint", 11, "No FC Ports Found!"},
+    {"TAVRIN_FCPortStatistics", 6, "No FC Ports Found!"},
+    {"TAVRIN_PhysicalPackage", 3, "No Adapter Found!"},
+    {"TAVRIN_Product", 3, "No Adapter Found!"},
+    {"TAVRIN_AdapterSoftwareIdentity", 8, "No Adapter Found!"},
+    {"TAVRIN_StorageExtent", 11, "No StorageExtents Found!"},
+    {"TAVRIN_TapeDrive", 3, "No TapeDrives Found!"},
+    {"TAVRIN_EthernetPort", 2, "Error: Invalid mapping information"},
+    {"TAVRIN_LogicalPortGroup", 6, "No Logical Port Groups found!"},
+    {"TAVRIN_LANEndpoint", 2, "No Ethernet Port Found"},
+    {"TAVRIN_PhysicalConnector", 5, "No Connector Found!"},
+    {"TAVRIN_AlarmDevice", 6, "Invalid number of Instances returned"},
+    {"TAVRIN_LogicalDisk", 11, "No LogicalDisks Found!"},
+};
+
+std::string text(const Instance& i, const char* property) {
+    const Value* v = i.get(property);
+    return v == nullptr || v->isNull() ? "NULL" : v->asString();
+}
+
+// An integer property; -1 for null or absent.
+long long number(const Instance& i, const char* property) {
+    const Value* v = i.get(property);
+    return v == nullptr || v->isNull() ? -1 : (long long)v->asUint();
+}
+
+const Instance* find(const std::vector<Instance>& items, const char* property,
+                     const std::string& value) {
+    for (const Instance& i : items)
+        if (text(i, property) == value)
+            return &i;
+    return nullptr;
+}
+
+std::vector<std::string> texts(const std::vector<Instance>& items, const char* property) {
+    std::vector<std::string> out;
+    for (const Instance& i : items)
+        out.push_back(text(i, property));
+    return out;
+}
+
+std::vector<Instance> all(Module_Session& s, const char* className) {
+    Result<Instance> r = s.enumerate(className);
+    EXPECT_TRUE(r.ok()) << className << ": " << r.toString();
+    return r.items;
+}
+
+std::string fcPortPath(const std::string& deviceId, const std::string& systemName = "<host>") {
+    return "TAVRIN_FCPort.CreationClassName=\"TAVRIN_FCPort\",DeviceID=\"" + deviceId +
+           "\",SystemCreationClassName=\"TAVRIN_ComputerSystem\",SystemName=\"" + systemName +
+           "\"";
+}
+
+std::string alarmPath(const std::string& deviceId) {
+    return "TAVRIN_AlarmDevice.CreationClassName=\"TAVRIN_AlarmDevice\",DeviceID=\"" + deviceId +
+           "\",SystemCreationClassName=\"TAVRIN_ComputerSystem\",SystemName=\"<host>\"";
+}
+
+//------------------------------------------------------------------------------
+// Every class, every instance
+//------------------------------------------------------------------------------
+
+TEST(Inventory, EveryClassEnumeratesAndEachPathFindsItsInstanceAgain) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    ASSERT_FALSE(s.hostName().empty());
+    for (const Inventory_Class& c : kClasses) {
+        SCOPED_TRACE(c.name);
+        s.markLog();
+        Result<Instance> got = s.enumerate(c.name);
+        ASSERT_TRUE(got.ok()) << got.toString();
+        EXPECT_EQ(got.items.size(), c.onDefaultHost);
+        // The Ethernet-port provider alone does not announce its instances.
+        EXPECT_EQ(s.logCount("Returning instances"),
+                  std::string(c.name) == "TAVRIN_EthernetPort" ? 0u : 1u);
+        EXPECT_EQ(s.logCount("Entering: enum_instances"), 1u);
+        EXPECT_EQ(s.logCount("Returning: enum_instances"), 1u);
+
+        Result<ObjectPath> names = s.enumerateNames(c.name);
+        ASSERT_TRUE(names.ok()) << names.toString();
+        ASSERT_EQ(names.items.size(), got.items.size());
+        std::set<std::string> distinct;
+        for (size_t i = 0; i < got.items.size(); i++) {
+            const Instance& instance = got.items[i];
+            EXPECT_EQ(names.items[i], instance.path());
+            distinct.insert(instance.path().toString());
+            InstanceResult again = s.get(instance.path());
+            ASSERT_TRUE(again.ok()) << instance.path().toString() << ": " << again.toString();
+            EXPECT_EQ(again.instance, instance);
+        }
+        EXPECT_EQ(distinct.size(), got.items.size()) << "paths must tell the instances apart";
+    }
+}
+
+TEST(Inventory, WithoutAdaptersEveryProviderSucceedsEmptyAndSaysSoOnce) {
+    Module_Session& s = Module_Session::open("empty");
+    ASSERT_TRUE(s.loaded());
+    EXPECT_EQ(s.enumerate("TAVRIN_ComputerSystem").items.size(), 1u);
+    for (const Inventory_Class& c : kClasses) {
+        if (c.noInstances == nullptr)
+            continue;
+        SCOPED_TRACE(c.name);
+        s.markLog();
+        Result<Instance> got = s.enumerate(c.name);
+        EXPECT_TRUE(got.ok()) << got.toString();
+        EXPECT_TRUE(got.items.empty());
+        // Told once, by the provider itself.
+        const std::string provider = std::string(c.name) + "_Provider.cpp";
+        std::vector<std::string> told;
+        for (const std::string& line : s.logLines())
+            if (line.find(c.noInstances) != std::string::npos)
+                told.push_back(line);
+        ASSERT_EQ(told.size(), 1u) << c.noInstances;
+        EXPECT_NE(told[0].find(provider), std::string::npos) << told[0];
+        EXPECT_EQ(s.logCount("Returning instances"), 0u);
+    }
+}
+
+//------------------------------------------------------------------------------
+// Get-instance through the enumeration
+//------------------------------------------------------------------------------
+
+TEST(FCPort, GetByItsFourKeysAsksForEveryPortAndFindsTheOne) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    InstanceResult got = s.get(s.path(fcPortPath("100000051e5c6d70")));
+    ASSERT_TRUE(got.ok()) << got.toString();
+    EXPECT_EQ(text(got.instance, "DeviceID"), "100000051e5c6d70");
+    EXPECT_EQ(s.calls("getPortByWwn"), 6u);
+
+    for (const std::string& path :
+         {fcPortPath("100000051e5c6d7f"), fcPortPath("100000051e5c6d70", "some-other-host"),
+          fcPortPath("10:00:00:05:1e:5c:6d:70")}) {
+        InstanceResult missing = s.get(s.path(path));
+        EXPECT_EQ(missing.rc, CMPI_RC_ERR_NOT_FOUND) << path << ": " << missing.toString();
+    }
+}
+
+//------------------------------------------------------------------------------
+// Facts of the default host that can go wrong on the way to the client
+//------------------------------------------------------------------------------
+
+TEST(FCPort, ALinkDownPortReportingSpeed99999HasNoSpeedButKeepsItsMaximum) {
+    Module_Session& s = Module_Session::open();
+    std::vector<Instance> ports = all(s, "TAVRIN_FCPort");
+    const Instance* down = find(ports, "DeviceID", "100000051e0a0b0d");
+    ASSERT_TRUE(down);
+    EXPECT_EQ(number(*down, "Speed"), 0);
+    EXPECT_EQ(number(*down, "MaxSpeed"), 16000000000LL);
+    EXPECT_EQ(number(*down, "EnabledState"), 6);
+    const Instance* up = find(ports, "DeviceID", "100000051e0a0b0c");
+    ASSERT_TRUE(up);
+    EXPECT_EQ(number(*up, "Speed"), 8000000000LL);
+}
+
+TEST(SCSIProtocolEndpoint, EveryTargetSeenThroughAPortIsAnEndpointOfItsOwn) {
+    Module_Session& s = Module_Session::open();
+    std::vector<Instance> endpoints = all(s, "TAVRIN_SCSIProtocolEndpoint");
+    std::vector<std::string> throughPort1;
+    for (const Instance& e : endpoints)
+        if (text(e, "Name").compare(0, 16, "100000051e0a0b0c") == 0)
+            throughPort1.push_back(text(e, "Name") + " role " + std::to_string(number(e, "Role")));
+    // The disk, the tape and the media changer; not the initiator 21000024ff314253.
+    EXPECT_EQ(throughPort1, (std::vector<std::string>{
+                                "100000051e0a0b0c role 2",
+                                "100000051e0a0b0c_500507680110f00d role 3",
+                                "100000051e0a0b0c_500110a0002b3c01 role 3",
+                                "100000051e0a0b0c_500110a0002b3c02 role 3",
+                            }));
+    const Instance* target = find(endpoints, "Name", "100000051e0a0b0c_500507680110f00d");
+    ASSERT_TRUE(target);
+    EXPECT_EQ(text(*target, "ElementName"), "100000051e0a0b0c_500507680110f00d");
+}
+
+TEST(FCPortStatistics, FCAndFCoEPortsEachFillTheirOwnCounters) {
+    Module_Session& s = Module_Session::open();
+    std::vector<Instance> stats = all(s, "TAVRIN_FCPortStatistics");
+    const Instance* fc = find(stats, "InstanceID", "100000051e0a0b0c");
+    const Instance* fcoe = find(stats, "InstanceID", "100000051e8a4b01");
+    ASSERT_TRUE(fc && fcoe);
+    struct Counter {
+        const char* property;
+        long long fc, fcoe;
+    } counters[] = {
+        {"BytesTransmitted", 9876543LL * 4, 0},  // words, as bytes
+        {"BytesReceived", 8765432LL * 4, 0},
+        {"PacketsTransmitted", 123456, 0},
+        {"PacketsReceived", 234567, 0},
+        {"LIPCount", 3, 0},
+        {"NOSCount", 1, 0},
+        {"ErrorFrames", 2, 1 + 5 + 4 + 6 + 7},  // the FCoE errors and the later CRC count
+        {"DumpedFrames", 5, 3},
+        {"LinkFailures", 1, 0},
+        {"LossOfSyncCounter", 4, 0},
+        {"LossOfSignalCounter", 2, 0},
+        {"PrimitiveSeqProtocolErrCount", 0, 0},
+        {"CRCErrors", 7, 5},
+        {"InvalidTransmissionWords", 11, 0},
+    };
+    for (const Counter& c : counters) {
+        EXPECT_EQ(number(*fc, c.property), c.fc) << c.property;
+        EXPECT_EQ(number(*fcoe, c.property), c.fcoe) << c.property;
+    }
+}
+
+TEST(StorageExtent, TheNameFollowsTheKindOfLunIdentifier) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    s.markLog();
+    std::vector<Instance> extents = all(s, "TAVRIN_StorageExtent");
+    struct Lun {
+        const char* deviceId;
+        const char* name;
+        long long nameFormat, nameNamespace;
+    } luns[] = {
+        // description: NAA (type 3), EUI-64 (2); neither description nor serial; serial only
+        {"100000051e0a0b0c_500507680110f00d_ACME_DISK-X_LUN_0", "600507680180870c2000000000000000", 9, 2},
+        {"100000051e0a0b0c_500507680110f00d_ACME_DISK-X_LUN_1", "0050768010f00d01", 10, 3},
+        {"100000051e0a0b0c_500507680110f00d_ACME_DISK-X_LUN_2", "Unable To Fetch", 0, 0},
+        {"100000051e0a0b0c_500507680110f00d_ACME_DISK-X_LUN_3", "ACME+DISK-X+0001", 7, 7},
+        // vendor specific (8), T10 (1), and a type the inventory does not know
+        {"100000051e5c6d70_500601603ba01234_STORCO_ARRAY-9000_LUN_1", "STORCO  ARRAY-9000 SN0B", 1, 1},
+        {"100000051e5c6d70_500601603ba01234_STORCO_ARRAY-9000_LUN_4", "STORCO-ARRAY-9000-T10-0004", 11, 4},
+        {"100000051e5c6d70_500601603ba01234_STORCO_ARRAY-9000_LUN_5", "", -1, -1},
+    };
+    for (const Lun& l : luns) {
+        const Instance* e = find(extents, "DeviceID", l.deviceId);
+        ASSERT_TRUE(e) << l.deviceId;
+        EXPECT_EQ(text(*e, "Name"), l.name) << l.deviceId;
+        EXPECT_EQ(number(*e, "NameFormat"), l.nameFormat) << l.deviceId;
+        EXPECT_EQ(number(*e, "NameNamespace"), l.nameNamespace) << l.deviceId;
+        EXPECT_EQ(text(*e, "ElementName"), std::string(l.deviceId).substr(std::string(l.deviceId).rfind("LUN_")));
+    }
+    // LUN 3 behind the HP adapter has no product id: left out, and said so.
+    EXPECT_FALSE(find(extents, "DeviceID", "100000051e5c6d70_500601603ba01234_STORCO_ARRAY-9000_LUN_3"));
+    EXPECT_EQ(s.logCount("LUN info is NOT available"), 1u);
+
+    // A logical disk always names itself by the description.
+    std::vector<Instance> disks = all(s, "TAVRIN_LogicalDisk");
+    EXPECT_EQ(texts(disks, "DeviceID"), texts(extents, "DeviceID"));
+    for (const Instance& d : disks) {
+        EXPECT_EQ(number(d, "NameFormat"), 1) << text(d, "DeviceID");
+        EXPECT_EQ(number(d, "NameNamespace"), 1) << text(d, "DeviceID");
+    }
+}
+
+TEST(TapeDrive, TapeAndMediaChangerTargetsAreTapeDrivesAndNothingElse) {
+    Module_Session& s = Module_Session::open();
+    EXPECT_EQ(texts(all(s, "TAVRIN_TapeDrive"), "DeviceID"),
+              (std::vector<std::string>{
+                  "100000051e0a0b0c_500110a0002b3c01_TAPECO_LTO-8_LUN_0",
+                  "100000051e0a0b0c_500110a0002b3c02_TAPECO_TL2000 CHANGER_LUN_0",
+                  "100000051e0a0b0c_500110a0002b3c02_TAPECO_TL2000 CHANGER_LUN_1",
+              }));
+    for (const char* className : {"TAVRIN_StorageExtent", "TAVRIN_LogicalDisk"})
+        for (const std::string& id : texts(all(s, className), "DeviceID"))
+            EXPECT_EQ(id.find("500110a0002b3c0"), std::string::npos) << className << " " << id;
+}
+
+TEST(EthernetPort, TheTransceiverGivesThePortTypeAndTheMtuTheLanDataSize) {
+    struct Port {
+        const char* fixture;
+        const char* mac;
+        const char* device;
+        long long portType, maxDataSize;
+    } ports[] = {
+        {"default", "00051e8a4b01", "eth2", 105, 1500 * 8},  // 10G_BASE-SR
+        {"default", "00051e8a4b02", "eth3", 108, 9000 * 8},  // 10G_BASE-LR
+        {"variants", "00051e9c5d01", "eth4", 0, 0},          // 1000BASE-T, no MTU
+    };
+    for (const Port& p : ports) {
+        SCOPED_TRACE(p.mac);
+        Module_Session& s = Module_Session::open(p.fixture);
+        ASSERT_TRUE(s.loaded());
+        const std::vector<Instance> eth = all(s, "TAVRIN_EthernetPort");
+        const Instance* port = find(eth, "DeviceID", p.mac);
+        ASSERT_TRUE(port);
+        EXPECT_EQ(number(*port, "PortType"), p.portType);
+        EXPECT_EQ(text(*port, "ElementName"), p.device);
+        const std::vector<Instance> lan = all(s, "TAVRIN_LANEndpoint");
+        const Instance* endpoint = find(lan, "Name", p.device);
+        ASSERT_TRUE(endpoint);
+        EXPECT_EQ(number(*endpoint, "MaxDataSize"), p.maxDataSize);
+        EXPECT_EQ(text(*endpoint, "MACAddress"), p.mac);
+    }
+}
+
+TEST(PhysicalConnector, EveryFCPortWithAnOpticHasOneTaggedByAdapterAndPosition) {
+    Module_Session& s = Module_Session::open();
+    // The HP adapter's second port has no optic.
+    EXPECT_EQ(texts(all(s, "TAVRIN_PhysicalConnector"), "Tag"),
+              (std::vector<std::string>{"UW1234_1_0", "UW1235_1_1", "UW5560_2_0", "UX2001_3_0",
+                                        "UX2002_3_1"}));
+}
+
+//------------------------------------------------------------------------------
+// Beacons
+//------------------------------------------------------------------------------
+
+MethodResult setAlarmState(Module_Session& s, const std::string& deviceId, unsigned state) {
+    return s.invoke(s.path(alarmPath(deviceId)), "SetAlarmState",
+                    {{"RequestedAlarmState", Value::uint16(std::uint16_t(state))}});
+}
+
+long long alarmState(Module_Session& s, const std::string& deviceId) {
+    std::vector<Instance> alarms = all(s, "TAVRIN_AlarmDevice");
+    const Instance* a = find(alarms, "DeviceID", deviceId);
+    return a == nullptr ? -2 : number(*a, "AlarmState");
+}
+
+TEST(AlarmDevice, SetAlarmStateSwitchesTheBeaconAndTellsHowItWent) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    const std::string port = "100000051e0a0b0c";
+    ASSERT_EQ(alarmState(s, port), 1);
+
+    struct Step {
+        unsigned state;
+        long long returnValue;
+        unsigned long long sets;  // setPortByWwn calls
+        long long alarmStateAfter;
+    } steps[] = {
+        {3, 0, 1, 3},  // on
+        {3, 2, 0, 3},  // already on: the adapter is not asked to change
+        {1, 0, 1, 1},  // off
+        {2, 2, 0, 1},  // not a state the beacon has
+    };
+    for (const Step& step : steps) {
+        SCOPED_TRACE("State " + std::to_string(step.state));
+        s.resetCounters();
+        s.markLog();
+        MethodResult r = setAlarmState(s, port, step.state);
+        ASSERT_TRUE(r.ok()) << r.toString();
+        EXPECT_EQ((long long)r.returnValue.asUint(), step.returnValue);
+        EXPECT_EQ(s.calls("setPortByWwn"), step.sets);
+        if (step.state == 2) {
+            EXPECT_EQ(s.totalCalls(), 0u);
+            EXPECT_EQ(s.logCount("Error: Invalid Input State"), 1u);
+        } else {
+            EXPECT_EQ(s.logCount("return value = " + std::to_string(step.returnValue)), 1u);
+        }
+        EXPECT_EQ(alarmState(s, port), step.alarmStateAfter);
+    }
+
+    // A port the library does not know.
+    MethodResult unknown = setAlarmState(s, "100000051e0a0bff", 3);
+    ASSERT_TRUE(unknown.ok()) << unknown.toString();
+    EXPECT_EQ(unknown.returnValue.asUint(), 2u);
+}
+
+TEST(AlarmDevice, AMezzanineAdapterHasNoBeaconToSwitch) {
+    Module_Session& s = Module_Session::open("variants");
+    ASSERT_TRUE(s.loaded());
+    const std::string mezzaninePort = "100000051e7e8f90";
+    EXPECT_EQ(alarmState(s, mezzaninePort), -2) << "no alarm device for a mezzanine port";
+    MethodResult r = setAlarmState(s, mezzaninePort, 3);
+    ASSERT_TRUE(r.ok()) << r.toString();
+    EXPECT_EQ(r.returnValue.asUint(), 1u);
+    EXPECT_EQ(s.calls("setPortByWwn"), 0u);
+}
+
+//------------------------------------------------------------------------------
+// What the providers refuse, and bad answers from the library
+//------------------------------------------------------------------------------
+
+TEST(Inventory, WritesAndOtherMethodsAreRefused) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    const ObjectPath port = s.path(fcPortPath("100000051e0a0b0c"));
+    EXPECT_EQ(s.host().createInstance(Instance(port)).rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    EXPECT_EQ(s.host().modifyInstance(Instance(port)).rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    EXPECT_EQ(s.host().deleteInstance(port).rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    EXPECT_EQ(s.invoke(port, "Reset").rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    EXPECT_EQ(s.invoke(s.path(alarmPath("100000051e0a0b0c")), "SetUrgency",
+                       {{"RequestedUrgency", Value::uint16(5)}})
+                  .rc,
+              CMPI_RC_ERR_NOT_SUPPORTED);
+    EXPECT_EQ(s.invoke(s.path("TAVRIN_ComputerSystem.CreationClassName=\"TAVRIN_ComputerSystem\","
+                              "Name=\"<host>\""),
+                       "SetPowerState")
+                  .rc,
+              CMPI_RC_ERR_NOT_SUPPORTED);
+}
+
+// Every library entry point an enumeration calls, made to answer nothing, an
+// error or to throw, for every request; and answers with members missing or
+// of the wrong type where the inventory reads them.
+TEST(Inventory, BadLibraryAnswersNeverFailARequest) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    std::set<std::string> entries;
+    for (const Inventory_Class& c : kClasses) {
+        s.clearRecording();
+        all(s, c.name);
+        for (const std::string& e : s.recordedEntries())
+            entries.insert(e);
+    }
+    ASSERT_GE(entries.size(), 10u);
+
+    const tvrn_sim_fault_kind kinds[] = {TVRN_SIM_FAULT_NULL_ANSWER, TVRN_SIM_FAULT_ERROR_OBJECT,
+                                         TVRN_SIM_FAULT_HBA_AGENT_ERROR,
+                                         TVRN_SIM_FAULT_STD_EXCEPTION,
+                                         TVRN_SIM_FAULT_NON_STANDARD};
+    struct Member {
+        const char* entry;
+        const char* member;
+    } members[] = {
+        {"getAllAdaptersIndexString", "indexStrings"}, {"getHbaByWwn", "hbaData"},
+        {"getHbaByWwn", "hbaData.portCount"},           {"getFlashInfo", "flashStatus"},
+        {"getFcPhyPortIndicesByAdapter", "indexStrings"}, {"getPortByWwn", "wwn"},
+        {"getPortByWwn", "supportedPortSpeeds"},        {"getPortByWwn", "beaconState"},
+        {"getDynamicPortStatistics", "0.value"},        {"getAllRemotePorts", "0.remotePortWwn"},
+        {"getCompleteRemotePort", "deviceData"},        {"getCompleteRemotePort", "lunList.0.number"},
+        {"getEthPhyPortIndicesByAdapter", "indexStrings"}, {"getEthPortByEthMac", "ethData"},
+        {"getEthPortByEthMac", "ethData.mtu"},          {"getOpticsSFP", "transceiver"},
+        {"getOpticsSFP", "serialNo"},
+    };
+
+    auto everyClassAnswers = [&](const std::string& what) {
+        for (const Inventory_Class& c : kClasses) {
+            Result<Instance> got = s.enumerate(c.name);
+            EXPECT_TRUE(got.ok()) << what << ", " << c.name << ": " << got.toString();
+        }
+        tvrn_sim_clear_faults();
+    };
+    for (const std::string& entry : entries)
+        for (tvrn_sim_fault_kind kind : kinds)
+            if (s.fault(entry, "", kind, "bad answer"))
+                everyClassAnswers(entry + " fault " + std::to_string(int(kind)));
+    for (const Member& m : members)
+        for (tvrn_sim_fault_kind kind : {TVRN_SIM_FAULT_DROP_MEMBER, TVRN_SIM_FAULT_WRONG_TYPE}) {
+            ASSERT_TRUE(s.fault(m.entry, "", kind, m.member)) << m.entry << " " << m.member;
+            everyClassAnswers(std::string(m.entry) + " " + m.member + " fault " +
+                              std::to_string(int(kind)));
+        }
+
+    // One bad port costs only that port.
+    ASSERT_TRUE(s.fault("getPortByWwn", "10:00:00:05:1e:0a:0b:0c", TVRN_SIM_FAULT_STD_EXCEPTION,
+                        "bad port"));
+    EXPECT_EQ(all(s, "TAVRIN_FCPort").size(), 5u);
+    tvrn_sim_clear_faults();
+    for (const Inventory_Class& c : kClasses)
+        EXPECT_EQ(all(s, c.name).size(), c.onDefaultHost) << c.name;
+}
+
+}  // namespace
