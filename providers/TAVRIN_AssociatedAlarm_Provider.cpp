@@ -1,11 +1,21 @@
-// The provider of TAVRIN_AssociatedAlarm.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_AssociatedAlarm: each FC port with its beacon.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_AssociatedAlarm_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kAlarms = TVRN_PAIRING
+    .fetch(CID_FC_PORT).when_empty(LL_WARN, "No FC Ports Found!")              // 0
+    .fetch(CID_ALARM_DEVICE).when_empty(LL_WARN, "Invalid number of Instances!")  // 1
+    .for_each(0).as("Dependent")
+    .with_all(1, "Antecedent", key("DeviceID"), key("DeviceID"));
+
+}  // namespace
+
 class TAVRIN_AssociatedAlarm_Provider
-    : public Association_Provider<TAVRIN_AssociatedAlarm>,
+    : public Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms>,
       public TAVRIN_AssociatedAlarm_Methods {};
 
 }  // namespace CPTA

@@ -1,11 +1,23 @@
-// The provider of TAVRIN_DeviceSAPImplementation.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_DeviceSAPImplementation: each FC port with its own
+// SCSI initiator endpoint.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_DeviceSAPImplementation_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kEndpoints = TVRN_PAIRING
+    .fetch(CID_SCSI_PROTOCOL_ENDPOINT)  // 0
+    .when_empty(LL_ERR, "Error: Invalid number of instances returned")
+    .fetch(CID_FC_PORT).when_empty(LL_ERR, "Error: No FCPort found!")  // 1
+    .for_each(1).as("Antecedent")
+    .with_first(0, "Dependent", key("DeviceID"), key("Name"));
+
+}  // namespace
+
 class TAVRIN_DeviceSAPImplementation_Provider
-    : public Association_Provider<TAVRIN_DeviceSAPImplementation>,
+    : public Pairing_Provider<TAVRIN_DeviceSAPImplementation, kEndpoints>,
       public TAVRIN_DeviceSAPImplementation_Methods {};
 
 }  // namespace CPTA

@@ -1,11 +1,19 @@
-// The provider of TAVRIN_EthernetPortSystemDevice.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_EthernetPortSystemDevice: the host with every
+// Ethernet port.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_EthernetPortSystemDevice_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kHosted = TVRN_PAIRING.host_with_every(
+    CID_ETHERNET_PORT, "GroupComponent", "PartComponent", "Invalid mapping information");
+
+}  // namespace
+
 class TAVRIN_EthernetPortSystemDevice_Provider
-    : public Association_Provider<TAVRIN_EthernetPortSystemDevice>,
+    : public Pairing_Provider<TAVRIN_EthernetPortSystemDevice, kHosted>,
       public TAVRIN_EthernetPortSystemDevice_Methods {};
 
 }  // namespace CPTA

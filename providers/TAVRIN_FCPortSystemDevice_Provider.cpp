@@ -1,11 +1,18 @@
-// The provider of TAVRIN_FCPortSystemDevice.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_FCPortSystemDevice: the host with every FC port.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_FCPortSystemDevice_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kHosted = TVRN_PAIRING.host_with_every(
+    CID_FC_PORT, "GroupComponent", "PartComponent", "Error: Invalid mapping information");
+
+}  // namespace
+
 class TAVRIN_FCPortSystemDevice_Provider
-    : public Association_Provider<TAVRIN_FCPortSystemDevice>,
+    : public Pairing_Provider<TAVRIN_FCPortSystemDevice, kHosted>,
       public TAVRIN_FCPortSystemDevice_Methods {};
 
 }  // namespace CPTA

@@ -1,11 +1,22 @@
-// The provider of TAVRIN_HostedCollection.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_HostedCollection: the host with every logical port
+// group.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_HostedCollection_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kHosted =
+    TVRN_PAIRING
+        .host_with_every(CID_LOGICAL_PORT_GROUP, "Antecedent", "Dependent",
+                         "Error: Invalid mapping information")
+        .when_empty(LL_WARN, "No Logical Port Groups found!");
+
+}  // namespace
+
 class TAVRIN_HostedCollection_Provider
-    : public Association_Provider<TAVRIN_HostedCollection>,
+    : public Pairing_Provider<TAVRIN_HostedCollection, kHosted>,
       public TAVRIN_HostedCollection_Methods {};
 
 }  // namespace CPTA

@@ -1,11 +1,21 @@
-// The provider of TAVRIN_HostedLANEndpoint.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_HostedLANEndpoint: the host with every LAN endpoint.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_HostedLANEndpoint_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kHosted =
+    TVRN_PAIRING
+        .host_with_every(CID_LAN_ENDPOINT, "Antecedent", "Dependent",
+                         "Error: Invalid number of ComputerSystem instances")
+        .when_empty(LL_WARN, "No Ethernet Port Found");
+
+}  // namespace
+
 class TAVRIN_HostedLANEndpoint_Provider
-    : public Association_Provider<TAVRIN_HostedLANEndpoint>,
+    : public Pairing_Provider<TAVRIN_HostedLANEndpoint, kHosted>,
       public TAVRIN_HostedLANEndpoint_Methods {};
 
 }  // namespace CPTA

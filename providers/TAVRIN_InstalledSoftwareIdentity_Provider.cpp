@@ -1,11 +1,22 @@
-// The provider of TAVRIN_InstalledSoftwareIdentity.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_InstalledSoftwareIdentity: the host with every
+// adapter software identity.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_InstalledSoftwareIdentity_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kHosted =
+    TVRN_PAIRING
+        .host_with_every(CID_ADAPTER_SOFTWARE_IDENTITY, "System", "InstalledSoftware",
+                         "Error: count of computersystem instance is not 1")
+        .when_empty(LL_ERR, "Error: Invalid mapping information");
+
+}  // namespace
+
 class TAVRIN_InstalledSoftwareIdentity_Provider
-    : public Association_Provider<TAVRIN_InstalledSoftwareIdentity>,
+    : public Pairing_Provider<TAVRIN_InstalledSoftwareIdentity, kHosted>,
       public TAVRIN_InstalledSoftwareIdentity_Methods {};
 
 }  // namespace CPTA

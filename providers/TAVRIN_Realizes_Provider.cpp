@@ -1,11 +1,25 @@
-// The provider of TAVRIN_Realizes.
-#include "providers/Provider_Base.h"
+// The provider of TAVRIN_Realizes: each port controller with the physical
+// package at the same position, when both carry the same serial number. Both
+// sets come in adapter order; a pair whose serials differ is dropped, not
+// searched for elsewhere.
+#include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_Realizes_Methods.h"
 
 namespace CPTA {
 
+namespace {
+
+constexpr Pairing kPackages = TVRN_PAIRING
+    .fetch(CID_PORT_CONTROLLER)   // 0
+    .fetch(CID_PHYSICAL_PACKAGE)  // 1
+    .when_differs(0, LL_ERR, "Error: Invalid number of instances returned!\n")
+    .for_each(0).as("Dependent")
+    .at_same_position(1, "Antecedent", key("ElementName"), key("SerialNumber"));
+
+}  // namespace
+
 class TAVRIN_Realizes_Provider
-    : public Association_Provider<TAVRIN_Realizes>,
+    : public Pairing_Provider<TAVRIN_Realizes, kPackages>,
       public TAVRIN_Realizes_Methods {};
 
 }  // namespace CPTA

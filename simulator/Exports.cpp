@@ -106,6 +106,11 @@ SIM_API int tvrn_sim_set_fault(const char* entryPoint, const char* key, int kind
     return Library::instance().setFault(entryPoint, key, kind, code, text, times);
 }
 
+SIM_API int tvrn_sim_set_fault_after(const char* entryPoint, const char* key, int kind, int code, const char* text,
+                                     int skip, int times) {
+    return Library::instance().setFault(entryPoint, key, kind, code, text, times, skip);
+}
+
 SIM_API void tvrn_sim_clear_faults(void) { Library::instance().clearFaults(); }
 
 SIM_API unsigned long long tvrn_sim_call_count(const char* entryPoint) {

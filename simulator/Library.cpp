@@ -73,13 +73,16 @@ std::vector<Fault> parseFaults(const Json::Value& list) {
         for (const KindName& k : kKindNames)
             if (f["kind"].asString() == k.name) kind = k.kind;
         if ((f.isMember("key") && !f["key"].isString()) || (f.isMember("text") && !f["text"].isString()) ||
-            (f.isMember("code") && !f["code"].isIntegral()) || (f.isMember("times") && !f["times"].isIntegral()))
-            throw FixtureError(where + ": \"key\" and \"text\" are texts, \"code\" and \"times\" integers");
+            (f.isMember("code") && !f["code"].isIntegral()) || (f.isMember("times") && !f["times"].isIntegral()) ||
+            (f.isMember("skip") && !f["skip"].isIntegral()))
+            throw FixtureError(where + ": \"key\" and \"text\" are texts, \"code\", \"times\" and \"skip\" integers");
         Fault fault{entryIdByName(f["entryPoint"].asCString()), lowerCase(f.get("key", "").asString()), kind,
-                    f.get("code", 0).asInt(), f.get("text", "").asString(), f.get("times", 0).asInt()};
-        if (!validFault(fault.entry, kind, fault.code, fault.text))
+                    f.get("code", 0).asInt(), f.get("text", "").asString(), f.get("times", 0).asInt(),
+                    f.get("skip", 0).asInt()};
+        if (!validFault(fault.entry, kind, fault.code, fault.text) || fault.skip < 0)
             throw FixtureError(where + ": unknown JSON entry point or fault kind, a member fault without \"text\","
-                                       " or a delay \"code\" that is not 0 to 600000 milliseconds");
+                                       " a delay \"code\" that is not 0 to 600000 milliseconds, or a negative"
+                                       " \"skip\"");
         out.push_back(fault);
     }
     return out;
@@ -370,12 +373,13 @@ void Library::setInitResult(int result) {
 // ---------------------------------------------------------------------------
 // Faults and counters
 
-int Library::setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times) {
+int Library::setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times,
+                      int skip) {
     const int id = entryIdByName(entryPoint);
     const std::string t = text ? text : "";
-    if (!validFault(id, kind, code, t)) return -1;
+    if (!validFault(id, kind, code, t) || skip < 0) return -1;
     std::lock_guard<std::mutex> lock(mu_);
-    faults_.push_back(Fault{id, lowerCase(key ? key : ""), kind, code, t, times});
+    faults_.push_back(Fault{id, lowerCase(key ? key : ""), kind, code, t, times, skip});
     return 0;
 }
 
@@ -403,6 +407,10 @@ bool Library::takeFault(EntryId id, const Json::Value& request, Fault& out) {
         if (it->key.empty() && chosen == faults_.end()) chosen = it;
     }
     if (chosen == faults_.end()) return false;
+    if (chosen->skip > 0) {
+        --chosen->skip;
+        return false;
+    }
     out = *chosen;
     if (chosen->remaining > 0 && --chosen->remaining == 0) faults_.erase(chosen);
     return true;

@@ -29,6 +29,7 @@ struct Fault {
     int code;
     std::string text;
     int remaining;  // > 0: fires that many more times; otherwise until cleared
+    int skip = 0;   // matching calls still to be answered as usual before it fires
 };
 
 class Library {
@@ -59,7 +60,8 @@ public:
     static std::string fixtureDir();
     void setVersion(const char* text);
     void setInitResult(int result);
-    int setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times);
+    int setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times,
+                 int skip = 0);
     void clearFaults();
     std::uint64_t callCount(const char* entryPoint);
     std::uint64_t totalCalls();

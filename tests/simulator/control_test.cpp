@@ -110,6 +110,34 @@ TEST_F(Control, FaultsByKeyAndCount) {
     EXPECT_EQ(-1, tvrn_sim_set_fault("getHost", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "", 0));
 }
 
+TEST_F(Control, FaultsThatLetTheFirstCallsThrough) {
+    // The second reading of the adapter list loses the last adapter, once.
+    ASSERT_EQ(0, tvrn_sim_set_fault_after("getAllAdaptersIndexString", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0,
+                                          "indexStrings.2", 1, 1));
+    EXPECT_EQ(3u, getAllAdaptersIndexString(Json::Value())["indexStrings"].size());
+    EXPECT_EQ(2u, getAllAdaptersIndexString(Json::Value())["indexStrings"].size());
+    EXPECT_EQ(3u, getAllAdaptersIndexString(Json::Value())["indexStrings"].size());
+
+    // Only matching calls are let through: with a key, other adapters' calls do not count.
+    ASSERT_EQ(0, tvrn_sim_set_fault_after("getHbaByWwn", kHpHba, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 2, 0));
+    EXPECT_FALSE(getHbaByWwn(kHpReq).isNull());
+    EXPECT_FALSE(getHbaByWwn(kFcHbaReq).isNull());
+    EXPECT_FALSE(getHbaByWwn(kHpReq).isNull());
+    EXPECT_TRUE(getHbaByWwn(kHpReq).isNull());  // from the third on, until cleared
+    EXPECT_TRUE(getHbaByWwn(kHpReq).isNull());
+    tvrn_sim_clear_faults();
+
+    EXPECT_EQ(-1, tvrn_sim_set_fault_after("getHost", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, -1, 0));
+    // A fixture says the same with "skip".
+    ASSERT_EQ(0, tvrn_sim_load_fixture_text(
+                     R"({"faults": [{"entryPoint": "getHost", "kind": "null", "skip": 1, "times": 1}]})"));
+    EXPECT_FALSE(getHost(Json::Value()).isNull());
+    EXPECT_TRUE(getHost(Json::Value()).isNull());
+    EXPECT_FALSE(getHost(Json::Value()).isNull());
+    EXPECT_EQ(-1, tvrn_sim_load_fixture_text(R"({"faults": [{"entryPoint": "getHost", "kind": "null", "skip": -2}]})"));
+    EXPECT_EQ(-1, tvrn_sim_load_fixture_text(R"({"faults": [{"entryPoint": "getHost", "kind": "null", "skip": "1"}]})"));
+}
+
 TEST_F(Control, CallCounters) {
     getHbaByWwn(kFcHbaReq);
     getHbaByWwn(J("null"));
