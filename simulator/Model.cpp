@@ -199,7 +199,7 @@ void normalizeAdapter(Json::Value& ad, const std::string& path) {
             drv["storageDriverVersion"] = "3.2.1.0";
         }
         if (cna) {
-            drv["networkDriverName"] = "tvne";
+            drv["networkDriverName"] = "tna";
             drv["networkDriverVersion"] = "3.2.1.0";
         }
         ad["driver"] = drv;

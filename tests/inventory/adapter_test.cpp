@@ -125,15 +125,15 @@ TEST_F(Adapters, SoftwareIdentitiesDriversOncePerEnumerationThenBiosAndFirmware)
     Instances ids(fchba(CID_ADAPTER_SOFTWARE_IDENTITY));
     EXPECT_EQ(ids.values(&TAVRIN_AdapterSoftwareIdentity::InstanceID),
               (std::vector<std::string>{"tvfc", "200000051e0a0b0c_bios", "200000051e0a0b0c_firmware",
-                                        "200000051e5c6d70_bios", "200000051e5c6d70_firmware", "tvne",
+                                        "200000051e5c6d70_bios", "200000051e5c6d70_firmware", "tna",
                                         "00051e8a4b00_bios", "00051e8a4b00_firmware"}));
     auto id = [&](const char* instanceId) {
         return ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, instanceId);
     };
-    EXPECT_TRUE(sameInstance(expectedIdentity("tvne", "Network driver for Tavrin adapter",
+    EXPECT_TRUE(sameInstance(expectedIdentity("tna", "Network driver for Tavrin adapter",
                                               "Network driver", "3.2.1.0", 2,
                                               "Network driver for Tavrin adapter"),
-                             id("tvne")));
+                             id("tna")));
     EXPECT_TRUE(sameInstance(expectedIdentity("tvfc", "Storage driver for Tavrin adapter",
                                               "Storage driver", "3.2.1.0", 2,
                                               "Storage driver for Tavrin adapter"),
@@ -156,7 +156,7 @@ TEST_F(Adapters, NetworkDriverComesBeforeStorageDriverOnACnaListedFirst) {
     loadJson(fixture);
     Instances ids(fchba(CID_ADAPTER_SOFTWARE_IDENTITY));
     EXPECT_EQ(ids.values(&TAVRIN_AdapterSoftwareIdentity::InstanceID),
-              (std::vector<std::string>{"tvne", "tvfc", "00051e8a4b00_bios", "00051e8a4b00_firmware",
+              (std::vector<std::string>{"tna", "tvfc", "00051e8a4b00_bios", "00051e8a4b00_firmware",
                                         "00051e9c5d00_firmware"}));
 }
 
