@@ -42,15 +42,18 @@ void* _thread_proc(void* p) {
 
     Context_Guard guard{context};
     void* result = nullptr;
+    bool attached = false;
     try {
         if (context) {
             Thread_Context::push(context);
             context->thread_start_hook();
+            attached = true;
         }
         result = proc(arg);
         if (context) {
             if (context != Thread_Context::top())
                 __cimple_assert(__FILE__, __LINE__, "Thread", "context == Thread_Context::top()");
+            attached = false;
             context->thread_exit_hook();
         }
     } catch (...) {
@@ -60,6 +63,13 @@ void* _thread_proc(void* p) {
             throw;
         TVRN_LOG(LL_ERR, "thread procedure ended by an exception");
         result = nullptr;
+        // The thread still leaves the server it was attached to.
+        if (attached) {
+            try {
+                context->thread_exit_hook();
+            } catch (...) {
+            }
+        }
     }
     return result;
 }

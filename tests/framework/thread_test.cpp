@@ -184,6 +184,24 @@ TEST(Thread, AnExceptionEndsOnlyTheProcedure) {
     EXPECT_EQ(nullptr, result);
 }
 
+TEST(Thread, AThrowingProcedureStillLeavesTheServer) {
+    Events events;
+    Fake_Context parent(events, "parent");
+    Thread_Context::push(&parent);
+
+    Thread t;
+    char arg[] = "throw";
+    ASSERT_EQ(0, Thread::create_joinable(
+                     t, [](void*) -> void* { throw std::runtime_error("boom"); }, arg));
+    void* result = &t;
+    ASSERT_EQ(0, Thread::join(t, result));
+    EXPECT_EQ(nullptr, result);
+    const std::vector<std::string> expect = {"parent create throw", "child start", "child exit",
+                                             "child destroyed"};
+    EXPECT_EQ(expect, events.get());
+    Thread_Context::pop();
+}
+
 TEST(Thread, Detached) {
     static std::atomic<bool> done(false);
     Thread t;
