@@ -1,6 +1,7 @@
 #include "cmpi/CMPI_Containers.h"
 
 #include <cstring>
+#include <limits>
 
 #include "cmpi/Conversion_Log.h"
 #include "framework/Slot.h"
@@ -450,32 +451,54 @@ int _write_array(const Meta_Repository* meta_repository, const CMPIBroker* broke
     return -1;
 }
 
+// Stores a 64-bit integer (given as its magnitude and sign) as T when T can
+// hold it; a key that does not fit is refused rather than cut to another
+// key's value.
+template <class T>
+bool _store_if_fits(Value& value, uint64 magnitude, bool negative) {
+    typedef std::numeric_limits<T> limits;
+    if (negative) {
+        if (!limits::is_signed || magnitude - 1 > uint64(limits::max()))
+            return false;
+        value.set_value(T(-sint64(magnitude - 1) - 1));
+    } else {
+        if (magnitude > uint64(limits::max()))
+            return false;
+        value.set_value(T(magnitude));
+    }
+    return true;
+}
+
 // A 64-bit integer as another integer type, keeping its null flag.
 bool _narrow_integer(Value& value, Value::Type expected) {
-    uint64 bits;
+    uint64 magnitude;
+    bool negative = false;
     if (value.type() == Value::UINT64) {
-        value.get_value(bits);
+        value.get_value(magnitude);
     } else if (value.type() == Value::SINT64) {
         sint64 s;
         value.get_value(s);
-        bits = uint64(s);
+        negative = s < 0;
+        magnitude = negative ? uint64(-(s + 1)) + 1 : uint64(s);
     } else {
         return false;
     }
     bool null = value.null();
+    bool stored = false;
     switch (expected) {
-        case Value::UINT8: value.set_value(uint8(bits)); break;
-        case Value::SINT8: value.set_value(sint8(bits)); break;
-        case Value::UINT16: value.set_value(uint16(bits)); break;
-        case Value::SINT16: value.set_value(sint16(bits)); break;
-        case Value::UINT32: value.set_value(uint32(bits)); break;
-        case Value::SINT32: value.set_value(sint32(bits)); break;
-        case Value::UINT64: value.set_value(uint64(bits)); break;
-        case Value::SINT64: value.set_value(sint64(bits)); break;
+        case Value::UINT8: stored = _store_if_fits<uint8>(value, magnitude, negative); break;
+        case Value::SINT8: stored = _store_if_fits<sint8>(value, magnitude, negative); break;
+        case Value::UINT16: stored = _store_if_fits<uint16>(value, magnitude, negative); break;
+        case Value::SINT16: stored = _store_if_fits<sint16>(value, magnitude, negative); break;
+        case Value::UINT32: stored = _store_if_fits<uint32>(value, magnitude, negative); break;
+        case Value::SINT32: stored = _store_if_fits<sint32>(value, magnitude, negative); break;
+        case Value::UINT64: stored = _store_if_fits<uint64>(value, magnitude, negative); break;
+        case Value::SINT64: stored = _store_if_fits<sint64>(value, magnitude, negative); break;
         default: return false;
     }
-    value.null(null);
-    return true;
+    if (stored)
+        value.null(null);
+    return stored;
 }
 
 }  // namespace

@@ -211,8 +211,22 @@ TEST_F(Conversion, KeysArrivingAs64BitIntegersAreNarrowed) {
     EXPECT_TRUE(contains(text, "uint16 Port = 300;")) << text;
     EXPECT_TRUE(contains(text, "uint32 Index = 7;")) << text;
 
-    // Other mismatches are not mended.
+    // A key the property cannot hold is refused, not cut to another key.
     Log_Watch log;
+    v.uint64 = 70000;
+    CMAddKey(op, "Port", &v, CMPI_uint64);
+    v.sint64 = -1;
+    CMAddKey(op, "Index", &v, CMPI_sint64);
+    ASSERT_EQ(make_cimple_reference(broker(), &TVRNTEST_Gadget::static_meta_class, op, keys),
+              CMPI_RC_OK);
+    text = dump(keys);
+    unref(keys);
+    EXPECT_TRUE(contains(text, "uint16 Port = NULL;")) << text;
+    EXPECT_TRUE(contains(text, "uint32 Index = NULL;")) << text;
+    EXPECT_TRUE(log.has("type mismatch on Port: uint64/uint16")) << log.text();
+    EXPECT_TRUE(log.has("type mismatch on Index: sint64/uint32")) << log.text();
+
+    // Other mismatches are not mended.
     v.string = CMNewString(broker(), "80", nullptr);
     CMAddKey(op, "Port", &v, CMPI_string);
     ASSERT_EQ(make_cimple_reference(broker(), &TVRNTEST_Gadget::static_meta_class, op, keys),
