@@ -93,7 +93,7 @@ bool _enum_instance_names_proc(Instance* instance, Enum_Instances_Status, void* 
             data->failed = true;
             return false;
         }
-        Cmpi_Hold<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         if (CMReturnObjectPath(data->result, op).rc != CMPI_RC_OK)
             data->failed = true;
     } catch (...) {
@@ -104,18 +104,8 @@ bool _enum_instance_names_proc(Instance* instance, Enum_Instances_Status, void* 
 
 // Returns one instance restricted to the request's property list.
 int _return_instance(Result_Data* data, const Instance* instance) {
-    CMPIObjectPath* op = nullptr;
-    int rc = make_cmpi_object_path(data->broker, instance, data->name_space.c_str(), op);
-    if (rc != CMPI_RC_OK)
-        return rc;
-    Cmpi_Hold<CMPIObjectPath> hold_op(op);
-    CMPIInstance* ci = nullptr;
-    rc = make_cmpi_instance(data->broker, instance, data->name_space.c_str(), op,
-                            data->properties, ci);
-    if (rc != CMPI_RC_OK)
-        return rc;
-    Cmpi_Hold<CMPIInstance> hold_ci(ci);
-    return CMReturnInstance(data->result, ci).rc;
+    return _return_cmpi_instance(data->broker, data->result, instance, data->name_space.c_str(),
+                                 data->properties);
 }
 
 bool _enum_instances_proc(Instance* instance, Enum_Instances_Status, void* client_data) {
@@ -140,6 +130,22 @@ Entry_Status _done(const CMPIResult* result) {
 }
 
 }  // namespace
+
+int _return_cmpi_instance(const CMPIBroker* broker, const CMPIResult* result,
+                          const Instance* instance, const char* name_space,
+                          const char* const* properties) {
+    CMPIObjectPath* op = nullptr;
+    int rc = make_cmpi_object_path(broker, instance, name_space, op);
+    if (rc != CMPI_RC_OK)
+        return rc;
+    Cmpi_Ptr<CMPIObjectPath> hold_op(op);
+    CMPIInstance* ci = nullptr;
+    rc = make_cmpi_instance(broker, instance, name_space, op, properties, ci);
+    if (rc != CMPI_RC_OK)
+        return rc;
+    Cmpi_Ptr<CMPIInstance> hold_ci(ci);
+    return CMReturnInstance(result, ci).rc;
+}
 
 const char* _rc_to_str(int rc) {
     if (rc >= 0 && rc < int(sizeof(_rc_names) / sizeof(_rc_names[0])) && rc != 1)
@@ -563,7 +569,7 @@ CMPIStatus CMPI_Adapter::createInstance(CMPIInstanceMI* mi, const CMPIContext* c
         rc = make_cmpi_object_path(adapter->_broker, instance, ns.c_str(), created);
         if (rc != CMPI_RC_OK)
             return rc;
-        Cmpi_Hold<CMPIObjectPath> hold_path(created);
+        Cmpi_Ptr<CMPIObjectPath> hold_path(created);
         CMReturnObjectPath(result, created);
         return _done(result);
     });

@@ -3,6 +3,7 @@
 #include <cstring>
 #include <limits>
 
+#include "cmpi/Cmpi_Ptr.h"
 #include "cmpi/Conversion_Log.h"
 #include "framework/Slot.h"
 
@@ -11,36 +12,6 @@ namespace CPTA {
 namespace {
 
 const uint32 EMBEDDED = FLAG_EMBEDDED_OBJECT | FLAG_EMBEDDED_INSTANCE;
-
-// Releases an encapsulated object that the broker made for us once we no
-// longer need it (getters' results, temporaries).
-template <class T>
-class Cmpi_Ptr {
-public:
-    explicit Cmpi_Ptr(T* p = nullptr) : _p(p) {}
-    ~Cmpi_Ptr() {
-        if (_p)
-            CMRelease(_p);
-    }
-    Cmpi_Ptr(const Cmpi_Ptr&) = delete;
-    Cmpi_Ptr& operator=(const Cmpi_Ptr&) = delete;
-
-    T* get() const { return _p; }
-    T* release() {
-        T* p = _p;
-        _p = nullptr;
-        return p;
-    }
-    void reset(T* p) {
-        if (_p)
-            CMRelease(_p);
-        _p = p;
-    }
-    explicit operator bool() const { return _p != nullptr; }
-
-private:
-    T* _p;
-};
 
 // Copies the text of a CMPI string that we own and releases the string;
 // false when there is no text.

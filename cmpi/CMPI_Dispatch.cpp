@@ -42,23 +42,13 @@ int _return_path(Association_Data* data, const Instance* instance) {
     int rc = make_cmpi_object_path(data->broker, instance, _name_space_for(data, instance), op);
     if (rc != CMPI_RC_OK)
         return rc;
-    Cmpi_Hold<CMPIObjectPath> hold(op);
+    Cmpi_Ptr<CMPIObjectPath> hold(op);
     return CMReturnObjectPath(data->result, op).rc;
 }
 
 int _return_instance(Association_Data* data, const Instance* instance) {
-    const char* ns = _name_space_for(data, instance);
-    CMPIObjectPath* op = nullptr;
-    int rc = make_cmpi_object_path(data->broker, instance, ns, op);
-    if (rc != CMPI_RC_OK)
-        return rc;
-    Cmpi_Hold<CMPIObjectPath> hold_op(op);
-    CMPIInstance* ci = nullptr;
-    rc = make_cmpi_instance(data->broker, instance, ns, op, data->properties, ci);
-    if (rc != CMPI_RC_OK)
-        return rc;
-    Cmpi_Hold<CMPIInstance> hold_ci(ci);
-    return CMReturnInstance(data->result, ci).rc;
+    return _return_cmpi_instance(data->broker, data->result, instance,
+                                 _name_space_for(data, instance), data->properties);
 }
 
 // Runs one result through f unless an earlier one failed.
@@ -95,13 +85,13 @@ bool _associator_instances_proc(Instance* instance, Enum_Associator_Names_Status
         int rc = make_cmpi_object_path(d->broker, object, _name_space_for(d, object), op);
         if (rc != CMPI_RC_OK)
             return rc;
-        Cmpi_Hold<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         CMPIStatus st = {CMPI_RC_OK, nullptr};
         CMPIInstance* ci = CBGetInstance(d->broker, d->context, op,
                                          const_cast<const char**>(d->properties), &st);
         if (!ci)
             return CMPI_RC_ERR_NOT_FOUND;
-        Cmpi_Hold<CMPIInstance> hold_ci(ci);
+        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
         if (st.rc != CMPI_RC_OK)
             return st.rc;
         return CMReturnInstance(d->result, ci).rc;
@@ -144,14 +134,14 @@ bool _references_proc(Instance* instance, Enum_References_Status, void* data) {
         int rc = make_cmpi_object_path(d->broker, association, ns, op);
         if (rc != CMPI_RC_OK)
             return rc;
-        Cmpi_Hold<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         if (d->properties)
             _restrict_properties(association, d->properties);
         CMPIInstance* ci = nullptr;
         rc = make_cmpi_instance(d->broker, association, ns, op, d->properties, ci);
         if (rc != CMPI_RC_OK)
             return rc;
-        Cmpi_Hold<CMPIInstance> hold_ci(ci);
+        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
         return CMReturnInstance(d->result, ci).rc;
     });
 }
@@ -488,11 +478,11 @@ bool CMPI_Adapter::_indication_proc(Instance* indication, void* client_data) {
             CMPIObjectPath* op = nullptr;
             if (make_cmpi_object_path(broker, indication, ns, op) != CMPI_RC_OK)
                 continue;
-            Cmpi_Hold<CMPIObjectPath> hold_op(op);
+            Cmpi_Ptr<CMPIObjectPath> hold_op(op);
             CMPIInstance* ci = nullptr;
             if (make_cmpi_instance(broker, indication, ns, op, nullptr, ci) != CMPI_RC_OK)
                 continue;
-            Cmpi_Hold<CMPIInstance> hold_ci(ci);
+            Cmpi_Ptr<CMPIInstance> hold_ci(ci);
             CBDeliverIndication(broker, thread_context->cmpi_context(), ns, ci);
         }
         return true;

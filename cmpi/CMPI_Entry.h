@@ -4,6 +4,7 @@
 #ifndef CPTA_CMPI_CMPI_ENTRY_H
 #define CPTA_CMPI_CMPI_ENTRY_H
 
+#include "cmpi/Cmpi_Ptr.h"
 #include <cmpimacs.h>
 
 #include <exception>
@@ -101,22 +102,12 @@ CMPIStatus run_entry(const char* name, void* hdl, const CMPIContext* context, F&
     return _make_status(broker, status);
 }
 
-// Releases a broker object when the scope ends.
-template <class T>
-class Cmpi_Hold {
-public:
-    explicit Cmpi_Hold(T* p = nullptr) : _p(p) {}
-    ~Cmpi_Hold() {
-        if (_p)
-            CMRelease(_p);
-    }
-    Cmpi_Hold(const Cmpi_Hold&) = delete;
-    Cmpi_Hold& operator=(const Cmpi_Hold&) = delete;
-    T* get() const { return _p; }
-
-private:
-    T* _p;
-};
+// Converts one instance into a CMPI instance on its object path in the name
+// space, restricted to the property list (null: all), and returns it to the
+// server; a CMPI return code.
+int _return_cmpi_instance(const CMPIBroker* broker, const CMPIResult* result,
+                          const Instance* instance, const char* name_space,
+                          const char* const* properties);
 
 // The class of a request's object path in the provider's repository
 // (CMPI_RC_ERR_FAILED when the repository has no such class).

@@ -3,6 +3,7 @@
 #include <cmpimacs.h>
 
 #include "cmpi/CMPI_Adapter.h"
+#include "cmpi/Cmpi_Ptr.h"
 #include "cmpi/CMPI_Containers.h"
 #include "cmpi/Converter.h"
 #include "framework/Log.h"
@@ -10,19 +11,6 @@
 namespace CPTA {
 
 namespace {
-
-// Releases a broker object that we made or got and no longer need.
-template <class T>
-struct Released {
-    T* p;
-    explicit Released(T* x = nullptr) : p(x) {}
-    ~Released() {
-        if (p)
-            CMRelease(p);
-    }
-    Released(const Released&) = delete;
-    Released& operator=(const Released&) = delete;
-};
 
 const Meta_Repository* _repository_of(const Instance* instance) {
     const Meta_Class* mc = instance->meta_class;
@@ -77,7 +65,7 @@ Instance_Enumerator_Rep* CMPI_Thread_Context::instance_enumerator_create(const c
         CMPIObjectPath* op = nullptr;
         if (make_cmpi_object_path(_broker, model, name_space, op) != CMPI_RC_OK)
             return nullptr;
-        Released<CMPIObjectPath> hold(op);
+        Cmpi_Ptr<CMPIObjectPath> hold(op);
         CMPIStatus rc = {CMPI_RC_OK, nullptr};
         CMPIEnumeration* enumeration = CBEnumInstances(_broker, _context, op, nullptr, &rc);
         if (!enumeration)
@@ -122,9 +110,9 @@ void CMPI_Thread_Context::instance_enumerator_next(Instance_Enumerator_Rep* rep)
         if (rc.rc != CMPI_RC_OK || data.type != CMPI_instance || !data.value.inst ||
             (data.state & CMPI_nullValue))
             return;
-        Released<CMPIObjectPath> op(CMGetObjectPath(data.value.inst, nullptr));
+        Cmpi_Ptr<CMPIObjectPath> op(CMGetObjectPath(data.value.inst, nullptr));
         Instance* instance = nullptr;
-        if (make_cimple_instance(_broker, rep->meta_class, op.p, data.value.inst, instance) ==
+        if (make_cimple_instance(_broker, rep->meta_class, op.get(), data.value.inst, instance) ==
             CMPI_RC_OK)
             rep->instance.reset(instance);
     } catch (...) {
@@ -150,13 +138,13 @@ Instance* CMPI_Thread_Context::get_instance(const char* name_space, const Instan
         CMPIObjectPath* op = nullptr;
         if (make_cmpi_object_path(_broker, model, name_space, op) != CMPI_RC_OK)
             return nullptr;
-        Released<CMPIObjectPath> hold(op);
+        Cmpi_Ptr<CMPIObjectPath> hold(op);
         CMPIStatus rc = {CMPI_RC_OK, nullptr};
-        Released<CMPIInstance> ci(CBGetInstance(_broker, _context, op, nullptr, &rc));
-        if (!ci.p || rc.rc != CMPI_RC_OK)
+        Cmpi_Ptr<CMPIInstance> ci(CBGetInstance(_broker, _context, op, nullptr, &rc));
+        if (!ci.get() || rc.rc != CMPI_RC_OK)
             return nullptr;
         Instance* instance = nullptr;
-        if (make_cimple_instance(_broker, model->meta_class, op, ci.p, instance) != CMPI_RC_OK)
+        if (make_cimple_instance(_broker, model->meta_class, op, ci.get(), instance) != CMPI_RC_OK)
             return nullptr;
         return instance;
     } catch (...) {
@@ -171,13 +159,13 @@ int CMPI_Thread_Context::create_instance(const char* name_space, const Instance*
         CMPIObjectPath* op = nullptr;
         if (make_cmpi_object_path(_broker, instance, name_space, op) != CMPI_RC_OK)
             return -1;
-        Released<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         CMPIInstance* ci = nullptr;
         if (make_cmpi_instance(_broker, instance, name_space, op, nullptr, ci) != CMPI_RC_OK)
             return -1;
-        Released<CMPIInstance> hold_ci(ci);
+        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
         CMPIStatus rc = {CMPI_RC_OK, nullptr};
-        Released<CMPIObjectPath> created(CBCreateInstance(_broker, _context, op, ci, &rc));
+        Cmpi_Ptr<CMPIObjectPath> created(CBCreateInstance(_broker, _context, op, ci, &rc));
         return rc.rc == CMPI_RC_OK ? 0 : -1;
     } catch (...) {
         return -1;
@@ -191,11 +179,11 @@ int CMPI_Thread_Context::modify_instance(const char* name_space, const Instance*
         CMPIObjectPath* op = nullptr;
         if (make_cmpi_object_path(_broker, instance, name_space, op) != CMPI_RC_OK)
             return -1;
-        Released<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         CMPIInstance* ci = nullptr;
         if (make_cmpi_instance(_broker, instance, name_space, op, nullptr, ci) != CMPI_RC_OK)
             return -1;
-        Released<CMPIInstance> hold_ci(ci);
+        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
         CMPIStatus rc = CBModifyInstance(_broker, _context, op, ci, nullptr);
         return rc.rc == CMPI_RC_OK ? 0 : -1;
     } catch (...) {
@@ -210,7 +198,7 @@ int CMPI_Thread_Context::delete_instance(const char* name_space, const Instance*
         CMPIObjectPath* op = nullptr;
         if (make_cmpi_object_path(_broker, instance, name_space, op) != CMPI_RC_OK)
             return -1;
-        Released<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         CMPIStatus rc = CBDeleteInstance(_broker, _context, op);
         return rc.rc == CMPI_RC_OK ? 0 : -1;
     } catch (...) {
@@ -228,29 +216,29 @@ int CMPI_Thread_Context::invoke_method(const char* name_space, const Instance* i
             TVRN_WARN("failed");
             return -1;
         }
-        Released<CMPIObjectPath> hold_op(op);
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
 
         CMPIStatus rc = {CMPI_RC_OK, nullptr};
-        Released<CMPIArgs> in(CMNewArgs(_broker, &rc));
-        Released<CMPIArgs> out(CMNewArgs(_broker, &rc));
-        if (!in.p || !out.p) {
+        Cmpi_Ptr<CMPIArgs> in(CMNewArgs(_broker, &rc));
+        Cmpi_Ptr<CMPIArgs> out(CMNewArgs(_broker, &rc));
+        if (!in.get() || !out.get()) {
             TVRN_WARN("failed");
             return -1;
         }
         {
-            CMPIArgs_Container args(nullptr, _broker, name_space, in.p);
+            CMPIArgs_Container args(nullptr, _broker, name_space, in.get());
             args.convert(meth, FLAG_IN);
         }
 
         const Meta_Class* mc = meth->meta_class;
-        CMPIData result = CBInvokeMethod(_broker, _context, op, mc->name, in.p, out.p, &rc);
+        CMPIData result = CBInvokeMethod(_broker, _context, op, mc->name, in.get(), out.get(), &rc);
         if (rc.rc != CMPI_RC_OK) {
             TVRN_WARN("failed[%u]", unsigned(rc.rc));
             return -1;
         }
 
         const Meta_Repository* repository = _repository_of(instance);
-        CMPIArgs_Container args(repository, _broker, name_space, out.p);
+        CMPIArgs_Container args(repository, _broker, name_space, out.get());
         if (args.convert(mc, FLAG_OUT, meth) != 0) {
             TVRN_WARN("failed");
             return -1;
