@@ -1,27 +1,22 @@
-// ABI checks of the CMPI header set as seen by the C++ compiler, compared
-// with the C compiler's view, plus the behaviour of the irregular macros.
+// ABI checks of the CMPI header set as seen by the C++ compiler (abi_c.c makes
+// the same checks in C), plus the behaviour of the irregular macros.
 #include <cmpimacs.h>  // alone must bring in the whole set
 
 #include <gtest/gtest.h>
 
-#include <cstring>
-#include <string>
+#include <cstddef>
 #include <type_traits>
 
 #include "tests/cmpi_abi/abi_layout.h"
 
 // ---------------------------------------------------------------------------
-// Compile time: the same table as the C side.
+// Compile time: the table, as in abi_c.c.
 // ---------------------------------------------------------------------------
 #define ABI_SIZE(T, n) static_assert(sizeof(T) == (n), "sizeof " #T);
 #define ABI_OFFSET(T, m, n) static_assert(offsetof(T, m) == (n), "offsetof " #T "." #m);
 #define ABI_SLOT(T, m, k) static_assert(offsetof(T, m) == 8 * (k), "slot " #T "." #m);
 #define ABI_CONST(name, v) static_assert((name) == (v), "value of " #name);
 #include "tests/cmpi_abi/abi_table.inc"
-#undef ABI_SIZE
-#undef ABI_OFFSET
-#undef ABI_SLOT
-#undef ABI_CONST
 
 // Switches of the default build and names that must not exist.
 #if !defined(CMPI_VER_200) || !defined(CMPI_VER_100) || !defined(CMPI_VER_90) || \
@@ -277,35 +272,6 @@ SIG(CMPIIndicationMIFT, disableIndications, CMPIStatus, (CI, C))
 // ---------------------------------------------------------------------------
 namespace {
 
-#define ABI_SIZE(T, n) {"sizeof " #T, (long long)sizeof(T), (n)},
-#define ABI_OFFSET(T, m, n) {"offsetof " #T "." #m, (long long)offsetof(T, m), (n)},
-#define ABI_SLOT(T, m, k) {"offsetof " #T "." #m, (long long)offsetof(T, m), 8 * (k)},
-#define ABI_CONST(name, v) {#name, (long long)(name), (v)},
-const tvrn_abi_entry kCxxEntries[] = {
-#include "tests/cmpi_abi/abi_table.inc"
-};
-
-TEST(CmpiAbi, CAndCxxAgreeWithTheTable)
-{
-    const size_t n = sizeof(kCxxEntries) / sizeof(kCxxEntries[0]);
-    ASSERT_EQ(tvrn_abi_c_count, n);
-    for (size_t i = 0; i < n; ++i) {
-        SCOPED_TRACE(kCxxEntries[i].what);
-        EXPECT_STREQ(tvrn_abi_c_entries[i].what, kCxxEntries[i].what);
-        EXPECT_EQ(kCxxEntries[i].measured, kCxxEntries[i].expected);
-        EXPECT_EQ(tvrn_abi_c_entries[i].measured, kCxxEntries[i].measured);
-    }
-}
-
-TEST(CmpiAbi, Version100BuildDropsThe20Members)
-{
-    for (size_t i = 0; i < tvrn_abi_v100_count; ++i) {
-        SCOPED_TRACE(tvrn_abi_v100_entries[i].what);
-        EXPECT_EQ(tvrn_abi_v100_entries[i].measured, tvrn_abi_v100_entries[i].expected);
-    }
-    EXPECT_EQ(tvrn_abi_v100_stub_mi_version(), 100);
-}
-
 TEST(CmpiAbi, ContextEntryNamesAreTheirOwnNames)
 {
     EXPECT_STREQ(CMPIPrincipal, "CMPIPrincipal");
@@ -330,49 +296,35 @@ TEST(CmpiAbi, CStubsBuildVersionedTablesAndRunTheHook)
     EXPECT_EQ(inst->ft->miVersion, 200);
     EXPECT_STREQ(inst->ft->miName, "instanceTvrnProbe");
     EXPECT_NE(inst->ft->modifyInstance, nullptr);
-
     auto *ind = static_cast<const CMPIIndicationMI *>(p.indicationMI);
     EXPECT_STREQ(ind->ft->miName, "IndicationTvrnProbe");
     EXPECT_NE(ind->ft->enableIndications, nullptr);
     EXPECT_NE(ind->ft->disableIndications, nullptr);
-
-    auto *meth = static_cast<const CMPIMethodMI *>(p.methodMI);
-    EXPECT_STREQ(meth->ft->miName, "methodTvrnProbe");
+    EXPECT_STREQ(static_cast<const CMPIMethodMI *>(p.methodMI)->ft->miName, "methodTvrnProbe");
+    // A provider built for 1.00 gets 1.00 tables.
+    EXPECT_EQ(tvrn_abi_v100_stub_mi_version(), 100);
 }
 
 // --- macros that are easy to get subtly wrong -----------------------------
 
-struct Recorder {
-    const char *args[4] = {};
-    int calls = 0;
-};
-Recorder rec;
+const char *seen[2];
 
 CMPIEnumeration *recExecQuery(B, C, OP, const char *query, const char *lang, ST)
 {
-    rec.args[0] = query;
-    rec.args[1] = lang;
-    ++rec.calls;
+    seen[0] = query, seen[1] = lang;
     return nullptr;
 }
 CMPIEnumeration *recReferences(B, C, OP, const char *resultClass, const char *role, PL, ST)
 {
-    rec.args[0] = resultClass;
-    rec.args[1] = role;
-    ++rec.calls;
+    seen[0] = resultClass, seen[1] = role;
     return nullptr;
 }
 const char *recGetCharPtr(const CMPIString *, CMPIStatus *rc)
 {
-    rec.args[0] = rc == nullptr ? "null-rc" : "rc";
-    ++rec.calls;
+    seen[0] = rc == nullptr ? "null-rc" : "rc";
     return "text";
 }
-CMPIStatus recReturnDone(const CMPIResult *)
-{
-    ++rec.calls;
-    return CMPIStatus{CMPI_RC_ERR_FAILED, nullptr};
-}
+CMPIStatus recReturnDone(const CMPIResult *) { return CMPIStatus{CMPI_RC_ERR_FAILED, nullptr}; }
 
 CMPIStatus returnsThroughCMReturnWithChars()
 {
@@ -395,14 +347,12 @@ TEST(CmpiAbi, MacrosPassArgumentsByPosition)
     broker.bft = &bft;
     const CMPIBroker *b = &broker;
 
-    rec = Recorder{};
     CBExecQuery(b, nullptr, nullptr, "fourth", "fifth", nullptr);
-    EXPECT_STREQ(rec.args[0], "fourth");  // goes to `query`
-    EXPECT_STREQ(rec.args[1], "fifth");
-
+    EXPECT_STREQ(seen[0], "fourth");  // goes to `query`
+    EXPECT_STREQ(seen[1], "fifth");
     CBReferences(b, nullptr, nullptr, "CIM_Assoc", "Role", nullptr, nullptr);
-    EXPECT_STREQ(rec.args[0], "CIM_Assoc");  // the 4th argument is resultClass
-    EXPECT_STREQ(rec.args[1], "Role");
+    EXPECT_STREQ(seen[0], "CIM_Assoc");  // the 4th argument is resultClass
+    EXPECT_STREQ(seen[1], "Role");
 }
 
 TEST(CmpiAbi, StatusAndResultMacros)
@@ -410,9 +360,8 @@ TEST(CmpiAbi, StatusAndResultMacros)
     CMPIStringFT sft{};
     sft.getCharPtr = recGetCharPtr;
     CMPIString s{reinterpret_cast<void *>(1), &sft};
-    rec = Recorder{};
     EXPECT_STREQ(CMGetCharPtr(&s), "text");
-    EXPECT_STREQ(rec.args[0], "null-rc");
+    EXPECT_STREQ(seen[0], "null-rc");
 
     CMPIStatus st = returnsThroughCMReturnWithChars();
     EXPECT_EQ(st.rc, CMPI_RC_ERR_NOT_FOUND);

@@ -42,17 +42,17 @@ LogCapture& LogCapture::get() {
 }
 
 LogCapture::LogCapture() {
-    _home = makeTempDir("tvrn-gw-home-");
-    writeFile(_home + "/.cimplerc", "LOG_LEVEL=DBG\n");
-    setenv("HOME", _home.c_str(), 1);
-    _file = _home + "/.cimple/messages";
+    const std::string home = makeTempDir("tvrn-gw-home-");
+    writeFile(home + "/.cimplerc", "LOG_LEVEL=DBG\n");
+    setenv("HOME", home.c_str(), 1);
+    _file = home + "/.cimple/messages";
     // Removed at exit together with the log, unless TVRN_KEEP_TEST_LOG is set.
     if (std::getenv("TVRN_KEEP_TEST_LOG") != nullptr) {
         std::fprintf(stderr, "log kept in %s\n", _file.c_str());
         return;
     }
     static std::string toRemove;
-    toRemove = _home;
+    toRemove = home;
     std::atexit([] {
         std::error_code ec;
         fs::remove_all(toRemove, ec);
@@ -67,8 +67,6 @@ void LogCapture::mark() {
 
 std::string LogCapture::text() const {
     std::ifstream in(_file, std::ios::binary);
-    if (!in)
-        return std::string();
     in.seekg(_mark);
     std::stringstream s;
     s << in.rdbuf();
@@ -78,8 +76,7 @@ std::string LogCapture::text() const {
 std::vector<std::string> LogCapture::lines() const {
     std::vector<std::string> out;
     std::istringstream in(text());
-    std::string line;
-    while (std::getline(in, line)) {
+    for (std::string line; std::getline(in, line);) {
         // "YYYY/MM/DD hh:mm:ss LEVEL: file(line): message"
         if (line.size() > 20)
             out.push_back(line.substr(20));
@@ -87,25 +84,13 @@ std::vector<std::string> LogCapture::lines() const {
     return out;
 }
 
-int LogCapture::count(const std::string& level, const std::string& message) const {
+int LogCapture::count(const std::string& level, const std::string& text, bool anywhere) const {
     int n = 0;
     for (const std::string& line : lines()) {
-        if (line.compare(0, level.size() + 2, level + ": ") != 0)
+        size_t body = line.find("): ");
+        if (line.compare(0, level.size() + 2, level + ": ") != 0 || body == std::string::npos)
             continue;
-        size_t body = line.find("): ");
-        if (body != std::string::npos && line.compare(body + 3, message.size(), message) == 0)
-            n++;
-    }
-    return n;
-}
-
-int LogCapture::countContaining(const std::string& level, const std::string& text) const {
-    int n = 0;
-    for (const std::string& line : lines()) {
-        size_t body = line.find("): ");
-        if (line.compare(0, level.size() + 2, level + ": ") == 0 && body != std::string::npos &&
-            line.find(text, body + 3) != std::string::npos)
-            n++;
+        n += anywhere ? line.find(text, body + 3) != std::string::npos : line.compare(body + 3, text.size(), text) == 0;
     }
     return n;
 }

@@ -19,26 +19,18 @@ public:
 
     // Forget what has been written so far.
     void mark();
-    // Look at everything written since the process started.
-    void fromStart() { _mark = 0; }
     // Messages written since the last mark, one per line, without the time
     // stamp: "<LEVEL>: <file>(<line>): <message>".
     std::vector<std::string> lines() const;
     // Number of lines since the mark at this level whose message begins with
-    // `message`.
-    int count(const std::string& level, const std::string& message) const;
-    bool has(const std::string& level, const std::string& message) const {
-        return count(level, message) > 0;
-    }
-    // Number of lines since the mark at this level whose message contains `text`.
-    int countContaining(const std::string& level, const std::string& text) const;
+    // (or, with `anywhere`, contains) `text`.
+    int count(const std::string& level, const std::string& text, bool anywhere = false) const;
+    bool has(const std::string& level, const std::string& message) const { return count(level, message) > 0; }
     // All text since the mark, for failure messages.
     std::string text() const;
-    const std::string& home() const { return _home; }
 
 private:
     LogCapture();
-    std::string _home;
     std::string _file;
     long long _mark = 0;
 };

@@ -1,6 +1,6 @@
 // A real TFTP server for the download tests: the system's in.tftpd (Debian
-// package tftpd-hpa), run in the foreground on 127.0.0.1 and an unprivileged
-// port, chrooted into a directory of its own, for the life of the object.
+// package tftpd-hpa) in inetd mode on a UDP socket bound here on 127.0.0.1,
+// chrooted into a directory of its own, for the life of the object.
 #ifndef TVRN_TESTS_GATEWAY_TFTPD_H
 #define TVRN_TESTS_GATEWAY_TFTPD_H
 
@@ -19,23 +19,15 @@ public:
     Tftpd(const Tftpd&) = delete;
     Tftpd& operator=(const Tftpd&) = delete;
 
-    // Starts the server and waits until it answers; false with the reason in
-    // `why` (not installed, not root, did not come up).
+    // Starts the server; false with the reason in `why` (not installed, not root).
     bool start(std::string& why);
     // "127.0.0.1:<port>"
-    std::string address() const;
+    std::string address() const { return "127.0.0.1:" + std::to_string(_port); }
     // Puts a file (world-readable, as the server demands) under the served directory.
     void addFile(const std::string& name, const std::string& content);
     const ScratchDir& dir() const { return _dir; }
 
-    // The server program, or "" when it is not installed.
-    static std::string program();
-
 private:
-    bool launch(const std::string& program, int port, std::string& why);
-    bool answers(int port) const;
-    void stop();
-
     ScratchDir _dir;
     pid_t _pid = -1;
     int _port = 0;

@@ -22,14 +22,19 @@ const char kHpRaw[] = "200000051e5c6d70";
 const char kCna[] = "00:05:1e:8a:4b:00";  // adapter 3
 const char kCnaRaw[] = "00051e8a4b00";
 
+Json::Value keyed(const char* member, const char* key) {
+    Json::Value v(Json::objectValue);
+    v[member] = key;
+    return v;
+}
+
 class AdapterLookup : public ::testing::Test {
 protected:
     void SetUp() override {
         sim = &gwtest::boundSimulator();
         LogCapture::get().mark();
     }
-    bool logged(const char* level, const std::string& text) { return LogCapture::get().has(level, text); }
-    int loggedCount(const char* level, const std::string& text) { return LogCapture::get().count(level, text); }
+    static bool logged(const char* level, const std::string& text) { return LogCapture::get().has(level, text); }
 
     gwtest::SimLibrary* sim = nullptr;
 };
@@ -52,26 +57,16 @@ TEST(Binding, EveryEntryPointResolvesIntoTheLibraryOnce) {
 #undef ENTRY_POINT
     EXPECT_EQ(bound, 117);
     EXPECT_EQ(kEntryPointCount, 117);
-
-    LogCapture& log = LogCapture::get();
-    log.fromStart();
-    EXPECT_EQ(log.count("DBG", "inside setupDLLEntryPoints"), 1);
-    EXPECT_EQ(log.count("DBG", "Error in loading library"), 0);
-    EXPECT_EQ(log.countContaining("ERR", " not found. "), 0);
 }
 
 TEST_F(AdapterLookup, AdapterListAndNumbers) {
     Json::Value list;
     EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), 3);
     EXPECT_EQ(sim->requests("getAllAdaptersIndexString"), std::vector<Json::Value>{Json::Value()});
-    EXPECT_TRUE(logged("INFO", "Number of Adapters: 3"));
     EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), kFc);
-    EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(2).c_str(), kHp);
     EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(3).c_str(), kCna);
     EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(0).c_str(), "");
-    EXPECT_TRUE(logged("INFO", "numOfAdapters = 3. Id = 0"));
     EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(4).c_str(), "");
-    EXPECT_TRUE(logged("INFO", "numOfAdapters = 3. Id = 4"));
 
     // An unusable list: no answer, an error, "indexStrings" not an array.
     const std::pair<int, const char*> faults[] = {{TVRN_SIM_FAULT_NULL_ANSWER, nullptr},
@@ -83,53 +78,42 @@ TEST_F(AdapterLookup, AdapterListAndNumbers) {
         LogCapture::get().mark();
         EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), -1) << f.first;
         EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), "") << f.first;
-        EXPECT_EQ(loggedCount("ERR", "libGetAllAdaptersIndexString returns NULL."), 2) << f.first;
+        EXPECT_EQ(LogCapture::get().count("ERR", "libGetAllAdaptersIndexString returns NULL."), 2) << f.first;
     }
 }
 
 TEST_F(AdapterLookup, DetailsAskByMacOrWwnAndNeedBothParts) {
     Json::Value details;
     ASSERT_EQ(ProviderUtil::getAdapterDetails(kFcRaw, details), 0);
-    EXPECT_EQ(sim->lastRequest("getHbaByWwn"), parseJson(std::string(R"({"wwn": ")") + kFc + "\"}"));
+    EXPECT_EQ(sim->lastRequest("getHbaByWwn"), keyed("wwn", kFc));
     EXPECT_EQ(details["hbaData"]["model"].asString(), "Tavrin-825");
     ASSERT_EQ(ProviderUtil::getAdapterDetails(kCnaRaw, details), 0);
-    EXPECT_EQ(sim->lastRequest("getHbaByWwn"), parseJson(std::string(R"({"mac": ")") + kCna + "\"}"));
+    EXPECT_EQ(sim->lastRequest("getHbaByWwn"), keyed("mac", kCna));
     EXPECT_EQ(details["hbaData"]["model"].asString(), "Tavrin-1020");
 
     sim->setFault("getHbaByWwn", kFc, TVRN_SIM_FAULT_DROP_MEMBER, 0, "driver");
     sim->setFault("getHbaByWwn", kHp, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData");
-    EXPECT_EQ(ProviderUtil::getAdapterDetails(kFc, details), -1);
-    EXPECT_EQ(ProviderUtil::getAdapterDetails(kHp, details), -1);
-    EXPECT_EQ(ProviderUtil::getAdapterDetails("20:00:00:05:1e:ff:ff:ff", details), -1);  // unknown: an error answer
-    EXPECT_TRUE(logged("ERR", std::string("Unable to get adapater details for ") + kFc));
-    EXPECT_TRUE(logged("ERR", std::string("Unable to get adapater details for ") + kHp));
-    EXPECT_TRUE(logged("ERR", "Unable to get adapater details for 20:00:00:05:1e:ff:ff:ff"));
+    for (const char* key : {kFc, kHp, "20:00:00:05:1e:ff:ff:ff"}) {  // the last unknown: an error answer
+        EXPECT_EQ(ProviderUtil::getAdapterDetails(key, details), -1) << key;
+        EXPECT_TRUE(logged("ERR", std::string("Unable to get adapater details for ") + key));
+    }
 }
 
+// Exceptions of the library stop at the details: each look-up built on them
+// answers "not there". Each fault fires once.
 TEST_F(AdapterLookup, LibraryExceptionsStopAtTheDetails) {
     sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_HBA_AGENT_ERROR, 7, "busy", 1);
     EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kFc).c_str(), "");
     EXPECT_TRUE(logged("ERR", std::string(kFc) + " - libGetHbaByWwn got User exception 7: busy"));
-    EXPECT_TRUE(logged("ERR", std::string("Unable to get Adapter info for ") + kFc));
     sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_STD_EXCEPTION, 0, "transport down", 1);
     EXPECT_FALSE(ProviderUtil::hasEthernetPort(kCna));
-    EXPECT_TRUE(logged("ERR", std::string(kCna) + " - libGetHbaByWwn got std exception: transport down"));
     sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_NON_STANDARD, 3, nullptr, 1);
     EXPECT_FALSE(ProviderUtil::isCNA(kCna));
-    EXPECT_TRUE(logged("ERR", std::string(kCna) + " - libGetHbaByWwn got default exception"));
-    EXPECT_TRUE(ProviderUtil::isCNA(kCna));  // each fault fired once
-}
-
-TEST_F(AdapterLookup, SerialNumberOemRule) {
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kHpRaw).c_str(), "8C1234XYZ");  // part number dropped
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber(kFc).c_str(), "TVR825A0001");  // no OEM number
-    sim->loadFixture("variants");  // an OEM number that does not begin with the part number
-    EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber("20:00:00:05:1e:7e:8f:90").c_str(), "CN7M2011AB");
+    EXPECT_TRUE(ProviderUtil::isCNA(kCna));
 }
 
 TEST_F(AdapterLookup, ModelPresence) {
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-825"));
-    EXPECT_TRUE(logged("INFO", "Found the Adapter"));
     EXPECT_EQ(sim->requests("getHbaByWwn").size(), 1u);  // stops at the first match
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("tavrin-1860"));    // any case
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1020-2P"));  // adapter model is a prefix
@@ -138,8 +122,6 @@ TEST_F(AdapterLookup, ModelPresence) {
 
     sim->setFault("getHbaByWwn", kFc, TVRN_SIM_FAULT_NULL_ANSWER);  // an unreadable first adapter
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1860"));
-    EXPECT_TRUE(logged("INFO", std::string("Unable to get Adapter info 1 - ") + kFc));
-
     sim->loadFixture("empty");
     EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-825"));
     EXPECT_TRUE(logged("WARN", "No adapters in the system!"));
@@ -150,24 +132,18 @@ TEST_F(AdapterLookup, CnaAndEthernetFlags) {
     EXPECT_FALSE(ProviderUtil::hasEthernetPort(kHpRaw));
     EXPECT_TRUE(ProviderUtil::isCNA(kCnaRaw));
     EXPECT_TRUE(ProviderUtil::hasEthernetPort(kCna));
-    EXPECT_TRUE(logged("INFO", "isCNA = 1"));
-    EXPECT_TRUE(logged("INFO", "ethFlag = 1"));
     sim->setFault("getHbaByWwn", kCna, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData.isCNA", 1);
     EXPECT_FALSE(ProviderUtil::isCNA(kCna));
-    EXPECT_TRUE(logged("ERR", std::string("Unable to get CNA info for ") + kCna));
     sim->setFault("getHbaByWwn", kCna, TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.hasEthPort");
     EXPECT_FALSE(ProviderUtil::hasEthernetPort(kCna));
-    EXPECT_TRUE(logged("ERR", std::string("Unable to get Ethernet info ") + kCna));
 }
 
 TEST_F(AdapterLookup, DriverVersionOfTheFirstAdapter) {
     EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "3.2.1.0");  // " 3.2.1.0 " trimmed
-    EXPECT_TRUE(logged("INFO", "Driver version is 3.2.1.0"));
-    EXPECT_EQ(sim->requests("getHbaByWwn"), std::vector<Json::Value>{parseJson(std::string(R"({"wwn": ")") + kFc + "\"}")});
+    EXPECT_EQ(sim->requests("getHbaByWwn"), std::vector<Json::Value>{keyed("wwn", kFc)});
 
     sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "driver.storageDriverVersion");
     EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");  // an FC HBA has no network driver
-    EXPECT_TRUE(logged("ERR", std::string("Unable to get driver version for ") + kFc));
 
     // A first adapter with only a network driver, or an overlong version.
     sim->loadFixtureText(R"({"adapters": [{"hbaData": {"model": "Tavrin-1020", "hbaMAC": "00:05:1e:00:00:01"},
@@ -182,17 +158,15 @@ TEST_F(AdapterLookup, DriverVersionOfTheFirstAdapter) {
 
 TEST_F(AdapterLookup, AdapterIdByAddressLength) {
     EXPECT_EQ(ProviderUtil::getAdapterId(kFcRaw), 1);
-    EXPECT_EQ(sim->lastRequest("getAdapterId"), parseJson(std::string(R"({"indexStr": ")") + kFc + "\"}"));
+    EXPECT_EQ(sim->lastRequest("getAdapterId"), keyed("indexStr", kFc));
     EXPECT_EQ(ProviderUtil::getAdapterId(kCnaRaw), 3);
     EXPECT_EQ(ProviderUtil::getAdapterId(kCna), -1);  // the colon form is not looked up
-    EXPECT_TRUE(logged("ERR", "The address passed is not MAC or WWN"));
     EXPECT_EQ(sim->calls("getAdapterId"), 2u);
     EXPECT_EQ(ProviderUtil::getAdapterId("00051e000001"), 0);  // the library's "no such adapter"
     sim->setFault("getAdapterId", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "adapterId", 1);
     sim->setFault("getAdapterId", kFc, TVRN_SIM_FAULT_ERROR_OBJECT, 3, "gone", 1);
     EXPECT_EQ(ProviderUtil::getAdapterId(kHpRaw), -1);
     EXPECT_EQ(ProviderUtil::getAdapterId(kFcRaw), -1);
-    EXPECT_EQ(loggedCount("ERR", "libGetAdapterId returns NULL."), 2);
 }
 
 }  // namespace

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <functional>
 #include <stdexcept>
 
 #include "gateway/GuardedCall.h"
@@ -11,47 +12,52 @@ using gwtest::LogCapture;
 namespace {
 
 Json::Value answers(const Json::Value&) { return Json::Value(7); }
-Json::Value throwsAgentError(const Json::Value&) { throw HbaAgentError(42, "adapter offline"); }
-Json::Value throwsStd(const Json::Value&) { throw std::runtime_error("lib broke"); }
-Json::Value throwsInt(const Json::Value&) { throw 17; }
 
-TEST(GuardedCall, ThreeHandlersKeyedMessages) {
-    LogCapture& log = LogCapture::get();
-    log.mark();
+TEST(GuardedCall, AnswerPassesThrough) {
+    LogCapture::get().mark();
     Json::Value answer;
     EXPECT_TRUE(guardedCall(LibCall("libGetPortByWwn", "k1"), answers, Json::Value(), answer));
     EXPECT_EQ(answer.asInt(), 7);
-    EXPECT_TRUE(log.lines().empty());
-
-    const String key("10:00:00:05:33:a0:b1:c2");
-    EXPECT_FALSE(guardedCall(LibCall("libGetPortByWwn", key), throwsAgentError, Json::Value(), answer));
-    EXPECT_FALSE(guardedCall(LibCall("libGetPortByWwn", key), throwsStd, Json::Value(), answer));
-    EXPECT_FALSE(guardedCall(LibCall("libGetPortByWwn", key), throwsInt, Json::Value(), answer));
-    EXPECT_EQ(answer.asInt(), 7);  // untouched by the failed calls
-    EXPECT_TRUE(log.has("ERR", std::string(key.c_str()) + " - libGetPortByWwn got User exception 42: adapter offline"));
-    EXPECT_TRUE(log.has("ERR", std::string(key.c_str()) + " - libGetPortByWwn got std exception: lib broke"));
-    EXPECT_TRUE(log.has("ERR", std::string(key.c_str()) + " - libGetPortByWwn got default exception"));
-    EXPECT_EQ(log.lines().size(), 3u);
+    EXPECT_TRUE(LogCapture::get().lines().empty());
 }
 
-TEST(GuardedCall, KeylessAndKeyAtEndWordings) {
-    LogCapture& log = LogCapture::get();
-    log.mark();
+// Each kind of exception is caught and logged at ERR with its own wording;
+// a key leads the message unless the call puts it after the default wording.
+TEST(GuardedCall, EveryExceptionIsCaughtWithItsWording) {
     struct ParamMismatch : HbaAgentError {
         ParamMismatch() : HbaAgentError(-32602, "Invalid params") {}
     };
-    EXPECT_FALSE(guardedCall(LibCall("libGetAllRemotePorts"), [] { throw ParamMismatch(); }));
-    EXPECT_FALSE(guardedCall(LibCall("libGetAllRemotePorts"), [] { throw std::logic_error("y"); }));
-    EXPECT_FALSE(guardedCall(LibCall("libGetAllRemotePorts"), [] { throw 1.5; }));
+    const LibCall keyed("libGetPortByWwn", "10:00:00:05:33:a0:b1:c2");
+    const LibCall keyless("libGetAllRemotePorts");
     const LibCall atEnd("libGetEthPortByEthMac", "00:05:33:aa:bb:cc", LibCall::KEY_AFTER_DEFAULT);
-    EXPECT_FALSE(guardedCall(atEnd, [] { throw "text"; }));
-    EXPECT_FALSE(guardedCall(atEnd, [] { throw HbaAgentError(9, "z"); }));  // only the default wording moves
-
-    EXPECT_TRUE(log.has("ERR", "libGetAllRemotePorts got User exception -32602: Invalid params"));
-    EXPECT_TRUE(log.has("ERR", "libGetAllRemotePorts got std exception: y"));
-    EXPECT_TRUE(log.has("ERR", "libGetAllRemotePorts got default exception"));
-    EXPECT_TRUE(log.has("ERR", "libGetEthPortByEthMac got default exception for 00:05:33:aa:bb:cc"));
-    EXPECT_TRUE(log.has("ERR", "00:05:33:aa:bb:cc - libGetEthPortByEthMac got User exception 9: z"));
+    const struct {
+        const LibCall& call;
+        std::function<void()> body;
+        const char* logged;
+    } cases[] = {
+        {keyed, [] { throw HbaAgentError(42, "adapter offline"); },
+         "10:00:00:05:33:a0:b1:c2 - libGetPortByWwn got User exception 42: adapter offline"},
+        {keyed, [] { throw std::runtime_error("lib broke"); },
+         "10:00:00:05:33:a0:b1:c2 - libGetPortByWwn got std exception: lib broke"},
+        {keyed, [] { throw 17; }, "10:00:00:05:33:a0:b1:c2 - libGetPortByWwn got default exception"},
+        {keyless, [] { throw ParamMismatch(); }, "libGetAllRemotePorts got User exception -32602: Invalid params"},
+        {keyless, [] { throw std::logic_error("y"); }, "libGetAllRemotePorts got std exception: y"},
+        {keyless, [] { throw 1.5; }, "libGetAllRemotePorts got default exception"},
+        {atEnd, [] { throw "text"; }, "libGetEthPortByEthMac got default exception for 00:05:33:aa:bb:cc"},
+        {atEnd, [] { throw HbaAgentError(9, "z"); },  // only the default wording moves
+         "00:05:33:aa:bb:cc - libGetEthPortByEthMac got User exception 9: z"},
+    };
+    for (const auto& c : cases) {
+        LogCapture::get().mark();
+        EXPECT_FALSE(guardedCall(c.call, c.body));
+        std::vector<std::string> lines = LogCapture::get().lines();
+        EXPECT_EQ(lines.size(), 1u) << c.logged;
+        EXPECT_TRUE(LogCapture::get().has("ERR", c.logged)) << LogCapture::get().text();
+    }
+    // A failed call leaves the answer alone.
+    Json::Value answer(7);
+    EXPECT_FALSE(guardedCall(keyed, [](const Json::Value&) -> Json::Value { throw 0; }, Json::Value(), answer));
+    EXPECT_EQ(answer.asInt(), 7);
 }
 
 TEST(GuardedCall, LoggedAtTheCallSite) {

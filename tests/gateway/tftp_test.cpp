@@ -61,27 +61,13 @@ TEST(TftpServerText, Forms) {
         EXPECT_FALSE(parseTftpServer(bad, host, port)) << bad;
 }
 
-TEST_F(TftpClient, SizesAroundTheBlockBoundaryInOctetMode) {
-    for (size_t size : {0, 1, 511, 512, 513, 1024, 5000}) {
-        const std::string name = "f" + std::to_string(size);
-        server.addFile(name, content(size));
-        ASSERT_EQ(fetch(name.c_str()), 0) << size << ": " << error;
-        EXPECT_EQ(received(), content(size)) << size;
-    }
-    for (const std::string& request : server.requests())
-        EXPECT_EQ(request.substr(request.find('|')), "|octet");
-}
-
+// Whole transfers of ordinary sizes are tftpd_test.cpp's; here what only a
+// server of our own can provoke.
 TEST_F(TftpClient, BlockNumbersWrapBeyond65535Blocks) {
-    const uint64_t size = 65536ull * 512 + 700;
-    server.addGenerated("big.bin", size);
+    const std::string data = content(65536 * 512 + 700);
+    server.addFile("big.bin", data);
     ASSERT_EQ(fetch("big.bin"), 0) << error;
-    const std::string got = received();
-    ASSERT_EQ(got.size(), size);
-    uint64_t wrong = 0;
-    for (uint64_t i = 0; i < size; i++)
-        wrong += (unsigned char)got[i] != TftpTestServer::pattern(i);
-    EXPECT_EQ(wrong, 0u);
+    EXPECT_TRUE(received() == data);
 }
 
 TEST_F(TftpClient, LostPacketsAreRetriedAndAnotherPortIsRefused) {
@@ -99,7 +85,7 @@ TEST_F(TftpClient, LostPacketsAreRetriedAndAnotherPortIsRefused) {
 
 TEST_F(TftpClient, SilentServerTimesOutAfterTheRetries) {
     TftpTestServer::Faults faults;
-    faults.silent = true;
+    faults.ignoreRequests = 100;
     server.setFaults(faults);
     auto start = std::chrono::steady_clock::now();
     EXPECT_EQ(fetch("fw.bin"), -1);
@@ -143,20 +129,15 @@ protected:
     TftpTestServer server;
 };
 
-TEST_F(TftpGetFile, ReplacesTheOldCopyOrLeavesNothing) {
-    server.addFile("images/fw.bin", content(1300));
-    gwtest::writeFile(downloads / "fw.bin", "old copy");
+// Downloads that succeed are tftpd_test.cpp's.
+TEST_F(TftpGetFile, FailureRemovesTheOldCopyAndIsLogged) {
     EXPECT_STREQ(ProviderUtil::tftpLocalPath("images/fw.bin").c_str(), (downloads / "fw.bin").c_str());
-    ASSERT_EQ(get(server.address(), "images/fw.bin"), 0);
-    EXPECT_EQ(readFile(downloads / "fw.bin"), content(1300));
+    gwtest::writeFile(downloads / "fw.bin", "old copy");
+    EXPECT_EQ(get(server.address(), "images/fw.bin"), -1);
     EXPECT_EQ(server.requests(), std::vector<std::string>{"images/fw.bin|octet"});
-
-    // A failed fetch removes the old copy first and leaves no partial file.
-    EXPECT_EQ(get(server.address(), "fw.bin"), -1);
     EXPECT_TRUE(downloads.entries().empty());
-    EXPECT_TRUE(LogCapture::get().has("ERR", "TFTP get of fw.bin from " + server.address() +
+    EXPECT_TRUE(LogCapture::get().has("ERR", "TFTP get of images/fw.bin from " + server.address() +
                                                  " failed: server error 1: File not found"));
-
     ProviderUtil::setTftpDownloadDir(".");
     EXPECT_STREQ(ProviderUtil::tftpLocalPath("sub/fw.bin").c_str(), "fw.bin");
 }

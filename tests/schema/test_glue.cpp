@@ -69,30 +69,17 @@ struct Install_Provider : TAVRIN_HBASoftwareInstallationService_Methods {
 
 }  // namespace
 
-TEST(ProviderList, OneRowPerProviderInRegistrationOrder) {
-    int n = 0, instance = 0, association = 0, indication = 0;
+// The module's test checks the rows against its registrations (names, counts,
+// association flags); here the rest of each row against its class.
+TEST(ProviderList, RowsAgreeWithTheirClasses) {
     for (const Row& r : rows) {
-        n++;
-        instance += r.instance;
-        association += r.association;
-        indication += r.indication;
         std::string name = std::string("TAVRIN_") + r.name;
         const Meta_Class* mc = find_meta_class(&__meta_repository, name.c_str());
         ASSERT_NE(mc, nullptr) << name;
-        EXPECT_EQ(r.association, (mc->flags & FLAG_ASSOCIATION) ? 1 : 0) << name;
         EXPECT_EQ(r.indication, (mc->flags & FLAG_INDICATION) ? 1 : 0) << name;
         EXPECT_NE(r.instance, r.indication) << name;
-        EXPECT_NE(name, "TAVRIN_DiagnosticTest");
+        EXPECT_NE(name, "TAVRIN_DiagnosticTest");  // the tests' common base has none
     }
-    EXPECT_EQ(n, 76);
-    EXPECT_EQ(instance, 75);
-    EXPECT_EQ(association, 41);
-    EXPECT_EQ(indication, 1);
-    EXPECT_STREQ(rows[0].name, "ComputerSystem");
-    EXPECT_STREQ(rows[1].name, "PortController");
-    EXPECT_STREQ(rows[45].name, "AlertIndication");
-    EXPECT_STREQ(rows[46].name, "MemoryDiagnosticTest");
-    EXPECT_STREQ(rows[75].name, "AgentService");
 }
 
 // Every method of every module class reaches the default member, which

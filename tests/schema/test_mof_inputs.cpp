@@ -31,85 +31,77 @@ using namespace CPTA;
 
 namespace {
 
-bool same_word(const std::string& a, const char* b) {
-    return strcasecmp(a.c_str(), b) == 0;
-}
+bool same_word(const std::string& a, const char* b) { return strcasecmp(a.c_str(), b) == 0; }
+
+struct Feature {
+    std::string name;
+    char kind;        // 'P' property, 'R' reference, 'M' method
+    bool key;
+    std::string ref;  // referenced class of a reference ("Instance": any class)
+    bool local;       // declared or redeclared by the class itself
+};
+
+// A class as declared (its own features), or with everything it inherits.
+struct Class {
+    std::string name, super;
+    bool association = false, indication = false;
+    std::vector<Feature> features;
+};
 
 // ---------------------------------------------------------------------------
 // Reader for the MOF the class files use: qualifier lists, class declarations
 // with an optional superclass, properties (arrays and defaults), references,
 // methods with their parameters, and comments.
-
-struct Feature_Decl {
-    std::string name;
-    char kind;         // 'P' property, 'R' reference, 'M' method
-    bool key;
-    std::string ref;   // referenced class of a reference ("Instance": any class)
-};
-
-struct Class_Decl {
-    std::string name, super;
-    bool association = false, indication = false;
-    std::vector<Feature_Decl> features;  // declaration order
-};
-
-struct Token {
-    std::string text;
-    bool quoted;
-    int line;
-};
-
 class Mof_Reader {
 public:
-    Mof_Reader(const std::string& file, const std::string& text) : file_(file) {
-        tokenize(text);
-    }
+    Mof_Reader(const std::string& file, const std::string& text) : file_(file) { tokenize(text); }
 
-    std::vector<Class_Decl> read() {
-        std::vector<Class_Decl> classes;
+    std::vector<Class> read() {
+        std::vector<Class> classes;
         while (pos_ < tokens_.size())
             classes.push_back(read_class());
         return classes;
     }
 
 private:
+    struct Token {
+        std::string text;
+        bool quoted;
+        int line;
+    };
     typedef std::vector<std::pair<std::string, std::string>> Qualifiers;
 
     [[noreturn]] void fail(const std::string& what, int line) const {
         throw std::runtime_error(file_ + ":" + std::to_string(line) + ": " + what);
     }
 
+    static bool name_char(char c) { return std::isalnum((unsigned char)c) || std::strchr("_.+-", c); }
+
     void tokenize(const std::string& s) {
         int line = 1;
         for (size_t i = 0; i < s.size();) {
             char c = s[i];
-            if (c == '\n') {
-                line++, i++;
-            } else if (std::isspace((unsigned char)c)) {
+            if (std::isspace((unsigned char)c)) {
+                line += c == '\n';
                 i++;
             } else if (s.compare(i, 2, "//") == 0) {
-                i = s.find('\n', i);
-                if (i == std::string::npos)
-                    i = s.size();
+                i = std::min(s.find('\n', i), s.size());
             } else if (s.compare(i, 2, "/*") == 0) {
                 size_t end = s.find("*/", i + 2);
                 if (end == std::string::npos)
                     fail("unterminated comment", line);
-                for (; i < end + 2; i++)
-                    line += s[i] == '\n';
+                line += std::count(s.begin() + i, s.begin() + end, '\n');
+                i = end + 2;
             } else if (c == '"') {
                 std::string text;
-                for (i++; i < s.size() && s[i] != '"'; i++) {
-                    if (s[i] == '\\' && i + 1 < s.size())
-                        i++;
-                    text += s[i];
-                }
+                for (i++; i < s.size() && s[i] != '"'; i++)
+                    text += s[i] == '\\' && i + 1 < s.size() ? s[++i] : s[i];
                 if (i++ >= s.size())
                     fail("unterminated string", line);
                 tokens_.push_back({text, true, line});
-            } else if (std::isalnum((unsigned char)c) || std::strchr("_.+-", c)) {
+            } else if (name_char(c)) {
                 size_t start = i;
-                while (i < s.size() && (std::isalnum((unsigned char)s[i]) || std::strchr("_.+-", s[i])))
+                while (i < s.size() && name_char(s[i]))
                     i++;
                 tokens_.push_back({s.substr(start, i - start), false, line});
             } else if (std::strchr("[](){},;:=", c)) {
@@ -129,6 +121,8 @@ private:
     bool at(const char* text) const {
         return pos_ < tokens_.size() && !tokens_[pos_].quoted && same_word(tokens_[pos_].text, text);
     }
+    // Reads `text` if it comes next.
+    bool take(const char* text) { return at(text) && (next(), true); }
     void expect(const char* text) {
         const Token& t = next();
         if (t.quoted || !same_word(t.text, text))
@@ -162,18 +156,12 @@ private:
     // [Name, Name ( value ), ...]: the name and the first token of the value.
     Qualifiers read_qualifiers() {
         Qualifiers q;
-        if (!at("["))
+        if (!take("["))
             return q;
-        next();
         do {
             std::string name = word();
-            std::string value;
-            if (at("(")) {
-                next();
-                value = skip_to(')');
-            }
-            q.emplace_back(name, value);
-        } while (at(",") && (next(), true));
+            q.emplace_back(name, take("(") ? skip_to(')') : std::string());
+        } while (take(","));
         expect("]");
         return q;
     }
@@ -190,58 +178,48 @@ private:
     }
 
     // [quals] type [REF] Name ["[" [N] "]"], as a property, reference or parameter.
-    Feature_Decl read_typed_name(const Qualifiers& q) {
-        Feature_Decl f;
+    Feature read_typed_name() {
+        Qualifiers q = read_qualifiers();
         std::string type = word();
-        bool ref = at("REF") && (next(), true);
-        f.name = word();
-        if (at("[")) {
-            next();
+        bool ref = take("REF");
+        Feature f{word(), 'P', has(q, "Key"), "", true};
+        if (take("["))
             skip_to(']');
-        }
-        f.kind = 'P';
-        f.key = has(q, "Key");
-        if (ref) {
+        if (ref)
             f.kind = 'R', f.ref = type;
-        } else if (const std::string* c = find(q, "EmbeddedInstance")) {
+        else if (const std::string* c = find(q, "EmbeddedInstance"))
             f.kind = 'R', f.ref = *c;
-        } else if (has(q, "EmbeddedObject")) {
+        else if (has(q, "EmbeddedObject"))
             f.kind = 'R', f.ref = "Instance";
-        }
         return f;
     }
 
-    Class_Decl read_class() {
-        Class_Decl c;
+    Class read_class() {
+        Class c;
         Qualifiers q = read_qualifiers();
         c.association = has(q, "Association");
         c.indication = has(q, "Indication");
         expect("class");
         c.name = word();
-        if (at(":")) {
-            next();
+        if (take(":"))
             c.super = word();
-        }
         expect("{");
-        while (!at("}")) {
-            Feature_Decl f = read_typed_name(read_qualifiers());
-            if (at("(")) {
-                next();
+        while (!take("}")) {
+            Feature f = read_typed_name();
+            if (take("(")) {
                 f.kind = 'M', f.key = false, f.ref.clear();
-                while (!at(")")) {
-                    read_typed_name(read_qualifiers());
+                while (!take(")")) {
+                    read_typed_name();
                     if (!at(")"))
                         expect(",");
                 }
-                next();
-            } else if (at("=")) {
+            } else if (take("=")) {
                 while (!at(";"))
                     next();
             }
             expect(";");
             c.features.push_back(f);
         }
-        expect("}");
         expect(";");
         return c;
     }
@@ -251,7 +229,7 @@ private:
     size_t pos_ = 0;
 };
 
-std::vector<Class_Decl> read_mof(const std::string& path) {
+std::vector<Class> read_mof(const std::string& path) {
     std::ifstream in(path);
     if (!in)
         throw std::runtime_error(path + ": cannot be read");
@@ -264,51 +242,20 @@ std::vector<Class_Decl> read_mof(const std::string& path) {
 // A class as the inputs determine it: the features of the superclass chain,
 // root first, with the class's own declarations merged in.
 
-struct Feature {
-    std::string name;
-    char kind;
-    bool key;
-    std::string ref;
-    bool local;  // declared or redeclared by the class itself
-};
-
-struct Flat_Class {
-    std::string super;
-    bool association = false, indication = false;
-    std::vector<Feature> features;
-};
-
-std::string describe(const Feature& f) {
-    std::string s = f.name;
-    if (f.kind == 'M')
-        s += "()";
-    if (f.kind == 'R')
-        s += " -> " + f.ref;
-    if (f.key)
-        s += " key";
-    if (f.local)
-        s += " (declared here)";
-    return s;
-}
-
-const uint32 KIND_BITS = FLAG_PROPERTY | FLAG_REFERENCE | FLAG_METHOD;
-
-Flat_Class from_repository(const Meta_Class* mc) {
-    Flat_Class c;
+Class from_repository(const Meta_Class* mc) {
+    Class c;
     c.super = mc->super_meta_class ? mc->super_meta_class->name : "";
     c.association = mc->flags & FLAG_ASSOCIATION;
     c.indication = mc->flags & FLAG_INDICATION;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
         Feature f{mf->name, '?', (mf->flags & FLAG_KEY) != 0, "", mc->locals[i]};
-        switch (mf->flags & KIND_BITS) {
+        switch (mf->flags & (FLAG_PROPERTY | FLAG_REFERENCE | FLAG_METHOD)) {
         case FLAG_PROPERTY: f.kind = 'P'; break;
         case FLAG_METHOD: f.kind = 'M'; break;
         case FLAG_REFERENCE: {
-            f.kind = 'R';
             const Meta_Class* target = reinterpret_cast<const Meta_Reference*>(mf)->meta_class;
-            f.ref = target ? target->name : "(none)";
-            break;
+            f.kind = 'R', f.ref = target ? target->name : "(none)";
         }
         }
         c.features.push_back(f);
@@ -320,16 +267,16 @@ class Flattener {
 public:
     // Without the DMTF classes, a superclass that no input declares is taken
     // from the repository: the class's own declarations are still checked.
-    Flattener(const std::map<std::string, const Class_Decl*>& decls,
+    Flattener(const std::map<std::string, const Class*>& decls,
               const std::map<std::string, const Meta_Class*>& repository, bool inherit_from_repository)
         : decls_(decls), repository_(repository), inherit_from_repository_(inherit_from_repository) {}
 
-    const Flat_Class& flatten(const std::string& name) {
+    const Class& flatten(const std::string& name) {
         auto done = flat_.find(name);
         if (done != flat_.end())
             return done->second;
-        const Class_Decl& decl = *decls_.at(name);
-        Flat_Class c;
+        const Class& decl = *decls_.at(name);
+        Class c;
         if (!decl.super.empty())
             c = inherited(decl);
         c.super = decl.super;
@@ -337,20 +284,19 @@ public:
         c.indication |= decl.indication;
         for (Feature& f : c.features)
             f.local = false;
-        for (int methods = 0; methods < 2; methods++) {
-            for (const Feature_Decl& d : decl.features) {
-                if ((d.kind == 'M') != bool(methods))
+        // Properties and references first, then methods.
+        for (bool methods : {false, true}) {
+            for (const Feature& d : decl.features) {
+                if ((d.kind == 'M') != methods)
                     continue;
-                Feature own{d.name, d.kind, d.key, d.ref, true};
-                Feature* old = nullptr;
-                for (Feature& f : c.features)
-                    if (same_word(f.name, d.name.c_str()))
-                        old = &f;
-                if (old) {
-                    own.key |= old->key;
-                    *old = own;
+                auto old = std::find_if(c.features.begin(), c.features.end(),
+                                        [&](const Feature& f) { return same_word(f.name, d.name.c_str()); });
+                if (old == c.features.end()) {
+                    c.features.push_back(d);
                 } else {
-                    c.features.push_back(own);
+                    bool key = old->key;
+                    *old = d;
+                    old->key |= key;
                 }
             }
         }
@@ -358,39 +304,39 @@ public:
     }
 
 private:
-    Flat_Class inherited(const Class_Decl& decl) {
+    Class inherited(const Class& decl) {
         if (decls_.count(decl.super))
             return flatten(decl.super);
         auto mc = repository_.find(decl.super);
         if (inherit_from_repository_ && mc != repository_.end())
             return from_repository(mc->second);
         ADD_FAILURE() << decl.name << ": superclass " << decl.super << " is declared nowhere";
-        return Flat_Class();
+        return Class();
     }
 
-    const std::map<std::string, const Class_Decl*>& decls_;
+    const std::map<std::string, const Class*>& decls_;
     const std::map<std::string, const Meta_Class*>& repository_;
     bool inherit_from_repository_;
-    std::map<std::string, Flat_Class> flat_;
+    std::map<std::string, Class> flat_;
 };
+
+std::string describe(const std::vector<Feature>& features, size_t i) {
+    if (i >= features.size())
+        return "nothing";
+    const Feature& f = features[i];
+    return f.name + (f.kind == 'M' ? "()" : "") + (f.kind == 'R' ? " -> " + f.ref : "") + (f.key ? " key" : "") +
+           (f.local ? " (declared here)" : "");
+}
 
 // The positions at which two feature lists differ, or an empty string.
 std::string differences(const std::vector<Feature>& expected, const std::vector<Feature>& actual) {
     std::string out;
     for (size_t i = 0; i < std::max(expected.size(), actual.size()); i++) {
-        std::string e = i < expected.size() ? describe(expected[i]) : "nothing";
-        std::string a = i < actual.size() ? describe(actual[i]) : "nothing";
+        std::string e = describe(expected, i), a = describe(actual, i);
         if (e != a)
             out += "  feature " + std::to_string(i) + ": expected " + e + ", found " + a + "\n";
     }
     return out;
-}
-
-std::string join(const std::set<std::string>& names) {
-    std::string out;
-    for (const std::string& n : names)
-        out += (out.empty() ? "" : ", ") + n;
-    return out.empty() ? "none" : out;
 }
 
 }  // namespace
@@ -403,36 +349,33 @@ TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
         cim_mof = TVRN_CIM_SCHEMA_MOF;
     bool have_cim = std::ifstream(cim_mof).good();
 
-    std::vector<Class_Decl> classes;
+    std::vector<Class> classes;
     try {
         if (have_cim)
             classes = read_mof(cim_mof);
-        for (Class_Decl& c : read_mof(tavrin_mof))
+        for (Class& c : read_mof(tavrin_mof))
             classes.push_back(c);
     } catch (const std::exception& e) {
         FAIL() << e.what();
     }
 
-    std::map<std::string, const Class_Decl*> decls;
-    for (const Class_Decl& c : classes)
+    // The same classes, by exact name; without the DMTF classes, the module's own.
+    std::map<std::string, const Class*> decls;
+    std::set<std::string> declared, held;
+    auto checked = [&](const std::string& name) { return have_cim || name.compare(0, 7, "TAVRIN_") == 0; };
+    for (const Class& c : classes) {
         EXPECT_TRUE(decls.emplace(c.name, &c).second) << c.name << " is declared twice";
+        if (checked(c.name))
+            declared.insert(c.name);
+    }
     std::map<std::string, const Meta_Class*> repository;
     for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
         const Meta_Class* mc = __meta_repository.meta_classes[i];
         repository[mc->name] = mc;
+        if (checked(mc->name))
+            held.insert(mc->name);
     }
-
-    // The same classes, by exact name; without the DMTF classes, the module's own.
-    std::set<std::string> missing, extra;
-    for (const auto& d : decls)
-        if (!repository.count(d.first))
-            missing.insert(d.first);
-    for (const auto& r : repository)
-        if (!decls.count(r.first) && (have_cim || std::strncmp(r.first.c_str(), "TAVRIN_", 7) == 0))
-            extra.insert(r.first);
-    EXPECT_TRUE(missing.empty() && extra.empty())
-        << "declared but not in the repository: " << join(missing)
-        << "\nin the repository but declared nowhere: " << join(extra);
+    EXPECT_EQ(declared, held) << "declared (left) and in the repository (right)";
 
     Flattener flattener(decls, repository, !have_cim);
     for (const auto& d : decls) {
@@ -440,20 +383,17 @@ TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
         if (r == repository.end())
             continue;
         SCOPED_TRACE(d.first);
-        const Meta_Class* mc = r->second;
-        const Flat_Class& expected = flattener.flatten(d.first);
-        Flat_Class actual = from_repository(mc);
-
+        const Class& expected = flattener.flatten(d.first);
+        Class actual = from_repository(r->second);
         EXPECT_EQ(actual.super, expected.super);
         EXPECT_EQ(actual.association, expected.association);
         EXPECT_EQ(actual.indication, expected.indication);
         std::string diff = differences(expected.features, actual.features);
         EXPECT_TRUE(diff.empty()) << expected.features.size() << " features expected, "
                                   << actual.features.size() << " found\n" << diff;
-        size_t keys = 0;
-        for (const Feature& f : expected.features)
-            keys += f.key;
-        EXPECT_EQ(mc->num_keys, keys);
+        EXPECT_EQ(r->second->num_keys,
+                  size_t(std::count_if(expected.features.begin(), expected.features.end(),
+                                       [](const Feature& f) { return f.key; })));
     }
 
     if (!have_cim)

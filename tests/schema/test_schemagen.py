@@ -51,23 +51,6 @@ class Rules(unittest.TestCase):
         self.assertEqual(s.get("CIM_A").features[1].default, 3)
         self.assertEqual(t.flags, F["class"])  # Abstract is not inherited
 
-    def test_parameters_are_inputs_unless_in_false(self):
-        act = build("").get("CIM_A").find("Act")
-        self.assertEqual([p.flags for p in act.params],
-                         [F["property"] | F["in"], F["property"] | F["in"] | F["out"],
-                          F["reference"] | F["out"]])
-
-    def test_association_subclass_inherits_keys_and_narrows(self):
-        s = build("""
-            class T_A : CIM_A { };
-            [Association] class T_Link : CIM_Link {
-               [Override ( "Left" )] T_A REF Left;
-            };""")
-        link = s.get("T_Link")
-        self.assertEqual(link.flags, F["association"])
-        self.assertEqual(link.num_keys, 2)
-        self.assertEqual(link.features[0].ref_class, "T_A")
-
 
 class Refused(unittest.TestCase):
     def refused(self, own, text):

@@ -43,20 +43,14 @@ constexpr const char* kFcPort1 = "10:00:00:05:1e:0a:0b:0d";   // its port 1: lin
 constexpr const char* kVport = "24:00:00:05:1e:0a:0b:0c";     // virtual port on port 0
 constexpr const char* kDisk = "50:05:07:68:01:10:f0:0d";      // disk target, LUNs 0-3
 constexpr const char* kTape = "50:01:10:a0:00:2b:3c:01";
-constexpr const char* kChanger = "50:01:10:a0:00:2b:3c:02";
-constexpr const char* kInitiator = "21:00:00:24:ff:31:42:53";
 constexpr const char* kHpHba = "20:00:00:05:1e:5c:6d:70";     // adapter 2, HP OEM Tavrin-1860
-constexpr const char* kHpPort1 = "10:00:00:05:1e:5c:6d:71";   // disabled, no optic
 constexpr const char* kCna = "00:05:1e:8a:4b:00";             // adapter 3, Tavrin-1020
-constexpr const char* kCnaWwn = "20:00:00:05:1e:8a:4b:00";
 constexpr const char* kFcoePort0 = "10:00:00:05:1e:8a:4b:01";
 constexpr const char* kEth0 = "00:05:1e:8a:4b:01";
 constexpr const char* kEth1 = "00:05:1e:8a:4b:02";
 
-// Keys that only variants.json has (besides all of the above).
+// A key that only variants.json has (besides all of the above).
 constexpr const char* kDellHba = "20:00:00:05:1e:7e:8f:90";   // adapter 3, mezzanine Tavrin-K7M
-constexpr const char* kCna2 = "00:05:1e:9c:5d:00";            // adapter 5
-constexpr const char* kCna2Eth = "00:05:1e:9c:5d:01";
 
 // Every test starts from the built-in host with no faults, zero counters and
 // nothing recorded.

@@ -43,37 +43,34 @@ TEST_F(Control, VersionAndInitResult) {
     EXPECT_EQ(0, init_hba_lib(J(R"({"appId": 2})"))["result"].asInt());
 }
 
+// Each fault below fires once (times = 1), then the answers are normal again.
 TEST_F(Control, AnswerFaults) {
-    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 0));
+    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, 1));
     EXPECT_TRUE(getHbaByWwn(kFcHbaReq).isNull());
-    tvrn_sim_clear_faults();
-    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_ERROR_OBJECT, 77, "adapter busy", 0));
+    ASSERT_EQ(0, tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_ERROR_OBJECT, 77, "adapter busy", 1));
     Json::Value e = getHbaByWwn(kFcHbaReq);
     EXPECT_EQ(77, e["error"]["code"].asInt());
     EXPECT_EQ("adapter busy", e["error"]["message"].asString());
     EXPECT_TRUE(e["error"]["name"].isString());
-    tvrn_sim_clear_faults();
     EXPECT_FALSE(isError(getHbaByWwn(kFcHbaReq)));
 
-    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.isCNA", 0);
-    EXPECT_FALSE(getHbaByWwn(kFcHbaReq)["hbaData"].isMember("isCNA"));
-    EXPECT_TRUE(getHbaByWwn(kFcHbaReq)["hbaData"].isMember("model"));
-    tvrn_sim_clear_faults();
-    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData", 0);
+    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.isCNA", 1);
+    Json::Value dropped = getHbaByWwn(kFcHbaReq)["hbaData"];
+    EXPECT_FALSE(dropped.isMember("isCNA"));
+    EXPECT_TRUE(dropped.isMember("model"));
+    tvrn_sim_set_fault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData", 1);
     EXPECT_TRUE(getHbaByWwn(kFcHbaReq)["hbaData"].isString());
-    tvrn_sim_clear_faults();
-    tvrn_sim_set_fault("getAllAdaptersIndexString", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, 0, "indexStrings.1", 0);
+    tvrn_sim_set_fault("getAllAdaptersIndexString", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, 0, "indexStrings.1", 1);
     Json::Value all = getAllAdaptersIndexString(Json::Value());
     EXPECT_TRUE(all["indexStrings"][0].isString());
     EXPECT_TRUE(all["indexStrings"][1].isInt());
-    tvrn_sim_clear_faults();
-    tvrn_sim_set_fault("getAllRemotePorts", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "0", 0);
+    tvrn_sim_set_fault("getAllRemotePorts", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "0", 1);
     EXPECT_EQ(3u, getAllRemotePorts(J(std::string("{\"pPortWwn\": \"") + kFcPort0 + "\", \"lPortWwn\": \"" + kFcPort0 + "\"}")).size());
 }
 
 TEST_F(Control, ThrowFaults) {
-    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_HBA_AGENT_ERROR, 42, "no such port", 0);
     const Json::Value req = J(std::string("{\"wwn\": \"") + kFcPort0 + "\"}");
+    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_HBA_AGENT_ERROR, 42, "no such port", 1);
     try {
         getPortByWwn(req);
         ADD_FAILURE() << "no exception";
@@ -81,16 +78,14 @@ TEST_F(Control, ThrowFaults) {
         EXPECT_EQ(42, e.code);
         EXPECT_EQ("no such port", e.message);
     }
-    tvrn_sim_clear_faults();
-    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_STD_EXCEPTION, 0, "transport down", 0);
+    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_STD_EXCEPTION, 0, "transport down", 1);
     try {
         getPortByWwn(req);
         ADD_FAILURE() << "no exception";
     } catch (const std::exception& e) {
         EXPECT_STREQ("transport down", e.what());
     }
-    tvrn_sim_clear_faults();
-    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_NON_STANDARD, 9, nullptr, 0);
+    tvrn_sim_set_fault("getPortByWwn", nullptr, TVRN_SIM_FAULT_NON_STANDARD, 9, nullptr, 1);
     EXPECT_THROW(getPortByWwn(req), int);
 }
 
