@@ -22,26 +22,23 @@ namespace {
 
 const char* const NS = "root/test";
 
-std::string dump(const Instance* instance) {
+// The text fprint() writes for an instance or a value.
+template <class F>
+std::string printed(F print) {
     char* text = nullptr;
     size_t size = 0;
     FILE* os = open_memstream(&text, &size);
-    fprint(os, instance);
+    print(os);
     fclose(os);
     std::string s(text, size);
     free(text);
     return s;
 }
-
+std::string dump(const Instance* instance) {
+    return printed([&](FILE* os) { fprint(os, instance); });
+}
 std::string dump(const Value& value) {
-    char* text = nullptr;
-    size_t size = 0;
-    FILE* os = open_memstream(&text, &size);
-    value.fprint(os);
-    fclose(os);
-    std::string s(text, size);
-    free(text);
-    return s;
+    return printed([&](FILE* os) { value.fprint(os); });
 }
 
 bool contains(const std::string& text, const std::string& part) {
@@ -329,7 +326,6 @@ TEST_F(Conversion, ADatetimeThatDoesNotParseIsLeftNull) {
     EXPECT_TRUE(contains(text, "datetime When = NULL;")) << text;
     EXPECT_TRUE(contains(text, "string Label = \"still here\";")) << text;
     EXPECT_TRUE(log.has("WARN: CMPI_Containers.cpp")) << log.text();
-    EXPECT_TRUE(log.has(": conversion error\n") || log.has(": conversion error")) << log.text();
     EXPECT_TRUE(log.has("conversion error: TVRNTEST_Gadget.When")) << log.text();
 
     CMPIData data;

@@ -71,15 +71,6 @@ public:
 
     bool has(const std::string& text) const { return count(text) > 0; }
 
-    // Position of the first line containing text (lines().size() if none).
-    size_t find(const std::string& text) const {
-        auto l = lines();
-        for (size_t i = 0; i < l.size(); i++)
-            if (l[i].find(text) != std::string::npos)
-                return i;
-        return l.size();
-    }
-
     std::string text() const {
         std::string all;
         for (const auto& l : lines())

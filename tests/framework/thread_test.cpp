@@ -136,70 +136,39 @@ TEST(Thread, JoinReturnsTheResult) {
     EXPECT_EQ(EINVAL, Thread::create_joinable(t, nullptr, nullptr));
 }
 
+// The creator's context makes the new thread's; its hooks run once each,
+// whether the procedure returns, calls Thread::exit() or throws.
 TEST(Thread, NewThreadsGetAContextFromTheCreator) {
-    Events events;
-    g_events = &events;
-    Fake_Context parent(events, "parent");
-    Thread_Context::push(&parent);
-
-    Thread t;
-    char arg[] = "work";
-    ASSERT_EQ(0, Thread::create_joinable(t, note_context, arg));
-    void* result = nullptr;
-    ASSERT_EQ(0, Thread::join(t, result));
-    EXPECT_EQ(arg, result);
-    EXPECT_EQ(&parent, Thread_Context::top());
-
-    const std::vector<std::string> expect = {"parent create work", "child start", "proc in child",
-                                             "child exit", "child destroyed"};
-    EXPECT_EQ(expect, events.get());
-    Thread_Context::pop();
-    EXPECT_EQ(nullptr, Thread_Context::top());
-}
-
-TEST(Thread, ExitCallsTheExitHookOnce) {
-    Events events;
-    g_events = &events;
-    Fake_Context parent(events, "parent");
-    Thread_Context::push(&parent);
-
-    Thread t;
-    char arg[] = "exit";
-    ASSERT_EQ(0, Thread::create_joinable(t, note_context, arg));
-    void* result = nullptr;
-    ASSERT_EQ(0, Thread::join(t, result));
-    EXPECT_EQ(arg, result);
-    const std::vector<std::string> expect = {"parent create exit", "child start", "proc in child",
-                                             "child exit", "child destroyed"};
-    EXPECT_EQ(expect, events.get());
-    Thread_Context::pop();
-}
-
-TEST(Thread, AnExceptionEndsOnlyTheProcedure) {
-    Thread t;
-    ASSERT_EQ(0, Thread::create_joinable(
-                     t, [](void*) -> void* { throw std::runtime_error("boom"); }, nullptr));
-    void* result = &t;
-    ASSERT_EQ(0, Thread::join(t, result));
-    EXPECT_EQ(nullptr, result);
-}
-
-TEST(Thread, AThrowingProcedureStillLeavesTheServer) {
-    Events events;
-    Fake_Context parent(events, "parent");
-    Thread_Context::push(&parent);
-
-    Thread t;
-    char arg[] = "throw";
-    ASSERT_EQ(0, Thread::create_joinable(
-                     t, [](void*) -> void* { throw std::runtime_error("boom"); }, arg));
-    void* result = &t;
-    ASSERT_EQ(0, Thread::join(t, result));
-    EXPECT_EQ(nullptr, result);
-    const std::vector<std::string> expect = {"parent create throw", "child start", "child exit",
-                                             "child destroyed"};
-    EXPECT_EQ(expect, events.get());
-    Thread_Context::pop();
+    const struct {
+        const char* arg;
+        Thread_Proc proc;
+        bool returns_arg;
+        std::vector<std::string> events;
+    } cases[] = {
+        {"work", note_context, true,
+         {"parent create work", "child start", "proc in child", "child exit", "child destroyed"}},
+        {"exit", note_context, true,
+         {"parent create exit", "child start", "proc in child", "child exit", "child destroyed"}},
+        {"throw", [](void*) -> void* { throw std::runtime_error("boom"); }, false,
+         {"parent create throw", "child start", "child exit", "child destroyed"}},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.arg);
+        Events events;
+        g_events = &events;
+        Fake_Context parent(events, "parent");
+        Thread_Context::push(&parent);
+        Thread t;
+        std::string arg = c.arg;
+        ASSERT_EQ(0, Thread::create_joinable(t, c.proc, &arg[0]));
+        void* result = &t;
+        ASSERT_EQ(0, Thread::join(t, result));
+        EXPECT_EQ(c.returns_arg ? &arg[0] : nullptr, result);
+        EXPECT_EQ(&parent, Thread_Context::top());
+        EXPECT_EQ(c.events, events.get());
+        Thread_Context::pop();
+        EXPECT_EQ(nullptr, Thread_Context::top());
+    }
 }
 
 TEST(Thread, Detached) {

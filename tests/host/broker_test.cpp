@@ -18,13 +18,6 @@ protected:
     CMPIStatus rc{CMPI_RC_OK, nullptr};
 };
 
-TEST_F(Broker, AnnouncesItself)
-{
-    EXPECT_EQ(CBBrokerVersion(b), static_cast<unsigned>(CMPICurrentVersion));
-    EXPECT_STREQ(CBBrokerName(b), "tvrnhost");
-    EXPECT_TRUE(CBGetBrokerCapabilities(b) & CMPI_MB_Supports_IndicationMI);
-}
-
 TEST_F(Broker, DateTimesFromCharsAndBinary)
 {
     CMPIDateTime *d = CMNewDateTimeFromChars(b, "20231114231320.000001+060", &rc);

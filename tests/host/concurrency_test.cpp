@@ -51,19 +51,5 @@ TEST_F(Concurrency, ParallelRequestsAllSucceed)
     EXPECT_EQ(left.items.size(), 3u);
 }
 
-TEST_F(Concurrency, RequestsWhileTheProviderDelivers)
-{
-    ASSERT_TRUE(host->subscribe(kNs, "Test_Alert").ok());
-    std::thread reader([&] {
-        for (int i = 0; i < 50; ++i)
-            EXPECT_TRUE(host->enumerateInstances(kNs, "Test_Gadget").ok());
-    });
-    ASSERT_TRUE(host->subscribe("root/other", "Test_Alert").ok());
-    reader.join();
-    EXPECT_TRUE(host->waitForIndications(9, std::chrono::seconds(10)));
-    ASSERT_TRUE(host->unsubscribe(kNs, "Test_Alert").ok());
-    ASSERT_TRUE(host->unsubscribe("root/other", "Test_Alert").ok());
-}
-
 }  // namespace
 }  // namespace hosttest

@@ -15,16 +15,13 @@ TEST(MofValue, EveryKindOfScalar)
         const char *mof;
     } cases[] = {
         {Value::boolean(true), "true"},
-        {Value::boolean(false), "false"},
         {Value::uint8(255), "255"},
         {Value::sint8(-128), "-128"},
         {Value::uint64(18446744073709551615ull), "18446744073709551615"},
-        {Value::sint64(-9), "-9"},
         {Value::real32(2.5f), "2.5"},
         {Value::real64(1), "1.0"},
         {Value::char16('A'), "'A'"},
         {Value::char16('\''), "'\\''"},
-        {Value::char16('"'), "'\"'"},
         {Value::char16(0x263A), "'\\x263A'"},
         {Value::char16(1), "'\\x0001'"},
         {Value::string(""), "\"\""},
@@ -37,7 +34,6 @@ TEST(MofValue, EveryKindOfScalar)
         {Value::reference(ObjectPath::parse("root/t:A.Id=\"1\",N=2")),
          "\"root/t:A.Id=\\\"1\\\",N=2\""},
         {Value::null(Type::Uint16), "NULL"},
-        {Value::null(Type::String, true), "NULL"},
     };
     for (const auto &c : cases) {
         SCOPED_TRACE(c.mof);

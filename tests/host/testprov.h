@@ -9,8 +9,6 @@ extern "C" {
 
 struct tvrntest_counters {
     int factoryCalls;
-    int cleanupCalls;
-    int terminatingCleanups;
     int authorizeCalls;
     int activateCalls;
     int firstActivations;

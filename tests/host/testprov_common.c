@@ -83,8 +83,6 @@ CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating)
     (void)ctx;
     if (!terminating && tp_forbidUnload)
         CMReturn(CMPI_RC_DO_NOT_UNLOAD);
-    tvrntest_counters.cleanupCalls++;
-    tvrntest_counters.terminatingCleanups += terminating ? 1 : 0;
     tp_alertsStop();
     tp_widgetsReset(0);
     if (--liveMIs == 0) { /* the last MI: nothing uses the mutex any more */

@@ -282,47 +282,6 @@ static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArg
     CMReturn(CMPI_RC_OK);
 }
 
-/* Target (ref), When (datetime), Values (uint16[]) in; a summary string
- * back, with Doubled (uint16[]) and Later (When + 1 s) out. */
-static CMPIStatus methodDescribe(const CMPIResult *rslt, const CMPIArgs *in, CMPIArgs *out)
-{
-    CMPIStatus rc;
-    CMPIData target = CMGetArg(in, "Target", &rc);
-    CMPIData when = CMGetArg(in, "When", NULL);
-    CMPIData values = CMGetArg(in, "Values", NULL);
-    CMPIArray *doubled;
-    CMPIDateTime *later;
-    CMPICount i, n;
-    unsigned long sum = 0;
-    char text[256];
-    if (rc.rc != CMPI_RC_OK || target.type != CMPI_ref || when.type != CMPI_dateTime ||
-        values.type != CMPI_uint16A)
-        CMReturnWithChars(tp_broker, CMPI_RC_ERR_INVALID_PARAMETER, "Describe: bad arguments");
-    n = CMGetArrayCount(values.value.array, NULL);
-    if (CMGetArrayType(values.value.array, NULL) != CMPI_uint16)
-        CMReturn(CMPI_RC_ERR_TYPE_MISMATCH);
-    doubled = CMNewArray(tp_broker, n, CMPI_uint16, NULL);
-    for (i = 0; i < n; ++i) {
-        CMPIData e = CMGetArrayElementAt(values.value.array, i, NULL);
-        CMPIUint16 d2 = (CMPIUint16)(e.value.uint16 * 2);
-        sum += e.value.uint16;
-        CMSetArrayElementAt(doubled, i, &d2, CMPI_uint16);
-    }
-    later = CMNewDateTimeFromBinary(
-        tp_broker, CMGetBinaryFormat(when.value.dateTime, NULL) + 1000000ULL,
-        CMIsInterval(when.value.dateTime, NULL), NULL);
-    snprintf(text, sizeof text, "%s keys=%u when=%s interval=%d sum=%lu",
-             tp_class(target.value.ref), CMGetKeyCount(target.value.ref, NULL),
-             CMGetCharsPtr(CMGetStringFormat(when.value.dateTime, NULL), NULL),
-             (int)CMIsInterval(when.value.dateTime, NULL), sum);
-    CMAddArg(out, "Doubled", &doubled, CMPI_uint16A);
-    CMAddArg(out, "Later", &later, CMPI_dateTime);
-    CMAddArg(out, "Target", &target.value.ref, CMPI_ref);
-    CMReturnData(rslt, text, CMPI_chars);
-    CMReturnDone(rslt);
-    CMReturn(CMPI_RC_OK);
-}
-
 static CMPIStatus methodWhoAmI(const CMPIContext *ctx, const CMPIResult *rslt)
 {
     CMPIStatus rc;
@@ -402,8 +361,6 @@ static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
     (void)mi;
     if (strcasecmp(method, "Echo") == 0)
         return methodEcho(rslt, in, out);
-    if (strcasecmp(method, "Describe") == 0)
-        return methodDescribe(rslt, in, out);
     if (strcasecmp(method, "WhoAmI") == 0)
         return methodWhoAmI(ctx, rslt);
     if (strcasecmp(method, "ReadManager") == 0)

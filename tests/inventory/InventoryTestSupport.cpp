@@ -1,7 +1,5 @@
 #include "tests/inventory/InventoryTestSupport.h"
 
-#include <cstdio>
-#include <cstdlib>
 #include <cstring>
 #include <vector>
 
@@ -22,7 +20,6 @@ namespace {
 HostMode gMode = HostMode::ADDRESS;
 
 int fakeHostName(char* name, size_t length) {
-    hostCounters().nameReads++;
     if (gMode == HostMode::NO_NAME)
         return -1;
     strlcpy(name, "invhost", length);
@@ -70,31 +67,6 @@ HostCounters& hostCounters() {
 void setHostMode(HostMode mode) { gMode = mode; }
 
 Instances::~Instances() { destroyInstances(_items); }
-
-std::string dump(const Instance* instance) {
-    if (instance == nullptr)
-        return "(null)";
-    char* text = nullptr;
-    size_t size = 0;
-    FILE* out = open_memstream(&text, &size);
-    if (out == nullptr)
-        return "(no memory)";
-    fprint(out, instance);
-    std::fclose(out);
-    std::string result(text, size);
-    std::free(text);
-    return result;
-}
-
-::testing::AssertionResult sameInstance(Instance* expected, const Instance* actual) {
-    const bool same = expected != nullptr && actual != nullptr && identical(expected, actual);
-    ::testing::AssertionResult result = same ? ::testing::AssertionSuccess()
-                                             : (::testing::AssertionFailure()
-                                                << "expected:\n" << dump(expected) << "actual:\n"
-                                                << dump(actual));
-    destroy(expected);
-    return result;
-}
 
 void InventoryTest::SetUp() {
     startProvider();

@@ -20,7 +20,6 @@ namespace invtest {
 // The fake host: named "invhost", resolving to 127.0.1.1 and kHostAddress.
 extern const char kHostAddress[];
 struct HostCounters {
-    int nameReads = 0;
     int resolves = 0;
 };
 HostCounters& hostCounters();
@@ -67,18 +66,6 @@ public:
 private:
     CPTA::Array<CPTA::Instance*> _items;
 };
-
-// Text form of an instance, for failure messages.
-std::string dump(const CPTA::Instance* instance);
-
-// Compares every property of `actual` with those of `expected` (which is
-// destroyed).
-::testing::AssertionResult sameInstance(CPTA::Instance* expected, const CPTA::Instance* actual);
-
-template <class T>
-T* expected() {
-    return CPTA::create<T>(true);
-}
 
 inline CPTA::Array<CPTA::String> strings(std::initializer_list<const char*> values) {
     CPTA::Array<CPTA::String> out;

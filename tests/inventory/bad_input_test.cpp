@@ -5,6 +5,7 @@
 #include "inventory/PortHelper.h"
 #include "schema/generated/TAVRIN_FCPort.h"
 #include "schema/generated/TAVRIN_LANEndpoint.h"
+#include "schema/generated/TAVRIN_StorageExtent.h"
 #include "tests/inventory/InventoryTestSupport.h"
 
 using namespace CPTA;
@@ -204,6 +205,29 @@ TEST_F(BadInput, ImpossibleNumbersFromAFixture) {
     ASSERT_EQ(endpoints.size(), 2u);
     EXPECT_EQ(endpoints.at<TAVRIN_LANEndpoint>(0)->MaxDataSize.value, 0u);
     EXPECT_EQ(endpoints.at<TAVRIN_LANEndpoint>(1)->MaxDataSize.value, 72000u);
+}
+
+TEST_F(BadInput, LunEntriesMissingMembersAreSkippedOneByOne) {
+    Json::Value fixture = fixtureJson("default");
+    Json::Value& luns = fixture["adapters"][0]["fcPorts"][0]["remotePorts"][0]["lunList"];
+    const char* bad[] = {
+        R"({"number": 7, "productID": "DISK-X"})",                      // no vendor
+        R"({"number": "8", "vendor": "ACME", "productID": "DISK-X"})",  // number as text
+        R"({"number": 9, "vendor": "ACME", "productID": 17})",          // product as number
+        R"({"number": 10, "vendor": ["ACME"], "productID": "DISK-X"})", // vendor as array
+        R"({"number": 11, "vendor": "ACME", "productID": "DISK-X",
+            "lunDescription": 5, "productSerialNumber": {"x": 1}})",    // both of the wrong type
+    };
+    for (const char* text : bad)
+        luns.append(gwtest::parseJson(text));
+    loadJson(fixture);
+
+    Instances extents(hdr(CID_STORAGE_EXTENT));
+    EXPECT_EQ(extents.size(), 12u);  // the 11 of the host and LUN 11
+    auto* lun11 = extents.find(&TAVRIN_StorageExtent::ElementName, "LUN_11");
+    ASSERT_NE(lun11, nullptr);
+    EXPECT_STREQ(lun11->Name.value.c_str(), "Unable To Fetch");
+    EXPECT_EQ(logged("ERR", "LUN info is NOT available"), 1 + 4);
 }
 
 }  // namespace

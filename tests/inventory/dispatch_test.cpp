@@ -20,32 +20,9 @@ class Dispatch : public InventoryTest {};
 
 TEST_F(Dispatch, RoutesEveryClassIdOfTheBuiltInHost) {
     for (int id = 0; id <= MAXCLASSID; id++) {
-        SCOPED_TRACE("class id " + std::to_string(id));
-        for (bool viaHDR : {false, true}) {
-            const std::set<int>& served = viaHDR ? kHDRServed : kFCHBAServed;
-            gwtest::LogCapture::get().mark();
-            Instances got(viaHDR ? hdr(classId_t(id)) : fchba(classId_t(id)));
-            if (served.count(id) != 0) {
-                EXPECT_FALSE(got.empty());
-                EXPECT_EQ(logged("INFO", "Requested class is NOT supported."), 0);
-            } else {
-                EXPECT_TRUE(got.empty());
-                EXPECT_EQ(logged("INFO", "Requested class is NOT supported."), 1);
-            }
-            EXPECT_EQ(logged("INFO", "Requested classId : " + std::to_string(id)), 1);
-        }
+        EXPECT_EQ(Instances(fchba(classId_t(id))).empty(), kFCHBAServed.count(id) == 0) << id;
+        EXPECT_EQ(Instances(hdr(classId_t(id))).empty(), kHDRServed.count(id) == 0) << id;
     }
-}
-
-TEST_F(Dispatch, RoutesOfHelpersStillToComeAreDataWithoutABuilder) {
-    size_t count = 0;
-    const InventoryRoute* routes = FCHBAManager::routes(count);
-    std::set<int> pending;
-    for (size_t r = 0; r < count; r++)
-        if (routes[r].build == nullptr)
-            for (int id = routes[r].first; id <= routes[r].last; id++)
-                pending.insert(id);
-    EXPECT_EQ(pending, (std::set<int>{17, 18, 19, 21, 22, 23, 24, 25, 26, 27, 28, 31, 32, 33}));
 }
 
 TEST_F(Dispatch, ClosedDriverGateAsksTheLibraryNothingButStillNamesTheHost) {
@@ -76,16 +53,6 @@ TEST_F(Dispatch, DriverStatusOneStillAsksTheLibrary) {
     ProviderInit::driverStatus = 1;
     Instances ports(fchba(CID_FC_PORT));
     EXPECT_EQ(ports.size(), 6u);
-}
-
-TEST_F(Dispatch, HostWithoutAdaptersGivesEmptyArraysAndOneHost) {
-    load("empty");
-    for (int id : kFCHBAServed) {
-        Instances got(fchba(classId_t(id)));
-        EXPECT_EQ(got.size(), id == CID_COMPUTER_SYSTEM ? 1u : 0u) << "class id " << id;
-    }
-    for (int id : kHDRServed)
-        EXPECT_TRUE(Instances(hdr(classId_t(id))).empty()) << "class id " << id;
 }
 
 TEST_F(Dispatch, HostIsResolvedOncePerRequest) {
@@ -155,42 +122,32 @@ TEST_F(Dispatch, ScopeAnswersAsGetHostInfoDoes) {
     EXPECT_EQ(hostCounters().resolves, 2);
 }
 
+// The computer system of the real host is in the golden files; here the
+// kinds of host text the fake host can give.
 TEST_F(Dispatch, ComputerSystemByKindOfHostText) {
     struct Case {
         HostMode mode;
         const char* name;
         const char* format;
         const char* description;
-        bool warned;
     };
     const Case cases[] = {
-        {HostMode::ADDRESS, kHostAddress, "IP", "Ipv4 Address", false},
-        {HostMode::LOOPBACK_ONLY, "invhost", "Other", "Fully Qualified Domain Name", false},
-        {HostMode::NO_NAME, "localhost", "Other", "Fully Qualified Domain Name", true},
+        {HostMode::ADDRESS, kHostAddress, "IP", "Ipv4 Address"},
+        {HostMode::LOOPBACK_ONLY, "invhost", "Other", "Fully Qualified Domain Name"},
+        {HostMode::NO_NAME, "localhost", "Other", "Fully Qualified Domain Name"},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.name);
         setHostMode(c.mode);
-        gwtest::LogCapture::get().mark();
         tvrn_sim_reset_counters();
         Instances hosts(fchba(CID_COMPUTER_SYSTEM));
-        ASSERT_EQ(hosts.size(), 1u);
         EXPECT_EQ(tvrn_sim_total_calls(), 0u);
-        TAVRIN_ComputerSystem* cs = expected<TAVRIN_ComputerSystem>();
-        cs->Name.set(String(c.name));
-        cs->CreationClassName.set(String("TAVRIN_ComputerSystem"));
-        cs->NameFormat.set(String(c.format));
-        cs->OtherIdentifyingInfo.set(strings({c.name}));
-        cs->IdentifyingDescriptions.set(strings({c.description}));
-        const char* text = "The host with Tavrin's adapters installed.";
-        cs->ElementName.set(String(text));
-        cs->Description.set(String(text));
-        cs->Caption.set(String(text));
-        cs->Dedicated.set(u16s({0, 14}));
-        cs->OperationalStatus.set(u16s({2}));
-        cs->StatusDescriptions.set(strings({"The System is in service"}));
-        EXPECT_TRUE(sameInstance(cs, hosts[0]));
-        EXPECT_EQ(logged("WARN", "No host IP / Name  retrived in the function"), c.warned ? 1 : 0);
+        auto* cs = hosts.at<TAVRIN_ComputerSystem>(0);
+        ASSERT_NE(cs, nullptr);
+        EXPECT_STREQ(cs->Name.value.c_str(), c.name);
+        EXPECT_STREQ(cs->NameFormat.value.c_str(), c.format);
+        EXPECT_EQ(cs->OtherIdentifyingInfo.value, strings({c.name}));
+        EXPECT_EQ(cs->IdentifyingDescriptions.value, strings({c.description}));
     }
 }
 

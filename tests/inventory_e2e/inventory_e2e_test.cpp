@@ -96,15 +96,9 @@ TEST(Inventory, EveryClassEnumeratesAndEachPathFindsItsInstanceAgain) {
     ASSERT_FALSE(s.hostName().empty());
     for (const Inventory_Class& c : kClasses) {
         SCOPED_TRACE(c.name);
-        s.markLog();
         Result<Instance> got = s.enumerate(c.name);
         ASSERT_TRUE(got.ok()) << got.toString();
         EXPECT_EQ(got.items.size(), c.onDefaultHost);
-        // The Ethernet-port provider alone does not announce its instances.
-        EXPECT_EQ(s.logCount("Returning instances"),
-                  std::string(c.name) == "TAVRIN_EthernetPort" ? 0u : 1u);
-        EXPECT_EQ(s.logCount("Entering: enum_instances"), 1u);
-        EXPECT_EQ(s.logCount("Returning: enum_instances"), 1u);
 
         Result<ObjectPath> names = s.enumerateNames(c.name);
         ASSERT_TRUE(names.ok()) << names.toString();
@@ -390,27 +384,8 @@ TEST(AlarmDevice, AMezzanineAdapterHasNoBeaconToSwitch) {
 }
 
 //------------------------------------------------------------------------------
-// What the providers refuse, and bad answers from the library
+// Bad answers from the library (what the providers refuse is in tests/module)
 //------------------------------------------------------------------------------
-
-TEST(Inventory, WritesAndOtherMethodsAreRefused) {
-    Module_Session& s = Module_Session::open();
-    ASSERT_TRUE(s.loaded());
-    const ObjectPath port = s.path(fcPortPath("100000051e0a0b0c"));
-    EXPECT_EQ(s.host().createInstance(Instance(port)).rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_EQ(s.host().modifyInstance(Instance(port)).rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_EQ(s.host().deleteInstance(port).rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_EQ(s.invoke(port, "Reset").rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_EQ(s.invoke(s.path(alarmPath("100000051e0a0b0c")), "SetUrgency",
-                       {{"RequestedUrgency", Value::uint16(5)}})
-                  .rc,
-              CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_EQ(s.invoke(s.path("TAVRIN_ComputerSystem.CreationClassName=\"TAVRIN_ComputerSystem\","
-                              "Name=\"<host>\""),
-                       "SetPowerState")
-                  .rc,
-              CMPI_RC_ERR_NOT_SUPPORTED);
-}
 
 // Every library entry point an enumeration calls, made to answer nothing, an
 // error or to throw, for every request; and answers with members missing or

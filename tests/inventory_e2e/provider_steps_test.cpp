@@ -57,9 +57,7 @@ TEST(InventoryProviderSteps, OnlyInstancesOfTheProvidersClassAreDeliveredTheRest
     EXPECT_EQ(run(ANNOUNCED, {kPort, nullptr, kProduct, kPort}, delivered), ENUM_INSTANCES_OK);
     EXPECT_EQ(gAskedFor, CID_FC_PORT);
     EXPECT_EQ(delivered, (std::vector<std::string>{"TAVRIN_FCPort", "TAVRIN_FCPort"}));
-    EXPECT_EQ(log.count("DBG: Stand_In_Provider.cpp(42): Entering: enum_instances"), 1u);
     EXPECT_EQ(log.count("DBG: Stand_In_Provider.cpp(42): Returning instances"), 1u);
-    EXPECT_EQ(log.count("DBG: Stand_In_Provider.cpp(42): Returning: enum_instances"), 1u);
     EXPECT_EQ(log.count("Nothing here!"), 0u);
 
     log.mark();
@@ -86,7 +84,6 @@ TEST(InventoryProviderSteps, NoInstancesIsSuccessAndOneLineAtTheProvidersLevel) 
     EXPECT_TRUE(delivered.empty());
     EXPECT_EQ(log.count("WARN: Stand_In_Provider.cpp(42): Nothing here!"), 1u);
     EXPECT_EQ(log.count("Returning instances"), 0u);
-    EXPECT_EQ(log.count("Returning: enum_instances"), 1u);
 }
 
 TEST(InventoryProviderSteps, ASingleInstanceProviderFailsOnAnyOtherNumber) {
@@ -97,7 +94,6 @@ TEST(InventoryProviderSteps, ASingleInstanceProviderFailsOnAnyOtherNumber) {
         EXPECT_EQ(run(SINGLE, answer, delivered), ENUM_INSTANCES_FAILED);
         EXPECT_TRUE(delivered.empty());
         EXPECT_EQ(log.count("Nothing here!"), 1u);
-        EXPECT_EQ(log.count("Returning: enum_instances"), 1u);
     }
     std::vector<std::string> delivered;
     EXPECT_EQ(run(SINGLE, {kPort}, delivered), ENUM_INSTANCES_OK);

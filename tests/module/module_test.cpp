@@ -1,6 +1,6 @@
 // libtvrnprovider.so as a CIM server sees it: its exported symbols, its
-// registration list, the life cycle of its MIs, and the answers of its
-// providers, all driven through the embedded host.
+// registration list and the answers of its providers through the embedded
+// host (the MI life cycle is the binding's, tested with tests/cmpi's module).
 #include <gtest/gtest.h>
 
 #include <cstdio>
@@ -20,8 +20,6 @@
 #include "tests/cmpi/test_support.h"
 
 using namespace tvrnhost;
-using tvrntest::Loaded_Module;
-using tvrntest::Log_Watch;
 
 namespace {
 
@@ -172,7 +170,9 @@ TEST(Module, RegistersEveryProviderOnceInTableOrder) {
 }
 
 //------------------------------------------------------------------------------
-// Life cycle of MIs
+// The providers on a host without adapters (this program runs on the
+// simulator's "empty" host): nothing to enumerate but the host itself,
+// nothing to change, no method but SetAlarmState
 //------------------------------------------------------------------------------
 
 class Loaded : public ::testing::Test {
@@ -182,53 +182,6 @@ protected:
 
     Host host;
 };
-
-TEST_F(Loaded, TheMisOfOneProviderShareOneAdapter) {
-    Loaded_Module module(TVRN_MODULE);
-    typedef CMPIInstanceMI* (*Instance_Factory)(const CMPIBroker*, const CMPIContext*,
-                                                CMPIStatus*);
-    typedef CMPIMethodMI* (*Method_Factory)(const CMPIBroker*, const CMPIContext*, CMPIStatus*);
-    auto instance_factory = module.symbol<Instance_Factory>("TAVRIN_FCPort_Create_InstanceMI");
-    auto method_factory = module.symbol<Method_Factory>("TAVRIN_FCPort_Provider_Create_MethodMI");
-    ASSERT_TRUE(instance_factory && method_factory);
-
-    Log_Watch log;
-    CMPIStatus rc = {CMPI_RC_ERR_FAILED, nullptr};
-    CMPIInstanceMI* imi = instance_factory(host.broker(), nullptr, &rc);
-    ASSERT_TRUE(imi);
-    EXPECT_EQ(rc.rc, CMPI_RC_OK);
-    CMPIMethodMI* mmi = method_factory(host.broker(), nullptr, &rc);
-    ASSERT_TRUE(mmi);
-    EXPECT_EQ(imi->hdl, mmi->hdl);
-    EXPECT_STREQ(imi->ft->miName, "instanceTAVRIN_FCPort_Provider");
-    EXPECT_STREQ(mmi->ft->miName, "methodTAVRIN_FCPort_Provider");
-    EXPECT_EQ(imi->ft->ftVersion, 100);
-    EXPECT_EQ(mmi->ft->miVersion, 100);
-    EXPECT_EQ(*static_cast<uint32_t*>(imi->hdl), 0x5DE2B131u);
-    EXPECT_EQ(log.count("enter: CMPI_Adapter()"), 1u);
-    EXPECT_EQ(log.count("enter: cimple_cmpi_adapter()"), 2u);
-
-    CMPIObjectPath* op = CMNewObjectPath(host.broker(), NS, "TAVRIN_FCPort", nullptr);
-    EXPECT_EQ(imi->ft->execQuery(imi, nullptr, nullptr, op, "SELECT * FROM TAVRIN_FCPort", "WQL")
-                  .rc,
-              CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_TRUE(log.has("return: execQuery(): CMPI_RC_ERR_NOT_SUPPORTED"));
-    CMRelease(op);
-
-    EXPECT_EQ(mmi->ft->cleanup(mmi, nullptr, 0).rc, CMPI_RC_OK);
-    EXPECT_EQ(log.count("cleanup decrement"), 1u);
-    EXPECT_EQ(*static_cast<uint32_t*>(imi->hdl), 0x5DE2B131u);
-    EXPECT_EQ(imi->ft->cleanup(imi, nullptr, 0).rc, CMPI_RC_OK);
-    EXPECT_EQ(log.count("cleanup unload"), 1u);
-    EXPECT_EQ(log.count("return: ~CMPI_Adapter()"), 1u);
-    EXPECT_EQ(*static_cast<uint32_t*>(imi->hdl), 0xDDDDDDDDu);
-}
-
-//------------------------------------------------------------------------------
-// The providers on a host without adapters (this program runs on the
-// simulator's "empty" host): nothing to enumerate but the host itself,
-// nothing to change, no method but SetAlarmState
-//------------------------------------------------------------------------------
 
 TEST_F(Loaded, EveryProviderAnswersWithoutAdapters) {
     Registrations regs;
@@ -308,9 +261,7 @@ TEST(Module, ClassesAreCheckedAgainstTheProvidersClass) {
 )";
     Host host;
     ASSERT_TRUE(host.load(TVRN_MODULE, reg).ok());
-    Log_Watch log;
     EXPECT_EQ(host.enumerateInstances(NS, "No_Such_Class").rc, CMPI_RC_ERR_FAILED);
-    EXPECT_TRUE(log.has("return: enumInstances(): CMPI_RC_ERR_FAILED"));
     EXPECT_TRUE(host.enumerateInstances(NS, "CIM_FCPort").ok());
     EXPECT_EQ(host.enumerateInstances(NS, "TAVRIN_PortController").rc, CMPI_RC_ERR_INVALID_CLASS);
     EXPECT_EQ(host.invokeMethod(ObjectPath(NS, "TAVRIN_PortController"), "Reset").rc,
