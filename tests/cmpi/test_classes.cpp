@@ -38,7 +38,6 @@ PROP(TVRNTEST_Gadget, Index, UINT32, 0, FLAG_KEY);
 PROP(TVRNTEST_Gadget, Label, STRING, 0, 0);
 PROP(TVRNTEST_Gadget, When, DATETIME, 0, 0);
 PROP(TVRNTEST_Gadget, Tags, STRING, -1, 0);
-PROP(TVRNTEST_Gadget, Counts, UINT64, -1, 0);
 PROP(TVRNTEST_Gadget, Ratio, REAL64, 0, 0);
 PROP(TVRNTEST_Gadget, Flag, BOOLEAN, 0, 0);
 PROP(TVRNTEST_Gadget, Initial, CHAR16, 0, 0);
@@ -58,38 +57,31 @@ const Meta_Feature* const TVRNTEST_Gadget_Configure_method_features[] = {
 }  // namespace
 
 const Meta_Method TVRNTEST_Gadget_Configure_method::static_meta_class = {
-    0,
-    FLAG_METHOD,
-    "Configure",
-    nullptr,
-    0,
-    TVRNTEST_Gadget_Configure_method_features,
+    0, FLAG_METHOD, "Configure", nullptr, 0, TVRNTEST_Gadget_Configure_method_features,
     sizeof(TVRNTEST_Gadget_Configure_method_features) / sizeof(void*),
-    sizeof(TVRNTEST_Gadget_Configure_method),
-    UINT32};
+    sizeof(TVRNTEST_Gadget_Configure_method), UINT32};
 
 namespace {
 
 const Meta_Feature* const TVRNTEST_Gadget_features[] = {
-    MF(TVRNTEST_Gadget_Name),   MF(TVRNTEST_Gadget_Port),    MF(TVRNTEST_Gadget_Index),
-    MF(TVRNTEST_Gadget_Label),  MF(TVRNTEST_Gadget_When),    MF(TVRNTEST_Gadget_Tags),
-    MF(TVRNTEST_Gadget_Counts), MF(TVRNTEST_Gadget_Ratio),   MF(TVRNTEST_Gadget_Flag),
-    MF(TVRNTEST_Gadget_Initial), MF(TVRNTEST_Gadget_Owner),  MF(TVRNTEST_Gadget_Detail),
+    MF(TVRNTEST_Gadget_Name),  MF(TVRNTEST_Gadget_Port),   MF(TVRNTEST_Gadget_Index),
+    MF(TVRNTEST_Gadget_Label), MF(TVRNTEST_Gadget_When),   MF(TVRNTEST_Gadget_Tags),
+    MF(TVRNTEST_Gadget_Ratio), MF(TVRNTEST_Gadget_Flag),   MF(TVRNTEST_Gadget_Initial),
+    MF(TVRNTEST_Gadget_Owner), MF(TVRNTEST_Gadget_Detail),
     MF(TVRNTEST_Gadget_Configure_method::static_meta_class)};
-const bool TVRNTEST_Gadget_locals[] = {true, true, true, true, true, true, true,
+const bool TVRNTEST_Gadget_locals[] = {true, true, true, true, true, true,
                                        true, true, true, true, true, true};
 
 // TVRNTEST_Special_Gadget
 PROP(TVRNTEST_Special_Gadget, Extra, STRING, 0, 0);
 const Meta_Feature* const TVRNTEST_Special_Gadget_features[] = {
-    MF(TVRNTEST_Gadget_Name),   MF(TVRNTEST_Gadget_Port),    MF(TVRNTEST_Gadget_Index),
-    MF(TVRNTEST_Gadget_Label),  MF(TVRNTEST_Gadget_When),    MF(TVRNTEST_Gadget_Tags),
-    MF(TVRNTEST_Gadget_Counts), MF(TVRNTEST_Gadget_Ratio),   MF(TVRNTEST_Gadget_Flag),
-    MF(TVRNTEST_Gadget_Initial), MF(TVRNTEST_Gadget_Owner),  MF(TVRNTEST_Gadget_Detail),
+    MF(TVRNTEST_Gadget_Name),  MF(TVRNTEST_Gadget_Port),   MF(TVRNTEST_Gadget_Index),
+    MF(TVRNTEST_Gadget_Label), MF(TVRNTEST_Gadget_When),   MF(TVRNTEST_Gadget_Tags),
+    MF(TVRNTEST_Gadget_Ratio), MF(TVRNTEST_Gadget_Flag),   MF(TVRNTEST_Gadget_Initial),
+    MF(TVRNTEST_Gadget_Owner), MF(TVRNTEST_Gadget_Detail),
     MF(TVRNTEST_Gadget_Configure_method::static_meta_class), MF(TVRNTEST_Special_Gadget_Extra)};
-const bool TVRNTEST_Special_Gadget_locals[] = {false, false, false, false, false,
-                                               false, false, false, false, false,
-                                               false, false, false, true};
+const bool TVRNTEST_Special_Gadget_locals[] = {false, false, false, false, false, false, false,
+                                               false, false, false, false, false, true};
 
 // TVRNTEST_Link
 REF(TVRNTEST_Link, Left, 0, FLAG_KEY, TVRNTEST_Gadget);

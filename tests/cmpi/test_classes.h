@@ -1,18 +1,7 @@
 // Hand-written classes for the CMPI binding tests, laid out like the
 // generated ones. Unlike the module's classes they have integer keys, a
-// reference and an embedded instance among their properties, and a method
-// with a reference-array parameter.
-//
-//   TVRNTEST_Owner          key Id; Name
-//   TVRNTEST_Gadget         keys Name (string), Port (uint16), Index (uint32);
-//                           Label, When, Tags[], Counts[], Ratio, Flag,
-//                           Initial, Owner (ref TVRNTEST_Owner), Detail
-//                           (embedded TVRNTEST_Owner);
-//                           Configure(In Level, In Targets[] ref, Out Report,
-//                           Out Result ref) -> uint32
-//   TVRNTEST_Special_Gadget TVRNTEST_Gadget plus Extra
-//   TVRNTEST_Link           association: keys Left (ref TVRNTEST_Gadget),
-//                           Right (ref TVRNTEST_Owner); Note
+// reference (Owner) and an embedded instance (Detail) among their
+// properties, and a method with a reference-array parameter.
 #ifndef TVRN_TESTS_CMPI_TEST_CLASSES_H
 #define TVRN_TESTS_CMPI_TEST_CLASSES_H
 
@@ -37,7 +26,6 @@ struct TVRNTEST_Gadget : public Instance {
     Property<String> Label;
     Property<Datetime> When;
     Property<Array<String>> Tags;
-    Property<Array<uint64>> Counts;
     Property<real64> Ratio;
     Property<boolean> Flag;
     Property<char16> Initial;

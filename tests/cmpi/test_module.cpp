@@ -301,7 +301,6 @@ class Test_Link_Provider : public Association_Provider<TVRNTEST_Link> {
 public:
     Enum_Instances_Status enum_instances(const TVRNTEST_Link*,
                                          Enum_Instances_Handler<TVRNTEST_Link>* handler) {
-        count("link.enum");
         std::vector<Instance*> copies;
         {
             std::lock_guard<std::mutex> g(state().mutex);
@@ -480,8 +479,7 @@ std::string _text;
 }  // namespace
 
 // "reset"         clears the tables, counters and forced statuses
-// "count:<name>"  a counter: load, unload, enum, link.enum, enable, disable,
-//                 delivered
+// "count:<name>"  a counter: load, unload, enum, enable, disable, delivered
 // "force:<op>"    forces value as the status of get, enum, create, modify,
 //                 delete, invoke, link.enum, associator_names, associators,
 //                 references, enable (-1: no longer)

@@ -1,7 +1,6 @@
-// Helpers shared by the tests that load provider modules into the embedded
-// host: a private HOME whose .cimplerc turns logging on (set before any
-// module logs), a reader for the messages logged since a mark, and access to
-// functions a loaded module exports.
+// Helpers for the tests that load provider modules into the embedded host: a
+// private HOME with logging on (set before any module logs), the messages
+// logged since a mark, and functions a loaded module exports.
 #ifndef TVRN_TESTS_CMPI_TEST_SUPPORT_H
 #define TVRN_TESTS_CMPI_TEST_SUPPORT_H
 
@@ -9,7 +8,6 @@
 #include <stdlib.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -20,8 +18,7 @@
 
 namespace tvrntest {
 
-// The HOME of the test process, with LOG_LEVEL=DBG.
-// Removed when the program ends.
+// The HOME of the test process, with LOG_LEVEL=DBG; removed at exit.
 inline const std::string& log_home() {
     static char dir[] = "/tmp/tvrn-cmpi-test-XXXXXX";
     static const std::string home = [] {
@@ -38,11 +35,7 @@ inline const std::string& log_home() {
     return home;
 }
 
-// Installed while the test program starts, before any module is loaded.
-struct Log_Home_Setup {
-    Log_Home_Setup() { log_home(); }
-};
-static Log_Home_Setup _log_home_setup;
+[[maybe_unused]] static const std::string& _log_home_setup = log_home();  // before modules load
 
 // The lines logged from the moment of construction (or of mark()).
 class Log_Watch {
@@ -55,18 +48,17 @@ public:
         std::ifstream is(_path());
         is.seekg(std::streamoff(_start));
         std::vector<std::string> result;
-        std::string line;
-        while (std::getline(is, line))
+        for (std::string line; std::getline(is, line);)
             result.push_back(line);
         return result;
     }
 
     // Number of lines that contain text.
     size_t count(const std::string& text) const {
-        auto l = lines();
-        return size_t(std::count_if(l.begin(), l.end(), [&](const std::string& s) {
-            return s.find(text) != std::string::npos;
-        }));
+        size_t n = 0;
+        for (const auto& l : lines())
+            n += l.find(text) != std::string::npos;
+        return n;
     }
 
     bool has(const std::string& text) const { return count(text) > 0; }
@@ -100,8 +92,6 @@ public:
     }
     Loaded_Module(const Loaded_Module&) = delete;
     Loaded_Module& operator=(const Loaded_Module&) = delete;
-
-    explicit operator bool() const { return _handle != nullptr; }
 
     template <class F>
     F symbol(const char* name) const {

@@ -5,10 +5,12 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <cctype>
+#include <cstdio>
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
-#include <regex>
-#include <sstream>
+#include <set>
 #include <string>
 #include <thread>
 #include <vector>
@@ -42,8 +44,7 @@ protected:
         close_log();
         log_enable(true);
         setenv("HOME", _saved_home.c_str(), 1);
-        std::string cmd = "rm -rf '" + _home + "'";
-        ASSERT_EQ(0, system(cmd.c_str()));
+        std::filesystem::remove_all(_home);
     }
 
     void configure(const std::string& text) {
@@ -53,21 +54,11 @@ protected:
 
     std::string dir() const { return _home + "/.cimple"; }
 
-    bool exists(const std::string& path) const {
-        struct stat st;
-        return stat(path.c_str(), &st) == 0;
-    }
-
-    std::string messages() const {
-        std::ifstream is(dir() + "/messages");
-        std::stringstream ss;
-        ss << is.rdbuf();
-        return ss.str();
-    }
+    bool exists(const std::string& path) const { return access(path.c_str(), F_OK) == 0; }
 
     std::vector<std::string> lines() const {
         std::vector<std::string> v;
-        std::istringstream is(messages());
+        std::ifstream is(dir() + "/messages");
         for (std::string line; std::getline(is, line);)
             v.push_back(line);
         return v;
@@ -84,6 +75,17 @@ protected:
             names += line.substr(space + 1, colon - space - 1) + " ";
         }
         return names;
+    }
+
+    // Whether a line starts with its "YYYY/MM/DD hh:mm:ss " time stamp.
+    static bool stamped(const std::string& line) {
+        const std::string shape = "dddd/dd/dd dd:dd:dd ";
+        for (size_t i = 0; i < shape.size(); i++) {
+            if (i >= line.size() || (shape[i] == 'd' ? !isdigit(static_cast<unsigned char>(line[i]))
+                                                     : line[i] != shape[i]))
+                return false;
+        }
+        return true;
     }
 
     std::string _home;
@@ -146,24 +148,17 @@ TEST_F(Log_Test, LineFormat) {
     int line = __LINE__ - 1;
     std::vector<std::string> v = lines();
     ASSERT_EQ(1u, v.size());
-    std::regex re(R"(^\d{4}/\d{2}/\d{2} \d{2}:\d{2}:\d{2} WARN: log_test\.cpp\((\d+)\): hello 42 world$)");
-    std::smatch m;
-    ASSERT_TRUE(std::regex_match(v[0], m, re)) << v[0];
-    EXPECT_EQ(std::to_string(line), m[1].str());
+    EXPECT_TRUE(stamped(v[0])) << v[0];
+    EXPECT_EQ("WARN: log_test.cpp(" + std::to_string(line) + "): hello 42 world", v[0].substr(20));
 
     log(LL_ERR, "named.cpp", 7, "%s", "");
     EXPECT_EQ("ERR: named.cpp(7): ", lines()[1].substr(20));
     EXPECT_TRUE(exists(dir() + "/messages.lock"));
-}
 
-TEST_F(Log_Test, ATrailingNewlineIsNotDoubled) {
-    configure("LOG_LEVEL=DBG\n");
+    // A trailing newline is not doubled.
     TVRN_LOG(LL_INFO, "one\n");
     TVRN_LOG(LL_INFO, "two");
-    std::string text = messages();
-    ASSERT_EQ(2u, lines().size());
-    EXPECT_NE(std::string::npos, text.find("one\n20"));
-    EXPECT_EQ("two\n", text.substr(text.size() - 4));
+    EXPECT_EQ(4u, lines().size());
 }
 
 TEST_F(Log_Test, SetLevelByName) {
@@ -173,9 +168,7 @@ TEST_F(Log_Test, SetLevelByName) {
     EXPECT_EQ(-1, log_set_level("verbose"));  // the level stays at INFO
     TVRN_LOG(LL_INFO, "info");
     TVRN_LOG(LL_DBG, "debug");
-    std::vector<std::string> v = lines();
-    ASSERT_EQ(3u, v.size());
-    EXPECT_NE(std::string::npos, v[2].find(" INFO: "));
+    ASSERT_EQ(3u, lines().size());
 
     // A restart reads the configured level again.
     close_log();
@@ -213,19 +206,25 @@ TEST_F(Log_Test, ConcurrentMessagesStayWhole) {
         th.join();
     std::vector<std::string> v = lines();
     ASSERT_EQ(800u, v.size());
-    std::regex re(R"(^.{19} DBG: log_test\.cpp\(\d+\): thread \d message \d+ z{100}$)");
-    for (const std::string& line : v)
-        ASSERT_TRUE(std::regex_match(line, re)) << line;
+    std::set<std::pair<int, int>> seen;
+    for (const std::string& line : v) {
+        int t = -1, i = -1, end = 0;
+        char z[128] = "";
+        ASSERT_TRUE(stamped(line)) << line;
+        sscanf(line.c_str() + 20, "DBG: log_test.cpp(%*d): thread %d message %d %127s%n", &t, &i,
+               z, &end);
+        ASSERT_TRUE(std::string(z) == std::string(100, 'z') && line[20 + end] == 0) << line;
+        seen.insert({t, i});
+    }
+    EXPECT_EQ(800u, seen.size());
 }
 
 TEST_F(Log_Test, FileLock) {
     File_Lock bad((_home + "/missing/dir/lock").c_str());
-    EXPECT_FALSE(bad.okay());
     EXPECT_EQ(-1, bad.lock());
     EXPECT_EQ(-1, bad.unlock());
 
     File_Lock lock((_home + "/lock").c_str());
-    ASSERT_TRUE(lock.okay());
     EXPECT_EQ(0, lock.lock());
     EXPECT_EQ(0, lock.unlock());
     struct stat st;

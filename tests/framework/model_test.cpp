@@ -22,10 +22,9 @@ Test_Base* make_base(const char* id, uint16 number) {
     return b;
 }
 
-Test_Other* make_other(const char* name, uint32 value = 0) {
+Test_Other* make_other(const char* name) {
     Test_Other* o = create<Test_Other>(false);
     o->Name.set(name);
-    o->Value.set(value);
     return o;
 }
 
@@ -39,110 +38,51 @@ Test_Assoc* make_assoc(Test_Base* b, Test_Other* o) {
 
 }  // namespace
 
-//==============================================================================
-// Meta-data look-ups
-//==============================================================================
-
-TEST(Meta, FindClassByNameAndAncestry) {
+TEST(Meta, LookUpsIgnoreCaseAndFollowAncestry) {
     EXPECT_EQ(SUB, find_meta_class(&test_repository, "test_SUB"));
-    EXPECT_EQ(nullptr, find_meta_class(&test_repository, "Test_Missing"));
-    EXPECT_EQ(BASE, find_meta_class(SUB, "TEST_BASE"));     // an ancestor
-    EXPECT_EQ(OTHER, find_meta_class(SUB, "Test_Other"));   // the repository
-    EXPECT_EQ(nullptr, find_meta_class(SUB, "Nothing"));
-}
-
-TEST(Meta, IsSubclass) {
-    EXPECT_TRUE(is_subclass(BASE, SUB));
-    EXPECT_FALSE(is_subclass(SUB, BASE));
-    EXPECT_TRUE(is_subclass(SUB, SUB));
+    EXPECT_EQ(BASE, find_meta_class(SUB, "TEST_BASE"));    // an ancestor
+    EXPECT_EQ(OTHER, find_meta_class(SUB, "Test_Other"));  // the repository
     EXPECT_FALSE(is_subclass(OTHER, BASE));
-    for (size_t i = 0; i < test_repository.num_meta_classes; i++)
-        EXPECT_TRUE(is_subclass(&Instance::static_meta_class, test_repository.meta_classes[i]));
-
+    EXPECT_TRUE(is_subclass(&Instance::static_meta_class, ASSOC));
     EXPECT_EQ(0, is_subclass(&test_repository, "test_base", "Test_Sub"));
     EXPECT_EQ(1, is_subclass(&test_repository, "Test_Sub", "Test_Base"));
     EXPECT_EQ(0, is_subclass(&test_repository, "Instance", "Test_Other"));
     EXPECT_EQ(-1, is_subclass(&test_repository, "Test_Nothing", "Test_Base"));
     EXPECT_EQ(-1, is_subclass(&test_repository, nullptr, "Test_Base"));
-}
 
-TEST(Meta, FindFeatures) {
     EXPECT_EQ(nullptr, find_feature(BASE, "reset", FIND_PROPERTY));
     const Meta_Method* reset = find_method(BASE, "RESET");
-    ASSERT_NE(nullptr, reset);
     EXPECT_EQ(&Test_Base_Reset_method::static_meta_class, reset);
     EXPECT_NE(nullptr, find_parameter(reset, "level"));
-    EXPECT_NE(nullptr, find_parameter(reset, "return_value"));
-    EXPECT_EQ(nullptr, find_reference(reset, "level"));
-
+    EXPECT_EQ(nullptr, find_reference(ASSOC, "Note"));
     // A redeclared feature resolves to the subclass's record.
     EXPECT_NE(find_property(BASE, "Caption"), find_property(SUB, "caption"));
-    EXPECT_EQ(find_property(BASE, "Number"), find_property(SUB, "Number"));
-    EXPECT_NE(nullptr, find_reference(ASSOC, "members"));
-    EXPECT_EQ(nullptr, find_reference(ASSOC, "Note"));
-
-    EXPECT_TRUE(__has_feature(ASSOC, FLAG_REFERENCE));
-    EXPECT_FALSE(__has_feature(BASE, FLAG_REFERENCE));
     EXPECT_TRUE(__has_feature(BASE, FLAG_METHOD | FLAG_REFERENCE));
 }
 
-//==============================================================================
-// Creation, copies and release
-//==============================================================================
-
-TEST(Instance, CreateWithDefaults) {
+TEST(Instance, CreateWithAndWithoutDefaults) {
     Ref<Test_Base> b(create<Test_Base>(true));
-    ASSERT_TRUE(b);
-    EXPECT_EQ(INSTANCE_MAGIC, b->magic);
-    EXPECT_EQ(1u, b->refs);
-    EXPECT_EQ(BASE, b->meta_class);
-    EXPECT_EQ(0u, b->__name_space.size());
-
-    EXPECT_FALSE(b->EnabledState.null);
     EXPECT_EQ(5, b->EnabledState.value);
-    EXPECT_FALSE(b->Caption.null);
     EXPECT_EQ("hello", b->Caption.value);
-    EXPECT_FALSE(b->Codes.null);
     ASSERT_EQ(3u, b->Codes.value.size());
-    EXPECT_EQ(3, b->Codes.value[2]);
     ASSERT_EQ(2u, b->Names.value.size());
     EXPECT_EQ("b", b->Names.value[1]);
-    EXPECT_FALSE(b->Removal.null);
-    EXPECT_EQ(5 * Datetime::MIN, b->Removal.value.usec());
-    EXPECT_TRUE(b->Removal.value.is_interval());
-
-    // Properties without a default are null.
-    EXPECT_TRUE(b->InstanceID.null);
-    EXPECT_TRUE(b->ElementName.null);
-    EXPECT_TRUE(b->Flag.null);
-    EXPECT_TRUE(b->Install.null);
+    EXPECT_EQ(Datetime(5 * Datetime::MIN), b->Removal.value);
+    EXPECT_TRUE(b->InstanceID.null);  // no default: null
     EXPECT_TRUE(b->Counts.null);
-    EXPECT_EQ(8u, b->Counts.value.capacity());
 
     Ref<Test_Sub> s(create<Test_Sub>(true));
     EXPECT_EQ("sub", s->Caption.value);  // the subclass's own default
     EXPECT_TRUE(s->Extra.null);
-}
 
-TEST(Instance, CreateWithoutDefaults) {
-    Ref<Test_Base> b(create<Test_Base>(false));
-    EXPECT_FALSE(b->InstanceID.null);
-    EXPECT_TRUE(b->InstanceID.value.__is_static_empty());
-    EXPECT_FALSE(b->EnabledState.null);
-    EXPECT_EQ(0, b->EnabledState.value);
-    EXPECT_FALSE(b->Caption.null);
-    EXPECT_EQ("", b->Caption.value);
-    EXPECT_FALSE(b->Codes.null);
-    EXPECT_EQ(0u, b->Codes.value.size());
-    EXPECT_FALSE(b->Removal.null);
-    EXPECT_EQ(Datetime(), b->Removal.value);
-    EXPECT_FALSE(b->Ratio.null);
-    EXPECT_EQ(0.0, b->Ratio.value);
-
+    // Without defaults: every slot empty but not null.
+    Ref<Test_Base> e(create<Test_Base>(false));
+    EXPECT_FALSE(e->InstanceID.null);
+    EXPECT_EQ(0, e->EnabledState.value);
+    EXPECT_EQ(0u, e->Codes.value.size());
+    EXPECT_EQ(Datetime(), e->Removal.value);
     Ref<Test_Assoc> a(create<Test_Assoc>(false));
-    EXPECT_EQ(nullptr, a->Antecedent);
     EXPECT_FALSE(a->Members.null);
-    EXPECT_EQ(0u, a->Members.value.size());
 
     EXPECT_EQ(nullptr, create(static_cast<const Meta_Class*>(nullptr), true));
 }
@@ -151,11 +91,7 @@ TEST(Instance, CreateParameterRecord) {
     Instance* p = create(&Test_Base_Reset_method::static_meta_class);
     ASSERT_NE(nullptr, p);
     Test_Base_Reset_method* m = static_cast<Test_Base_Reset_method*>(p);
-    EXPECT_EQ(reinterpret_cast<const Meta_Class*>(&Test_Base_Reset_method::static_meta_class),
-              m->meta_class);
-    EXPECT_FALSE(m->Level.null);
     EXPECT_FALSE(m->return_value.null);
-    EXPECT_EQ(0u, m->return_value.value);
     // Operations that walk superclasses stop at a method record.
     EXPECT_EQ(nullptr, super_meta_class_of(m->meta_class));
     EXPECT_TRUE(key_eq(p, p));
@@ -178,7 +114,6 @@ TEST(Instance, CloneIsDeep) {
 
     Ref<Test_Assoc> c(clone(a.ptr()));
     ASSERT_TRUE(c);
-    EXPECT_EQ(1u, c->refs);
     EXPECT_TRUE(identical(a.ptr(), c.ptr()));
     EXPECT_NE(a->Antecedent, c->Antecedent);
     EXPECT_NE(a->Members.value[0], c->Members.value[0]);
@@ -202,9 +137,6 @@ TEST(Instance, ReleasingAnInstanceReleasesWhatItRefersTo) {
     a->Members.value.append(shared);
     EXPECT_EQ(3u, shared->refs);
 
-    ref(a);
-    unref(a);  // not the last reference
-    EXPECT_EQ(3u, shared->refs);
     unref(a);  // the last: releases the base, the members and shared twice
     EXPECT_EQ(1u, shared->refs);
     EXPECT_EQ(INSTANCE_MAGIC, shared->magic);
@@ -221,15 +153,12 @@ TEST(Instance, RefHandles) {
     {
         Ref<Test_Other> r1(o);  // takes over the creator's reference
         Ref<Test_Other> r2(r1);
-        EXPECT_EQ(2u, o->refs);
         r2 = r1;  // same target: nothing changes
         EXPECT_EQ(2u, o->refs);
         Ref<Test_Other> r3(make_other("p"));
         r2 = r3;
         EXPECT_EQ(1u, o->refs);
         EXPECT_EQ(2u, r3->refs);
-        r3.reset();
-        EXPECT_FALSE(r3);
         ref(o);
         Test_Other* stolen = r1.steal();
         EXPECT_EQ(o, stolen);
@@ -240,39 +169,32 @@ TEST(Instance, RefHandles) {
     unref(o);
 }
 
-//==============================================================================
-// Comparison
-//==============================================================================
-
 TEST(Compare, KeyEqualityAgainstFullEquality) {
     Ref<Test_Base> a(make_base("x", 1));
     Ref<Test_Base> b(make_base("x", 1));
-    EXPECT_TRUE(key_eq(a.ptr(), b.ptr()));
     EXPECT_TRUE(identical(a.ptr(), b.ptr()));
-
-    b->ElementName.set("differs");
-    EXPECT_TRUE(key_eq(a.ptr(), b.ptr()));
-    EXPECT_FALSE(identical(a.ptr(), b.ptr()));
-
-    b->ElementName = a->ElementName;
     b->__name_space = "other";
     EXPECT_TRUE(key_eq(a.ptr(), b.ptr()));
     EXPECT_FALSE(identical(a.ptr(), b.ptr()));
-
     b->Number.value = 2;
     EXPECT_FALSE(key_eq(a.ptr(), b.ptr()));
 
     // A subclass instance with the same keys.
     Ref<Test_Sub> s(create<Test_Sub>(false));
     s->InstanceID.set("x");
-    s->Number.set(1);
-    EXPECT_TRUE(key_eq(a.ptr(), s.ptr()));
-    EXPECT_TRUE(key_eq(s.ptr(), a.ptr()));
-    EXPECT_FALSE(identical(a.ptr(), s.ptr()));
+    s->Number.set(2);
+    EXPECT_TRUE(key_eq(s.ptr(), b.ptr()));
+    EXPECT_FALSE(identical(b.ptr(), s.ptr()));
 
     // Classes without the keys of the first never match.
     Ref<Test_Other> o(make_other("x"));
     EXPECT_FALSE(key_eq(a.ptr(), o.ptr()));
+
+    // Keyless classes: all instances have the same (no) keys.
+    Ref<Instance> k1(create(&Test_Keyless::static_meta_class, false));
+    Ref<Instance> k2(create(&Test_Keyless::static_meta_class, true));
+    EXPECT_TRUE(key_eq(k1.ptr(), k2.ptr()));
+    EXPECT_FALSE(identical(k1.ptr(), k2.ptr()));
 }
 
 TEST(Compare, NullKeysAndNullProperties) {
@@ -297,7 +219,6 @@ TEST(Compare, ReferenceKeys) {
 
     b->Antecedent = make_base("b", 1);
     EXPECT_FALSE(key_eq(a.ptr(), b.ptr()));  // one null
-    EXPECT_FALSE(key_eq(b.ptr(), a.ptr()));
 
     a->Antecedent = make_base("b", 1);
     a->Antecedent->ElementName.set("not a key");
@@ -306,25 +227,13 @@ TEST(Compare, ReferenceKeys) {
 
     // Reference arrays are not keys but count for full equality.
     a->Antecedent->ElementName = b->Antecedent->ElementName;
-    EXPECT_TRUE(identical(a.ptr(), b.ptr()));
     a->Members.value.append(make_other("m"));
-    EXPECT_TRUE(key_eq(a.ptr(), b.ptr()));
     EXPECT_FALSE(identical(a.ptr(), b.ptr()));
     b->Members.value.append(make_other("m"));
     EXPECT_TRUE(identical(a.ptr(), b.ptr()));
 }
 
-TEST(Compare, ClassWithoutKeys) {
-    Ref<Instance> a(create(&Test_Keyless::static_meta_class, false));
-    Ref<Instance> b(create(&Test_Keyless::static_meta_class, true));
-    EXPECT_TRUE(key_eq(a.ptr(), b.ptr()));
-    EXPECT_FALSE(identical(a.ptr(), b.ptr()));
-}
-
-//==============================================================================
-// Property selection and name spaces
-//==============================================================================
-
+// Method names fail; non-key references named in the list are filled.
 TEST(Filter, ListMarksOnlyTheNamedProperties) {
     Ref<Test_Base> b(create<Test_Base>(false));
     b->Number.null = true;
@@ -333,9 +242,7 @@ TEST(Filter, ListMarksOnlyTheNamedProperties) {
     EXPECT_FALSE(b->InstanceID.null);  // keys as they were
     EXPECT_TRUE(b->Number.null);
     EXPECT_FALSE(b->ElementName.null);
-    EXPECT_TRUE(b->EnabledState.null);
     EXPECT_TRUE(b->Codes.null);
-    EXPECT_TRUE(b->Install.null);
 
     const char* with_key[] = {"InstanceID", "caption", nullptr};
     EXPECT_EQ(0, filter_properties(b.ptr(), with_key, false));
@@ -345,12 +252,8 @@ TEST(Filter, ListMarksOnlyTheNamedProperties) {
 
     EXPECT_EQ(0, filter_properties(b.ptr(), nullptr, false));
     EXPECT_FALSE(b->InstanceID.null);
-    EXPECT_FALSE(b->Number.null);
     EXPECT_FALSE(b->Codes.null);
-}
 
-TEST(Filter, MethodNamesFailAndReferencesAreFilled) {
-    Ref<Test_Base> b(create<Test_Base>(false));
     const char* method[] = {"ElementName", "Reset", nullptr};
     EXPECT_EQ(-1, filter_properties(b.ptr(), method, true));
 
@@ -359,7 +262,6 @@ TEST(Filter, MethodNamesFailAndReferencesAreFilled) {
     const char* none[] = {nullptr};
     EXPECT_EQ(0, filter_properties(a.ptr(), none, true));
     EXPECT_TRUE(a->Members.null);
-    EXPECT_TRUE(a->Note.null);
     EXPECT_EQ(0, filter_properties(a.ptr(), refs, true));
     ASSERT_NE(nullptr, a->Owner);  // an empty instance of its class
     EXPECT_EQ(OTHER, a->Owner->meta_class);
@@ -380,14 +282,9 @@ TEST(NameSpace, SetRecursivelyWithoutOverridingUnlessForced) {
     EXPECT_EQ("root/test", a->Members.value[0]->__name_space);
 
     __set_name_space_recursive(a.ptr(), "root/forced", true);
-    EXPECT_EQ("root/forced", a->__name_space);
     EXPECT_EQ("root/forced", a->Dependent->__name_space);
     EXPECT_EQ("root/forced", a->Members.value[0]->__name_space);
 }
-
-//==============================================================================
-// Object paths
-//==============================================================================
 
 TEST(ModelPath, KeysInMetaDataOrder) {
     Ref<Test_Sub> s(create<Test_Sub>(true));
@@ -407,11 +304,9 @@ TEST(ModelPath, KeysInMetaDataOrder) {
     ASSERT_EQ(0, instance_to_model_path(t.ptr(), path));
     EXPECT_EQ("Test_Typed.B=true,U8=200,S64=-5,C='z',When=00000000000000.000001:000,R=1.500000",
               path);
-}
 
-TEST(ModelPath, NestedReferencesAreQuotedAndEscaped) {
+    // Nested references are quoted and escaped.
     Ref<Test_Assoc> a(make_assoc(make_base("b1", 3), make_other("o1")));
-    String path;
     ASSERT_EQ(0, instance_to_model_path(a.ptr(), path));
     EXPECT_EQ(
         "Test_Assoc.Antecedent=\"Test_Base.InstanceID=\\\"b1\\\",Number=3\","
@@ -439,28 +334,18 @@ TEST(ModelPath, Failures) {
     EXPECT_EQ("unchanged", path);
 }
 
-//==============================================================================
-// Associations
-//==============================================================================
-
-TEST(Association, IsReferenceOf) {
-    Ref<Test_Assoc> a(make_assoc(make_base("b", 1), make_other("o")));
-    Ref<Test_Base> source(make_base("b", 1));
-    Ref<Test_Base> stranger(make_base("c", 1));
-    EXPECT_TRUE(is_reference_of(source.ptr(), a.ptr(), nullptr));
-    EXPECT_TRUE(is_reference_of(source.ptr(), a.ptr(), ""));
-    EXPECT_TRUE(is_reference_of(source.ptr(), a.ptr(), "antecedent"));
-    EXPECT_FALSE(is_reference_of(source.ptr(), a.ptr(), "Dependent"));
-    EXPECT_FALSE(is_reference_of(stranger.ptr(), a.ptr(), nullptr));
-}
-
-TEST(Association, GetAssociators) {
+TEST(Association, ReferencesAndAssociators) {
     Ref<Test_Assoc> a(make_assoc(make_base("b", 1), make_other("o")));
     a->Owner = make_other("owner");
     a->Members.value.append(make_other("member"));  // arrays are not ends
     Ref<Test_Sub> source(create<Test_Sub>(false));   // a subclass with the same keys
     source->InstanceID.set("b");
     source->Number.set(1);
+    Ref<Test_Base> stranger(make_base("c", 1));
+    EXPECT_TRUE(is_reference_of(source.ptr(), a.ptr(), ""));
+    EXPECT_TRUE(is_reference_of(source.ptr(), a.ptr(), "antecedent"));
+    EXPECT_FALSE(is_reference_of(source.ptr(), a.ptr(), "Dependent"));
+    EXPECT_FALSE(is_reference_of(stranger.ptr(), a.ptr(), nullptr));
 
     const Instance* out[8];
     const struct {
@@ -468,7 +353,6 @@ TEST(Association, GetAssociators) {
         int n;
         const Instance* first;
     } cases[] = {
-        {nullptr, nullptr, nullptr, 2, a->Dependent},
         {"", "", "", 2, a->Dependent},
         {nullptr, "Antecedent", nullptr, 2, a->Dependent},
         {nullptr, "Dependent", nullptr, -1, nullptr},
@@ -490,26 +374,8 @@ TEST(Association, GetAssociators) {
     ASSERT_EQ(2, get_associators(o.ptr(), a.ptr(), nullptr, "Dependent", nullptr, out));
     EXPECT_EQ(a->Antecedent, out[0]);
     EXPECT_EQ(a->Owner, out[1]);  // same class, other keys: an associated object
-    Ref<Test_Other> stranger(make_other("nobody"));
-    EXPECT_EQ(-1, get_associators(stranger.ptr(), a.ptr(), nullptr, nullptr, nullptr, out));
-}
-
-//==============================================================================
-// Value
-//==============================================================================
-
-TEST(Value, TagsOfFeatures) {
-    Value v;
-    EXPECT_EQ(Value::NONE, v.type());
-    EXPECT_FALSE(v.null());
-    v.clear();
-    EXPECT_TRUE(v.null());
-
-    EXPECT_EQ(Value::STRING, type_of(reinterpret_cast<const Meta_Feature*>(find_property(BASE, "Caption"))));
-    EXPECT_EQ(Value::UINT16_ARRAY, type_of(reinterpret_cast<const Meta_Feature*>(find_property(BASE, "Codes"))));
-    EXPECT_EQ(Value::INSTANCE, type_of(find_feature(ASSOC, "Owner")));
-    EXPECT_EQ(Value::INSTANCE_ARRAY, type_of(find_feature(ASSOC, "Members")));
-    EXPECT_EQ(Value::NONE, type_of(find_feature(BASE, "Reset")));
+    Ref<Test_Other> nobody(make_other("nobody"));
+    EXPECT_EQ(-1, get_associators(nobody.ptr(), a.ptr(), nullptr, nullptr, nullptr, out));
 }
 
 namespace {
@@ -520,48 +386,37 @@ void check_round_trip(const T& x, Value::Type tag) {
     v.set_value(x);
     EXPECT_EQ(tag, v.type());
     EXPECT_FALSE(v.null());
-    T y{};
-    EXPECT_EQ(0, v.get_value(y));
-    EXPECT_TRUE(y == x);
     Value copy(v);
-    T z{};
-    EXPECT_EQ(0, copy.get_value(z));
-    EXPECT_TRUE(z == x);
+    T y{};
+    EXPECT_EQ(0, copy.get_value(y));
+    EXPECT_TRUE(y == x);
 }
 
 }  // namespace
 
-TEST(Value, SetAndGetEveryKindOfValue) {
-    // The widest and narrowest integers, and the other kinds of scalar.
-    check_round_trip<boolean>(true, Value::BOOLEAN);
+TEST(Value, SetAndGetTheExactType) {
     check_round_trip<sint8>(-100, Value::SINT8);
     check_round_trip<uint64>(18000000000000000000ull, Value::UINT64);
-    check_round_trip<sint64>(-9000000000000000000ll, Value::SINT64);
-    check_round_trip<real32>(1.25f, Value::REAL32);
     check_round_trip<char16>(char16(0x263A), Value::CHAR16);
-    check_round_trip<String>(String("text"), Value::STRING);
     check_round_trip<Datetime>(Datetime(42, -60), Value::DATETIME);
-    const uint16 u[] = {1, 2};
-    check_round_trip(Array<uint16>(u, 2), Value::UINT16_ARRAY);
     const String s[] = {"a", "b"};
     check_round_trip(Array<String>(s, 2), Value::STRING_ARRAY);
 
     Value v;
     v.set_value("chars");
     EXPECT_EQ(Value::STRING, v.type());
-}
-
-TEST(Value, GetValueNeedsTheExactType) {
-    Value v;
     v.set_value(uint32(7));
-    String s("unchanged");
-    EXPECT_EQ(-1, v.get_value(s));
-    EXPECT_EQ("unchanged", s);
     uint64 wide = 99;
     EXPECT_EQ(-1, v.get_value(wide));
     EXPECT_EQ(99u, wide);
     Array<uint32> a;
     EXPECT_EQ(-1, v.get_value(a));
+    v.clear();
+    EXPECT_TRUE(v.null());
+
+    EXPECT_EQ(Value::UINT16_ARRAY, type_of(find_feature(BASE, "Codes")));
+    EXPECT_EQ(Value::INSTANCE_ARRAY, type_of(find_feature(ASSOC, "Members")));
+    EXPECT_EQ(Value::NONE, type_of(find_feature(BASE, "Reset")));
 }
 
 TEST(Value, InstanceArraysOwnOneReferencePerElement) {
@@ -577,11 +432,9 @@ TEST(Value, InstanceArraysOwnOneReferencePerElement) {
         EXPECT_EQ(2u, arr[i]->refs);
     {
         Value w(v);
-        for (size_t i = 0; i < 3; i++)
-            EXPECT_EQ(3u, arr[i]->refs);
         Value x;
         x = w;
-        EXPECT_EQ(4u, arr[0]->refs);
+        EXPECT_EQ(4u, arr[2]->refs);
     }
     v.clear();
     for (size_t i = 0; i < 3; i++) {
@@ -611,7 +464,6 @@ TEST(Value, StoringIntoSlots) {
     EXPECT_TRUE(b->Number.null);
     EXPECT_EQ(0, v.get(b.ptr(), caption));
     EXPECT_EQ("shared", b->Caption.value);
-    EXPECT_FALSE(b->Caption.null);
 
     v.set_value(uint16(12));
     v.null(true);
@@ -622,7 +474,6 @@ TEST(Value, StoringIntoSlots) {
     const uint16 u[] = {4, 5, 6, 7};
     v.set_value(Array<uint16>(u, 4));
     EXPECT_EQ(0, v.get(b.ptr(), codes));
-    EXPECT_EQ(4u, b->Codes.value.size());
     EXPECT_EQ(7, b->Codes.value[3]);
 
     // And back out, with the slot's null flag.

@@ -42,10 +42,6 @@ PROP(Test_Base, Caption, STRING, 0, 0, MV(_caption));
 PROP(Test_Base, Codes, UINT16, -1, 0, MV(_codes));
 PROP(Test_Base, Names, STRING, -1, 0, MV(_names));
 PROP(Test_Base, Removal, DATETIME, 0, 0, MV(_removal));
-PROP(Test_Base, Flag, BOOLEAN, 0, 0, nullptr);
-PROP(Test_Base, Ratio, REAL64, 0, 0, nullptr);
-PROP(Test_Base, Initial, CHAR16, 0, 0, nullptr);
-PROP(Test_Base, Install, DATETIME, 0, 0, nullptr);
 PROP(Test_Base, Counts, SINT64, -1, 0, nullptr);
 
 PROP(Test_Base_Reset_method, Level, UINT16, 0, FLAG_IN, nullptr);
@@ -67,12 +63,10 @@ namespace {
 const Meta_Feature* const Test_Base_features[] = {
     MF(Test_Base_InstanceID), MF(Test_Base_Number),  MF(Test_Base_ElementName),
     MF(Test_Base_EnabledState), MF(Test_Base_Caption), MF(Test_Base_Codes),
-    MF(Test_Base_Names),      MF(Test_Base_Removal), MF(Test_Base_Flag),
-    MF(Test_Base_Ratio),      MF(Test_Base_Initial), MF(Test_Base_Install),
-    MF(Test_Base_Counts),     MF(Test_Base_Reset_method::static_meta_class),
+    MF(Test_Base_Names),      MF(Test_Base_Removal), MF(Test_Base_Counts),
+    MF(Test_Base_Reset_method::static_meta_class),
 };
-const bool Test_Base_locals[] = {true, true, true, true, true, true, true,
-                                 true, true, true, true, true, true, true};
+const bool Test_Base_locals[] = {true, true, true, true, true, true, true, true, true, true};
 
 // Test_Sub redeclares Caption with its own default and adds Extra.
 PROP(Test_Sub, Caption, STRING, 0, 0, MV(_sub_caption));
@@ -81,18 +75,15 @@ PROP(Test_Sub, Extra, UINT32, 0, 0, nullptr);
 const Meta_Feature* const Test_Sub_features[] = {
     MF(Test_Base_InstanceID), MF(Test_Base_Number),  MF(Test_Base_ElementName),
     MF(Test_Base_EnabledState), MF(Test_Sub_Caption), MF(Test_Base_Codes),
-    MF(Test_Base_Names),      MF(Test_Base_Removal), MF(Test_Base_Flag),
-    MF(Test_Base_Ratio),      MF(Test_Base_Initial), MF(Test_Base_Install),
-    MF(Test_Base_Counts),     MF(Test_Base_Reset_method::static_meta_class),
-    MF(Test_Sub_Extra),
+    MF(Test_Base_Names),      MF(Test_Base_Removal), MF(Test_Base_Counts),
+    MF(Test_Base_Reset_method::static_meta_class), MF(Test_Sub_Extra),
 };
-const bool Test_Sub_locals[] = {false, false, false, false, true,  false, false, false,
-                                false, false, false, false, false, false, true};
+const bool Test_Sub_locals[] = {false, false, false, false, true, false,
+                                false, false, false, false, true};
 
 PROP(Test_Other, Name, STRING, 0, FLAG_KEY, nullptr);
-PROP(Test_Other, Value, UINT32, 0, 0, nullptr);
-const Meta_Feature* const Test_Other_features[] = {MF(Test_Other_Name), MF(Test_Other_Value)};
-const bool Test_Other_locals[] = {true, true};
+const Meta_Feature* const Test_Other_features[] = {MF(Test_Other_Name)};
+const bool Test_Other_locals[] = {true};
 
 REF(Test_Assoc, Antecedent, 0, FLAG_KEY, Test_Base);
 REF(Test_Assoc, Dependent, 0, FLAG_KEY, Test_Other);

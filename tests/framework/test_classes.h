@@ -1,15 +1,5 @@
-// Small hand-written classes for the model tests, laid out the way the
-// generated class types are: the Instance header, then one slot per feature.
-//
-//   Test_Base    keys InstanceID (string), Number (uint16); defaults on some
-//                properties; method Reset(Level) -> uint32
-//   Test_Sub     Test_Base plus Extra (uint32)
-//   Test_Other   key Name (string), property Value (uint32)
-//   Test_Assoc   association: keys Antecedent -> Test_Base, Dependent ->
-//                Test_Other; Owner -> Test_Other; reference array Members ->
-//                Test_Other; Note
-//   Test_Typed   one key of each kind of scalar written into object paths
-//   Test_Keyless no keys
+// Hand-written classes for the model tests, laid out the way the generated
+// class types are: the Instance header, then one slot per feature.
 #ifndef TVRN_TESTS_FRAMEWORK_TEST_CLASSES_H
 #define TVRN_TESTS_FRAMEWORK_TEST_CLASSES_H
 
@@ -27,10 +17,6 @@ struct Test_Base : public Instance {
     Property<Array<uint16>> Codes;  // default {1, 2, 3}
     Property<Array<String>> Names;  // default {"a", "b"}
     Property<Datetime> Removal;     // default five minutes
-    Property<boolean> Flag;
-    Property<real64> Ratio;
-    Property<char16> Initial;
-    Property<Datetime> Install;
     Property<Array<sint64>> Counts;
 
     static const Meta_Class static_meta_class;
@@ -43,7 +29,7 @@ struct Test_Base_Reset_method : public Instance {
     static const Meta_Method static_meta_class;
 };
 
-struct Test_Sub : public Test_Base {
+struct Test_Sub : public Test_Base {  // with its own default for Caption
     Property<uint32> Extra;
 
     static const Meta_Class static_meta_class;
@@ -51,7 +37,6 @@ struct Test_Sub : public Test_Base {
 
 struct Test_Other : public Instance {
     Property<String> Name;
-    Property<uint32> Value;
 
     static const Meta_Class static_meta_class;
 };
@@ -66,7 +51,7 @@ struct Test_Assoc : public Instance {
     static const Meta_Class static_meta_class;
 };
 
-struct Test_Typed : public Instance {
+struct Test_Typed : public Instance {  // keys of each kind of scalar
     Property<boolean> B;
     Property<uint8> U8;
     Property<sint64> S64;

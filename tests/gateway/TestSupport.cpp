@@ -66,11 +66,8 @@ void LogCapture::mark() {
 }
 
 std::string LogCapture::text() const {
-    std::ifstream in(_file, std::ios::binary);
-    in.seekg(_mark);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
+    const std::string all = readFile(_file);
+    return all.substr(std::min<size_t>(size_t(_mark), all.size()));
 }
 
 std::vector<std::string> LogCapture::lines() const {
@@ -156,35 +153,27 @@ void* SimLibrary::resolve(const char* name) const {
 
 // The control function `name` of the loaded copy, with its declared type.
 #define SIM_CONTROL(name) reinterpret_cast<decltype(&::name)>(resolve(#name))
+// Throws with the simulator's reason when `rc` is not 0.
+#define SIM_CHECK(rc, what) \
+    if ((rc) != 0)          \
+        throw std::runtime_error(std::string(what) + SIM_CONTROL(tvrn_sim_last_error)());
 
-void SimLibrary::reset() {
-    if (SIM_CONTROL(tvrn_sim_reset)() != 0)
-        throw std::runtime_error(std::string("simulator reset: ") + SIM_CONTROL(tvrn_sim_last_error)());
-}
-
+void SimLibrary::reset() { SIM_CHECK(SIM_CONTROL(tvrn_sim_reset)(), "simulator reset: ") }
 void SimLibrary::loadFixture(const char* nameOrPath) {
-    if (SIM_CONTROL(tvrn_sim_load_fixture)(nameOrPath) != 0)
-        throw std::runtime_error(std::string("simulator fixture: ") + SIM_CONTROL(tvrn_sim_last_error)());
+    SIM_CHECK(SIM_CONTROL(tvrn_sim_load_fixture)(nameOrPath), "simulator fixture: ")
 }
-
 void SimLibrary::loadFixtureText(const std::string& json) {
-    if (SIM_CONTROL(tvrn_sim_load_fixture_text)(json.c_str()) != 0)
-        throw std::runtime_error(std::string("simulator fixture: ") + SIM_CONTROL(tvrn_sim_last_error)());
+    SIM_CHECK(SIM_CONTROL(tvrn_sim_load_fixture_text)(json.c_str()), "simulator fixture: ")
 }
-
 void SimLibrary::setVersion(const char* version) { SIM_CONTROL(tvrn_sim_set_version)(version); }
-
 void SimLibrary::setInitResult(int result) { SIM_CONTROL(tvrn_sim_set_init_result)(result); }
-
 void SimLibrary::setFault(const char* entry, const char* key, int kind, int code, const char* text, int times) {
-    if (SIM_CONTROL(tvrn_sim_set_fault)(entry, key, kind, code, text, times) != 0)
-        throw std::runtime_error(std::string("simulator refused a fault for ") + entry);
+    SIM_CHECK(SIM_CONTROL(tvrn_sim_set_fault)(entry, key, kind, code, text, times), std::string("simulator refused a fault for ") + entry + ": ")
 }
-
 unsigned long long SimLibrary::calls(const char* entry) const { return SIM_CONTROL(tvrn_sim_call_count)(entry); }
-
 Json::Value SimLibrary::recorded() const { return parseJson(SIM_CONTROL(tvrn_sim_recorded_calls)()); }
 
+#undef SIM_CHECK
 #undef SIM_CONTROL
 
 std::vector<std::string> SimLibrary::entriesCalled() const {

@@ -15,7 +15,6 @@ TEST(NoLibrary, StartsWithFallbacksAndFindsNothing) {
     ProviderInit::driverStatus = -1;
     {
         ProviderInit init;
-        EXPECT_FALSE(gTfajLibLoaded);
         EXPECT_EQ(libHandle, nullptr);
         EXPECT_EQ(ProviderInit::getDriverStatus(), 1);
         EXPECT_TRUE(log.has("DBG", "Error in loading library: libdtfaj.so: cannot open shared object file"))
@@ -27,7 +26,7 @@ TEST(NoLibrary, StartsWithFallbacksAndFindsNothing) {
 #define ENTRY_POINT(kind, symbol, pointer) fallbacks += pointer == TVRN_EP_DEFAULT_##kind;
 #include "gateway/EntryPoints.def"
 #undef ENTRY_POINT
-        EXPECT_EQ(fallbacks, 117);
+        EXPECT_EQ(fallbacks, kEntryPointCount);
         EXPECT_TRUE(libGetPortByWwn(Json::Value(Json::objectValue)).isNull());
         EXPECT_EQ(libGetRequestID(), -1);
         EXPECT_EQ(libGetNumOfAdapters(), 65535u);
@@ -37,9 +36,7 @@ TEST(NoLibrary, StartsWithFallbacksAndFindsNothing) {
         Json::Value list;
         EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), -1);
         EXPECT_STREQ(ProviderUtil::getAdapterSerialNumber("1000000533a0b1c2").c_str(), "");
-        EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-K7M"));
         EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");
-        EXPECT_EQ(ProviderUtil::getAdapterId("1000000533a0b1c2"), -1);
         log.mark();
     }
     EXPECT_TRUE(log.has("DBG", "Inside ProviderInit Destructor."));

@@ -47,13 +47,10 @@ TEST(SmallHelpers, TrimAndUtf8Lead) {
     ProviderUtil::trimString(nullptr, out);
     EXPECT_STREQ(out, "");
 
-    EXPECT_TRUE(ProviderUtil::valid_UTF_string("\x7f"));
-    EXPECT_FALSE(ProviderUtil::valid_UTF_string("\x80"));
-    EXPECT_FALSE(ProviderUtil::valid_UTF_string("\xc1"));
-    EXPECT_TRUE(ProviderUtil::valid_UTF_string("\xc2\xa9"));
-    EXPECT_TRUE(ProviderUtil::valid_UTF_string("\xf4"));
-    EXPECT_FALSE(ProviderUtil::valid_UTF_string("\xf5"));
-    EXPECT_FALSE(ProviderUtil::valid_UTF_string(nullptr));
+    for (const char* good : {"\x7f", "\xc2\xa9", "\xf4"})
+        EXPECT_TRUE(ProviderUtil::valid_UTF_string(good)) << good;
+    for (const char* bad : {"\x80", "\xc1", "\xf5", static_cast<const char*>(nullptr)})
+        EXPECT_FALSE(ProviderUtil::valid_UTF_string(bad));
 }
 
 void fakeProcess(const ScratchDir& root, const std::string& pid, const std::string& comm, char state) {
@@ -114,9 +111,8 @@ TEST(EthDeviceName, ThroughTheInventoryHook) {
 
     ProviderUtil::setEthPortDetailsHook(portRecord);
     EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC("00:05:33:aa:bb:cc").c_str(), "eth4");
-    EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC("missing").c_str(), "");
-    EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC("num").c_str(), "");
-    EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC("throw").c_str(), "");
+    for (const char* failing : {"missing", "num", "throw"})
+        EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC(failing).c_str(), "") << failing;
     EXPECT_TRUE(log.has("ERR", "throw - getEthPortDetails got std exception: inventory broke"));
     ProviderUtil::setEthPortDetailsHook(nullptr);
 }

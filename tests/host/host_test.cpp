@@ -9,15 +9,6 @@ namespace {
 
 using Requests = HostFixture;
 
-std::vector<std::string> texts(const std::vector<ObjectPath> &paths)
-{
-    std::vector<std::string> r;
-    for (const auto &p : paths)
-        r.push_back(p.toString());
-    std::sort(r.begin(), r.end());
-    return r;
-}
-
 TEST_F(Requests, EnumeratesInstancesWithTypedProperties)
 {
     auto r = host->enumerateInstances(kNs, "Test_Widget");
@@ -56,10 +47,8 @@ TEST_F(Requests, NamesGetAndNotFound)
 {
     auto n = host->enumerateInstanceNames(kNs, "Test_Widget");
     ASSERT_TRUE(n.ok());
-    EXPECT_EQ(texts(n.items),
-              (std::vector<std::string>{"root/test:Test_Widget.Id=\"w1\"",
-                                        "root/test:Test_Widget.Id=\"w2\"",
-                                        "root/test:Test_Widget.Id=\"w3\""}));
+    ASSERT_EQ(n.items.size(), 3u);
+    EXPECT_EQ(n.items[2], path("Test_Widget.Id=\"w3\""));
     auto g = host->getInstance(path("Test_Widget.Id=\"w3\""));
     ASSERT_TRUE(g.ok());
     EXPECT_EQ(*g.instance.get("Size"), Value::uint16(30));
@@ -81,11 +70,7 @@ TEST_F(Requests, ReferencesCarryReferenceKeys)
     auto names = host->referenceNames(path("Test_Widget.Id=\"w2\""));
     ASSERT_TRUE(names.ok());
     ASSERT_EQ(names.items.size(), 1u);
-    EXPECT_EQ(names.items[0].toString(),
-              "root/test:Test_WidgetGadget.Gadget=\"root/test:Test_Gadget.Name=\\\"g1\\\"\","
-              "Widget=\"root/test:Test_Widget.Id=\\\"w2\\\"\"");
-    // A path printed by the host reads back as the same path.
-    EXPECT_EQ(ObjectPath::parse(names.items[0].toString()), names.items[0]);
+    EXPECT_EQ(*names.items[0].key("Widget"), Value::reference(path("Test_Widget.Id=\"w2\"")));
 }
 
 TEST_F(Requests, MethodArgumentsRoundTripEveryKindOfValue)
@@ -137,6 +122,8 @@ TEST_F(Requests, FailuresReportCodeAndMessage)
     EXPECT_EQ(host->invokeMethod(path("Test_Gadget.Name=\"g1\""), "Echo").rc,
               CMPI_RC_ERR_NOT_SUPPORTED);  // no method provider for the class
     EXPECT_EQ(host->enumerateInstances(kNs, "Test_Unknown").rc, CMPI_RC_ERR_INVALID_CLASS);
+    EXPECT_EQ(host->subscribe(kNs, "Test_Widget").rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    EXPECT_EQ(host->subscribe(kNs, "Test_Nothing").rc, CMPI_RC_ERR_INVALID_CLASS);
     EXPECT_EQ(host->getInstance(path("root/none:Test_Widget.Id=\"w1\"")).rc,
               CMPI_RC_ERR_INVALID_NAMESPACE);
     auto missing = host->enumerateInstances(kNs, "Test_Missing");
@@ -183,12 +170,9 @@ TEST_F(Requests, StoreAssociationsAreTraversed)
     EXPECT_TRUE(host->references(path("Test_Widget.Id=\"w3\""), "Test_Owns", "Owner").items.empty());
 }
 
-// ---------------------------------------------------------------------------
-// Release rules
-// ---------------------------------------------------------------------------
 using ReleaseRules = HostFixture;
 
-TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEnds)
+TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEndsClonesOutliveIt)
 {
     const ObjectPath w1 = path("Test_Widget.Id=\"w1\"");
     ASSERT_TRUE(host->enumerateInstances(kNs, "Test_Widget").ok());  // MIs created
@@ -200,13 +184,7 @@ TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEnds)
     EXPECT_TRUE(host->invokeMethod(w1, "CountGadgets").ok());
     EXPECT_TRUE(host->invokeMethod(w1, "ReadManager").ok());
     EXPECT_EQ(Host::liveObjects(), before);
-}
 
-TEST_F(ReleaseRules, ClonesOutliveTheirRequest)
-{
-    const ObjectPath w1 = path("Test_Widget.Id=\"w1\"");
-    ASSERT_TRUE(host->invokeMethod(w1, "WhoAmI").ok());
-    const size_t before = Host::liveObjects();
     ASSERT_TRUE(host->invokeMethod(w1, "KeepClone").ok());
     EXPECT_EQ(Host::liveObjects(), before + 1);
     auto used = host->invokeMethod(w1, "UseClone");  // reads it in a later request
@@ -215,9 +193,6 @@ TEST_F(ReleaseRules, ClonesOutliveTheirRequest)
     EXPECT_EQ(Host::liveObjects(), before);
 }
 
-// ---------------------------------------------------------------------------
-// Indications
-// ---------------------------------------------------------------------------
 using Indications = HostFixture;
 
 size_t countIn(const std::vector<Indication> &inds, const std::string &ns)
@@ -258,12 +233,6 @@ TEST_F(Indications, DeliveredFromAnAttachedProviderThreadToActiveNamespaces)
     EXPECT_EQ(c.threadsDetached, 1);
 }
 
-TEST_F(Indications, SubscriptionsNeedAnIndicationProvider)
-{
-    EXPECT_EQ(host->subscribe(kNs, "Test_Widget").rc, CMPI_RC_ERR_NOT_SUPPORTED);
-    EXPECT_EQ(host->subscribe(kNs, "Test_Nothing").rc, CMPI_RC_ERR_INVALID_CLASS);
-}
-
 TEST_F(Indications, UnloadEndsActiveSubscriptions)
 {
     ASSERT_TRUE(host->subscribe(kNs, "Test_Alert").ok());
@@ -272,9 +241,6 @@ TEST_F(Indications, UnloadEndsActiveSubscriptions)
     // thread must be stopped before the library goes away.
 }
 
-// ---------------------------------------------------------------------------
-// Cleanup and unload
-// ---------------------------------------------------------------------------
 using Lifecycle = HostFixture;
 
 TEST_F(Lifecycle, NonTerminatingCleanupHonoursDoNotUnload)

@@ -1,8 +1,6 @@
 /* Shared state and helpers of the test provider library. */
 #include "tests/host/testprov_common.h"
 
-#include <stdio.h>
-#include <string.h>
 #include <strings.h>
 
 CMPI_EXPORT struct tvrntest_counters tvrntest_counters;
@@ -80,7 +78,6 @@ CMPIObjectPath *tp_gadgetPath(const char *name, const char *ns)
 
 CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating)
 {
-    (void)ctx;
     if (!terminating && tp_forbidUnload)
         CMReturn(CMPI_RC_DO_NOT_UNLOAD);
     tp_alertsStop();

@@ -1,5 +1,6 @@
-/* Shared parts of the host's test provider library (one source per MI
- * table, since the stub macros give every table the same static name). */
+/* Shared parts of the host's test provider library. The stub macros give
+ * every MI table of one kind the same static name, so the two instance
+ * providers (Test_Widget, Test_Gadget) live in sources of their own. */
 #ifndef TVRN_TESTS_HOST_TESTPROV_COMMON_H
 #define TVRN_TESTS_HOST_TESTPROV_COMMON_H
 
@@ -9,9 +10,15 @@
 
 #include "tests/host/testprov.h"
 
+/* MI functions take the whole CMPI parameter list and use little of it. */
+#pragma GCC diagnostic ignored "-Wunused-parameter"
+
 extern CMPI_EXPORT struct tvrntest_counters tvrntest_counters;
 
-/* The broker, set by the first factory while no MI exists. */
+/* The broker, set by the first factory while no MI exists. The stub macros
+ * store the broker on each call, so each source has a variable of its own
+ * and shared code reads tp_broker, which is written only while no provider
+ * thread can be running. */
 extern const CMPIBroker *tp_broker;
 /* Set by the ForbidUnload method: non-terminating cleanups refuse. */
 extern int tp_forbidUnload;
@@ -21,12 +28,21 @@ void tp_lock(void);
 void tp_unlock(void);
 CMPI_MUTEX_TYPE tp_mutex(void);
 
-/* Factory hook of every MI. The stub macros store the broker on each call,
- * so each source has a variable of its own and shared code reads tp_broker,
- * which is written only while no provider thread can be running. */
+/* Factory hook and cleanup of every MI. */
 void tp_init(const CMPIBroker *b);
-/* Cleanup of every MI. */
 CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating);
+#define TP_CLEANUP(name, kind) \
+    static CMPIStatus name(CMPI##kind##MI *mi, const CMPIContext *ctx, CMPIBoolean t) \
+    { \
+        return tp_cleanup(ctx, t); \
+    }
+
+/* An MI function that no test asks for. */
+#define TP_NOT_SUPPORTED(name, ...) \
+    static CMPIStatus name(__VA_ARGS__) \
+    { \
+        CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
+    }
 
 const char *tp_key(const CMPIObjectPath *op, const char *name);
 const char *tp_ns(const CMPIObjectPath *op);
@@ -38,35 +54,5 @@ CMPIObjectPath *tp_gadgetPath(const char *name, const char *ns);
 /* Per-class state kept across requests (widget table, alert thread). */
 void tp_widgetsReset(int ready);
 void tp_alertsStop(void);
-
-/* Instance operations of read-only classes. */
-#define TP_READ_ONLY_INSTANCE_OPS(pfx) \
-    static CMPIStatus pfx##CreateInstance(CMPIInstanceMI *mi, const CMPIContext *ctx, \
-                                          const CMPIResult *rslt, const CMPIObjectPath *op, \
-                                          const CMPIInstance *ci) \
-    { \
-        (void)mi, (void)ctx, (void)rslt, (void)op, (void)ci; \
-        CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
-    } \
-    static CMPIStatus pfx##ModifyInstance(CMPIInstanceMI *mi, const CMPIContext *ctx, \
-                                          const CMPIResult *rslt, const CMPIObjectPath *op, \
-                                          const CMPIInstance *ci, const char **props) \
-    { \
-        (void)mi, (void)ctx, (void)rslt, (void)op, (void)ci, (void)props; \
-        CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
-    } \
-    static CMPIStatus pfx##DeleteInstance(CMPIInstanceMI *mi, const CMPIContext *ctx, \
-                                          const CMPIResult *rslt, const CMPIObjectPath *op) \
-    { \
-        (void)mi, (void)ctx, (void)rslt, (void)op; \
-        CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
-    } \
-    static CMPIStatus pfx##ExecQuery(CMPIInstanceMI *mi, const CMPIContext *ctx, \
-                                     const CMPIResult *rslt, const CMPIObjectPath *op, \
-                                     const char *q, const char *l) \
-    { \
-        (void)mi, (void)ctx, (void)rslt, (void)op, (void)q, (void)l; \
-        CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
-    }
 
 #endif

@@ -5,8 +5,7 @@
 #include <string.h>
 #include <strings.h>
 
-/* Written by this file's factories (see tp_init). */
-static const CMPIBroker *mib;
+static const CMPIBroker *mib; /* written by this file's factories (see tp_init) */
 
 typedef struct {
     int used;
@@ -27,38 +26,28 @@ static Widget widgets[MAX_WIDGETS];
 static int tableReady;
 static CMPIInstance *kept; /* a clone that outlives its request */
 
-static void resetTable(void)
+/* Called with `ready` 1 by every factory (fills the table once) and with 0
+ * by cleanup (the next factory starts afresh). */
+void tp_widgetsReset(int ready)
 {
     static const Widget initial[] = {
         {1, "w1", 1, 10, 1, 0, "first", 0.5, 1700000000000000ULL, 2, {"a", "b"}},
         {1, "w2", 2, 20, 0, 1, "", 1.5, 1700000060000000ULL, -1, {""}},
         {1, "w3", 3, 30, 0, 0, "third", 2.5, 1700000120000000ULL, 0, {""}},
     };
-    memset(widgets, 0, sizeof widgets);
-    memcpy(widgets, initial, sizeof initial);
-    tableReady = 1;
-}
-
-/* Called with `ready` 1 by every factory (fills the table once) and with 0
- * by cleanup (the next factory starts afresh). */
-void tp_widgetsReset(int ready)
-{
     tp_lock();
     if (!ready) {
         tableReady = 0;
-        if (kept) {
+        if (kept)
             CMRelease(kept);
-            kept = NULL;
-        }
+        kept = NULL;
     } else if (!tableReady) {
-        resetTable();
+        memset(widgets, 0, sizeof widgets);
+        memcpy(widgets, initial, sizeof initial);
+        tableReady = 1;
     }
     tp_unlock();
 }
-
-/* ------------------------------------------------------------------------
- * Test_Widget: instance provider
- * ------------------------------------------------------------------------ */
 
 static Widget *findWidget(const char *id)
 {
@@ -99,44 +88,29 @@ static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char 
 }
 
 /* Copies the properties of `ci` named in `props` (all when NULL) into w. */
-static CMPIrc updateWidget(Widget *w, const CMPIInstance *ci, const char **props)
+static void updateWidget(Widget *w, const CMPIInstance *ci, const char **props)
 {
     CMPIStatus rc;
-    CMPIData d;
-    d = CMGetProperty(ci, "Count", &rc);
-    if (rc.rc == CMPI_RC_OK && tp_listed(props, "Count")) {
-        if (d.type != CMPI_uint32)
-            return CMPI_RC_ERR_TYPE_MISMATCH;
+    CMPIData d = CMGetProperty(ci, "Count", &rc);
+    if (rc.rc == CMPI_RC_OK && tp_listed(props, "Count"))
         w->count = CMIsNullValue(d) ? 0 : d.value.uint32;
-    }
     d = CMGetProperty(ci, "Size", &rc);
-    if (rc.rc == CMPI_RC_OK && tp_listed(props, "Size")) {
-        if (d.type != CMPI_uint16)
-            return CMPI_RC_ERR_TYPE_MISMATCH;
+    if (rc.rc == CMPI_RC_OK && tp_listed(props, "Size"))
         w->size = CMIsNullValue(d) ? 0 : d.value.uint16;
-    }
     d = CMGetProperty(ci, "Label", &rc);
     if (rc.rc == CMPI_RC_OK && tp_listed(props, "Label")) {
-        if (d.type != CMPI_string)
-            return CMPI_RC_ERR_TYPE_MISMATCH;
         w->labelNull = CMIsNullValue(d) != 0;
         if (!w->labelNull)
             snprintf(w->label, sizeof w->label, "%s", CMGetCharsPtr(d.value.string, NULL));
     }
-    return CMPI_RC_OK;
 }
 
-static CMPIStatus WidgetCleanup(CMPIInstanceMI *mi, const CMPIContext *ctx, CMPIBoolean t)
-{
-    (void)mi;
-    return tp_cleanup(ctx, t);
-}
+TP_CLEANUP(WidgetCleanup, Instance)
 
 static CMPIStatus WidgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                           const CMPIResult *rslt, const CMPIObjectPath *op)
 {
     int i;
-    (void)mi, (void)ctx;
     tp_lock();
     for (i = 0; i < MAX_WIDGETS; ++i)
         if (widgets[i].used)
@@ -151,7 +125,6 @@ static CMPIStatus WidgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx
                                       const char **props)
 {
     int i;
-    (void)mi, (void)ctx;
     tp_lock();
     for (i = 0; i < MAX_WIDGETS; ++i)
         if (widgets[i].used)
@@ -167,7 +140,6 @@ static CMPIStatus WidgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
 {
     Widget *w;
     char msg[64];
-    (void)mi, (void)ctx;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
     if (w)
@@ -188,25 +160,21 @@ static CMPIStatus WidgetCreateInstance(CMPIInstanceMI *mi, const CMPIContext *ct
     const char *id = tp_key(op, "Id");
     CMPIrc rc = CMPI_RC_ERR_FAILED;
     int i;
-    (void)mi, (void)ctx;
     if (!id)
         CMReturn(CMPI_RC_ERR_INVALID_PARAMETER);
     tp_lock();
     if (findWidget(id)) {
         rc = CMPI_RC_ERR_ALREADY_EXISTS;
     } else {
-        for (i = 0; i < MAX_WIDGETS; ++i)
+        for (i = 0; i < MAX_WIDGETS && rc != CMPI_RC_OK; ++i)
             if (!widgets[i].used) {
-                Widget w;
-                memset(&w, 0, sizeof w);
-                w.used = 1;
-                snprintf(w.id, sizeof w.id, "%s", id);
-                w.labelNull = 1;
-                w.ntags = -1;
-                rc = updateWidget(&w, ci, NULL);
-                if (rc == CMPI_RC_OK)
-                    widgets[i] = w;
-                break;
+                Widget *w = &widgets[i];
+                memset(w, 0, sizeof *w);
+                w->used = w->labelNull = 1;
+                w->ntags = -1;
+                snprintf(w->id, sizeof w->id, "%s", id);
+                updateWidget(w, ci, NULL);
+                rc = CMPI_RC_OK;
             }
     }
     tp_unlock();
@@ -222,22 +190,19 @@ static CMPIStatus WidgetModifyInstance(CMPIInstanceMI *mi, const CMPIContext *ct
                                        const CMPIInstance *ci, const char **props)
 {
     Widget *w;
-    CMPIrc rc = CMPI_RC_ERR_NOT_FOUND;
-    (void)mi, (void)ctx;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
     if (w)
-        rc = updateWidget(w, ci, props);
+        updateWidget(w, ci, props);
     tp_unlock();
     CMReturnDone(rslt);
-    CMReturn(rc);
+    CMReturn(w ? CMPI_RC_OK : CMPI_RC_ERR_NOT_FOUND);
 }
 
 static CMPIStatus WidgetDeleteInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                        const CMPIResult *rslt, const CMPIObjectPath *op)
 {
     Widget *w;
-    (void)mi, (void)ctx;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
     if (w)
@@ -247,24 +212,21 @@ static CMPIStatus WidgetDeleteInstance(CMPIInstanceMI *mi, const CMPIContext *ct
     CMReturn(w ? CMPI_RC_OK : CMPI_RC_ERR_NOT_FOUND);
 }
 
-static CMPIStatus WidgetExecQuery(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                  const CMPIResult *rslt, const CMPIObjectPath *op,
-                                  const char *query, const char *lang)
-{
-    (void)mi, (void)ctx, (void)rslt, (void)op, (void)query, (void)lang;
-    CMReturn(CMPI_RC_ERR_NOT_SUPPORTED);
-}
+TP_NOT_SUPPORTED(WidgetExecQuery, CMPIInstanceMI *mi, const CMPIContext *ctx,
+                 const CMPIResult *rslt, const CMPIObjectPath *op, const char *query,
+                 const char *lang)
 
 CMInstanceMIStub(Widget, Test_Widget_Provider, mib, tp_init(mib))
 
-/* ------------------------------------------------------------------------
- * Test_Widget: methods
- * ------------------------------------------------------------------------ */
+/* Methods */
 
-static CMPIStatus WidgetMethodCleanup(CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBoolean t)
+TP_CLEANUP(WidgetMethodCleanup, Method)
+
+static CMPIStatus returnValue(const CMPIResult *rslt, const void *value, CMPIType type)
 {
-    (void)mi;
-    return tp_cleanup(ctx, t);
+    CMReturnData(rslt, value, type);
+    CMReturnDone(rslt);
+    CMReturn(CMPI_RC_OK);
 }
 
 /* Returns every input argument unchanged as an output argument. */
@@ -277,20 +239,7 @@ static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArg
         CMPIData d = CMGetArgAt(in, i, &name, NULL);
         CMAddArg(out, CMGetCharsPtr(name, NULL), CMIsNullValue(d) ? NULL : &d.value, d.type);
     }
-    CMReturnData(rslt, &count, CMPI_uint32);
-    CMReturnDone(rslt);
-    CMReturn(CMPI_RC_OK);
-}
-
-static CMPIStatus methodWhoAmI(const CMPIContext *ctx, const CMPIResult *rslt)
-{
-    CMPIStatus rc;
-    CMPIData d = CMGetContextEntry(ctx, CMPIPrincipal, &rc);
-    if (rc.rc != CMPI_RC_OK || d.type != CMPI_string)
-        CMReturnWithChars(tp_broker, CMPI_RC_ERR_FAILED, "no principal");
-    CMReturnData(rslt, &d.value, CMPI_string);
-    CMReturnDone(rslt);
-    CMReturn(CMPI_RC_OK);
+    return returnValue(rslt, &count, CMPI_uint32);
 }
 
 /* Up-call: an instance that the host keeps in its store. */
@@ -304,12 +253,8 @@ static CMPIStatus methodReadManager(const CMPIContext *ctx, const CMPIResult *rs
     ci = CBGetInstance(tp_broker, ctx, op, NULL, &rc);
     if (!ci)
         return rc;
-    d = CMGetProperty(ci, "Description", &rc);
-    if (rc.rc != CMPI_RC_OK)
-        return rc;
-    CMReturnData(rslt, &d.value, d.type);
-    CMReturnDone(rslt);
-    CMReturn(CMPI_RC_OK);
+    d = CMGetProperty(ci, "Description", NULL);
+    return returnValue(rslt, &d.value, d.type);
 }
 
 /* Up-call: another provider's class, served re-entrantly. */
@@ -328,9 +273,7 @@ static CMPIStatus methodCountGadgets(const CMPIContext *ctx, const CMPIResult *r
             ++n;
     }
     CMRelease(en);
-    CMReturnData(rslt, &n, CMPI_uint32);
-    CMReturnDone(rslt);
-    CMReturn(CMPI_RC_OK);
+    return returnValue(rslt, &n, CMPI_uint32);
 }
 
 /* Makes objects and leaves them to the broker's end-of-request cleanup. */
@@ -349,20 +292,19 @@ static CMPIStatus methodScratch(const CMPIResult *rslt)
     CMNewString(tp_broker, "released with the mark", NULL);
     tp_broker->mft->cmpiStrDup(tp_broker, "also released");
     tp_broker->mft->release(tp_broker, mark);
-    CMReturnData(rslt, mem, CMPI_chars);
-    CMReturnDone(rslt);
-    CMReturn(CMPI_RC_OK);
+    return returnValue(rslt, mem, CMPI_chars);
 }
 
 static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
                                      const CMPIResult *rslt, const CMPIObjectPath *op,
                                      const char *method, const CMPIArgs *in, CMPIArgs *out)
 {
-    (void)mi;
     if (strcasecmp(method, "Echo") == 0)
         return methodEcho(rslt, in, out);
-    if (strcasecmp(method, "WhoAmI") == 0)
-        return methodWhoAmI(ctx, rslt);
+    if (strcasecmp(method, "WhoAmI") == 0) {
+        CMPIData d = CMGetContextEntry(ctx, CMPIPrincipal, NULL);
+        return returnValue(rslt, &d.value, d.type);
+    }
     if (strcasecmp(method, "ReadManager") == 0)
         return methodReadManager(ctx, rslt);
     if (strcasecmp(method, "CountGadgets") == 0)
@@ -380,19 +322,16 @@ static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
         CMReturn(CMPI_RC_OK);
     }
     if (strcasecmp(method, "UseClone") == 0) {
-        CMPIData d;
+        CMPIStatus st = {CMPI_RC_ERR_NOT_FOUND, NULL};
         tp_lock();
-        if (!kept) {
-            tp_unlock();
-            CMReturn(CMPI_RC_ERR_NOT_FOUND);
+        if (kept) {
+            CMPIData d = CMGetProperty(kept, "Label", NULL);
+            st = returnValue(rslt, &d.value, d.type);
+            CMRelease(kept); /* the result holds a copy */
+            kept = NULL;
         }
-        d = CMGetProperty(kept, "Label", NULL);
-        CMReturnData(rslt, &d.value, d.type); /* copied by the result */
-        CMRelease(kept);
-        kept = NULL;
         tp_unlock();
-        CMReturnDone(rslt);
-        CMReturn(CMPI_RC_OK);
+        return st;
     }
     if (strcasecmp(method, "ForbidUnload") == 0 || strcasecmp(method, "AllowUnload") == 0) {
         tp_forbidUnload = strcasecmp(method, "ForbidUnload") == 0;

@@ -34,6 +34,13 @@ inline Json::Value J(const std::string& text) {
     return v;
 }
 
+// {"<member>": "<key>"}
+inline Json::Value K(const char* member, const std::string& key) {
+    Json::Value v(Json::objectValue);
+    v[member] = key;
+    return v;
+}
+
 inline bool isError(const Json::Value& v) { return v.isObject() && v.isMember("error"); }
 
 // Keys of the built-in host (fixtures/default.json).
