@@ -26,6 +26,21 @@ bool _take_string(CMPIString* s, String& out) {
     return true;
 }
 
+// Reads an element's name through fetch, a CMGet*At call that stores the
+// name string: 0, or -1 when the call fails or gives no text.
+template <class F>
+int _fetch_name(String& name, F fetch) {
+    CMPIStatus rc = {CMPI_RC_OK, nullptr};
+    CMPIString* s = nullptr;
+    fetch(&s, &rc);
+    if (rc.rc != CMPI_RC_OK) {
+        if (s)
+            CMRelease(s);
+        return -1;
+    }
+    return _take_string(s, name) ? 0 : -1;
+}
+
 // Value tag of a scalar CMPI type; NONE for the types we do not take.
 Value::Type _tag_of(CMPIType type) {
     switch (type) {
@@ -729,15 +744,9 @@ size_t CMPIInstance_Container::get_size() {
 }
 
 int CMPIInstance_Container::get_name(size_t pos, String& name) {
-    CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    CMPIString* s = nullptr;
-    CMGetPropertyAt(_instance, CMPICount(pos), &s, &rc);
-    if (rc.rc != CMPI_RC_OK) {
-        if (s)
-            CMRelease(s);
-        return -1;
-    }
-    return _take_string(s, name) ? 0 : -1;
+    return _fetch_name(name, [&](CMPIString** s, CMPIStatus* rc) {
+        CMGetPropertyAt(_instance, CMPICount(pos), s, rc);
+    });
 }
 
 int CMPIInstance_Container::get_value(size_t pos, Value::Type expected, Value& value) {
@@ -780,15 +789,9 @@ size_t CMPIObjectPath_Container::get_size() {
 }
 
 int CMPIObjectPath_Container::get_name(size_t pos, String& name) {
-    CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    CMPIString* s = nullptr;
-    CMGetKeyAt(_object_path, CMPICount(pos), &s, &rc);
-    if (rc.rc != CMPI_RC_OK) {
-        if (s)
-            CMRelease(s);
-        return -1;
-    }
-    return _take_string(s, name) ? 0 : -1;
+    return _fetch_name(name, [&](CMPIString** s, CMPIStatus* rc) {
+        CMGetKeyAt(_object_path, CMPICount(pos), s, rc);
+    });
 }
 
 int CMPIObjectPath_Container::get_value(size_t pos, Value::Type expected, Value& value) {
@@ -840,15 +843,9 @@ size_t CMPIArgs_Container::get_size() {
 }
 
 int CMPIArgs_Container::get_name(size_t pos, String& name) {
-    CMPIStatus rc = {CMPI_RC_OK, nullptr};
-    CMPIString* s = nullptr;
-    CMGetArgAt(_args, CMPICount(pos), &s, &rc);
-    if (rc.rc != CMPI_RC_OK) {
-        if (s)
-            CMRelease(s);
-        return -1;
-    }
-    return _take_string(s, name) ? 0 : -1;
+    return _fetch_name(name, [&](CMPIString** s, CMPIStatus* rc) {
+        CMGetArgAt(_args, CMPICount(pos), s, rc);
+    });
 }
 
 int CMPIArgs_Container::get_value(size_t pos, Value::Type expected, Value& value) {

@@ -17,6 +17,30 @@ const Meta_Repository* _repository_of(const Instance* instance) {
     return (mc->flags & FLAG_METHOD) ? nullptr : mc->meta_repository;
 }
 
+// Makes the path of instance (and, when with_instance, the instance itself)
+// and hands them to up_call, which answers the broker's status code.
+// 0 on CMPI_RC_OK, else -1.
+template <class F>
+int _write_up_call(const CMPIBroker* broker, const char* name_space, const Instance* instance,
+                   bool with_instance, F up_call) {
+    if (!instance)
+        return -1;
+    try {
+        CMPIObjectPath* op = nullptr;
+        if (make_cmpi_object_path(broker, instance, name_space, op) != CMPI_RC_OK)
+            return -1;
+        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
+        CMPIInstance* ci = nullptr;
+        if (with_instance &&
+            make_cmpi_instance(broker, instance, name_space, op, nullptr, ci) != CMPI_RC_OK)
+            return -1;
+        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
+        return up_call(op, ci) == CMPI_RC_OK ? 0 : -1;
+    } catch (...) {
+        return -1;
+    }
+}
+
 }  // namespace
 
 CMPI_Thread_Context::~CMPI_Thread_Context() {}
@@ -153,57 +177,27 @@ Instance* CMPI_Thread_Context::get_instance(const char* name_space, const Instan
 }
 
 int CMPI_Thread_Context::create_instance(const char* name_space, const Instance* instance) {
-    if (!instance)
-        return -1;
-    try {
-        CMPIObjectPath* op = nullptr;
-        if (make_cmpi_object_path(_broker, instance, name_space, op) != CMPI_RC_OK)
-            return -1;
-        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
-        CMPIInstance* ci = nullptr;
-        if (make_cmpi_instance(_broker, instance, name_space, op, nullptr, ci) != CMPI_RC_OK)
-            return -1;
-        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
-        CMPIStatus rc = {CMPI_RC_OK, nullptr};
-        Cmpi_Ptr<CMPIObjectPath> created(CBCreateInstance(_broker, _context, op, ci, &rc));
-        return rc.rc == CMPI_RC_OK ? 0 : -1;
-    } catch (...) {
-        return -1;
-    }
+    return _write_up_call(_broker, name_space, instance, true,
+                          [this](CMPIObjectPath* op, CMPIInstance* ci) {
+                              CMPIStatus rc = {CMPI_RC_OK, nullptr};
+                              Cmpi_Ptr<CMPIObjectPath> created(
+                                  CBCreateInstance(_broker, _context, op, ci, &rc));
+                              return rc.rc;
+                          });
 }
 
 int CMPI_Thread_Context::modify_instance(const char* name_space, const Instance* instance) {
-    if (!instance)
-        return -1;
-    try {
-        CMPIObjectPath* op = nullptr;
-        if (make_cmpi_object_path(_broker, instance, name_space, op) != CMPI_RC_OK)
-            return -1;
-        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
-        CMPIInstance* ci = nullptr;
-        if (make_cmpi_instance(_broker, instance, name_space, op, nullptr, ci) != CMPI_RC_OK)
-            return -1;
-        Cmpi_Ptr<CMPIInstance> hold_ci(ci);
-        CMPIStatus rc = CBModifyInstance(_broker, _context, op, ci, nullptr);
-        return rc.rc == CMPI_RC_OK ? 0 : -1;
-    } catch (...) {
-        return -1;
-    }
+    return _write_up_call(_broker, name_space, instance, true,
+                          [this](CMPIObjectPath* op, CMPIInstance* ci) {
+                              return CBModifyInstance(_broker, _context, op, ci, nullptr).rc;
+                          });
 }
 
 int CMPI_Thread_Context::delete_instance(const char* name_space, const Instance* instance) {
-    if (!instance)
-        return -1;
-    try {
-        CMPIObjectPath* op = nullptr;
-        if (make_cmpi_object_path(_broker, instance, name_space, op) != CMPI_RC_OK)
-            return -1;
-        Cmpi_Ptr<CMPIObjectPath> hold_op(op);
-        CMPIStatus rc = CBDeleteInstance(_broker, _context, op);
-        return rc.rc == CMPI_RC_OK ? 0 : -1;
-    } catch (...) {
-        return -1;
-    }
+    return _write_up_call(_broker, name_space, instance, false,
+                          [this](CMPIObjectPath* op, CMPIInstance*) {
+                              return CBDeleteInstance(_broker, _context, op).rc;
+                          });
 }
 
 int CMPI_Thread_Context::invoke_method(const char* name_space, const Instance* instance,
