@@ -60,6 +60,13 @@ std::string key(const Json::Value& req, const char* name, Form form) {
     return s;
 }
 
+// The key of a request that names its object by "wwn" or by "mac".
+std::string wwnOrMacKey(const Json::Value& req) {
+    if (has(req, "wwn")) return key(req, "wwn", Form::Wwn);
+    if (!has(req, "mac")) fail(kBadRequest, "the request needs \"wwn\" or \"mac\"");
+    return key(req, "mac", Form::Mac);
+}
+
 bool flag(const Json::Value& req, const char* name) {
     const Json::Value& v = member(req, name);
     if (!v.isBool()) fail(kBadRequest, quoted(name) + " must be a boolean");
@@ -425,13 +432,7 @@ Json::Value portIndices(Call& c) {
 }
 
 Json::Value hbaDetails(Call& c) {
-    std::string k;
-    if (has(c.req, "wwn"))
-        k = key(c.req, "wwn", Form::Wwn);
-    else if (has(c.req, "mac"))
-        k = key(c.req, "mac", Form::Mac);
-    else
-        fail(kBadRequest, "the request needs \"wwn\" or \"mac\"");
+    const std::string k = wwnOrMacKey(c.req);
     Json::Value& ad = c.st.model.adapter(adapterExact(c, k));
     Json::Value r(Json::objectValue);
     r["hbaData"] = ad["hbaData"];
@@ -519,13 +520,7 @@ Json::Value getFlashInfo(Call& c) {
 // Ports
 
 Json::Value getPortByWwn(Call& c) {
-    std::string k;
-    if (has(c.req, "wwn"))
-        k = key(c.req, "wwn", Form::Wwn);
-    else if (has(c.req, "mac"))
-        k = key(c.req, "mac", Form::Mac);
-    else
-        fail(kBadRequest, "the request needs \"wwn\" or \"mac\"");
+    const std::string k = wwnOrMacKey(c.req);
     return anyPortWrapper(c, k)["port"];
 }
 
