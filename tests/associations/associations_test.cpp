@@ -16,13 +16,39 @@
 #include <vector>
 
 #include "simulator/SimControl.h"
-#include "tests/associations/Association_Ends.h"
 #include "tests/e2e/Module_Session.h"
 
 using namespace tvrne2e;
-using assoctest::ends;
 
 namespace {
+
+// An end written short, "FCPort:100000051e0a0b0c": the class without
+// "TAVRIN_" and the key that tells its instances apart.
+std::string shortName(const tvrnhost::ObjectPath& path) {
+    std::string name = path.className();
+    if (name.compare(0, 7, "TAVRIN_") == 0)
+        name.erase(0, 7);
+    for (const char* key : {"IdentifyingNumber", "DeviceID", "Tag", "InstanceID", "Name"})
+        if (const tvrnhost::Value* v = path.key(key))
+            return name + ":" + v->asString();
+    return name + ":?";
+}
+
+// The ends of each association in the order of `roles`, blank-separated.
+std::vector<std::string> ends(const std::vector<Instance>& associations,
+                              std::initializer_list<const char*> roles) {
+    std::vector<std::string> out;
+    for (const Instance& a : associations) {
+        std::string line;
+        for (const char* role : roles) {
+            const tvrnhost::Value* v = a.get(role);
+            line += (line.empty() ? "" : " ") +
+                    (v == nullptr || v->isNull() ? std::string(role) + ":NULL" : shortName(v->asReference()));
+        }
+        out.push_back(line);
+    }
+    return out;
+}
 
 // Lines the provider of `association` logged that contain `message`.
 size_t logged(Module_Session& s, const std::string& association, const std::string& message) {
@@ -35,14 +61,12 @@ size_t logged(Module_Session& s, const std::string& association, const std::stri
 }
 
 // The JSON text of a fixture of the source tree, with `from` replaced by `to`.
-std::string fixtureText(const std::string& name, const std::string& from = "",
-                        const std::string& to = "") {
+std::string fixtureText(const std::string& name, const std::string& from, const std::string& to) {
     std::ifstream is(std::string(getenv("TVRN_SOURCE_DIR")) + "/simulator/fixtures/" + name);
     std::stringstream text;
     text << is.rdbuf();
     std::string json = text.str();
-    for (size_t at = from.empty() ? std::string::npos : json.find(from);
-         at != std::string::npos; at = json.find(from, at + to.size()))
+    for (size_t at = json.find(from); at != std::string::npos; at = json.find(from, at + to.size()))
         json.replace(at, from.size(), to);
     return json;
 }

@@ -9,6 +9,7 @@
 #define ABI_SIZE(T, n) _Static_assert(sizeof(T) == (n), "sizeof " #T);
 #define ABI_OFFSET(T, m, n) _Static_assert(offsetof(T, m) == (n), "offsetof " #T "." #m);
 #define ABI_SLOT(T, m, k) _Static_assert(offsetof(T, m) == 8 * (k), "slot " #T "." #m);
+#define ABI_FN(T, m, k, ...) ABI_SLOT(T, m, k)
 #define ABI_CONST(name, v) _Static_assert((name) == (v), "value of " #name);
 #include "tests/cmpi_abi/abi_table.inc"
 

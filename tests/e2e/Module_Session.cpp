@@ -3,7 +3,6 @@
 #include <stdlib.h>
 
 #include <algorithm>
-#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -180,8 +179,6 @@ tvrnhost::Host& Module_Session::host() {
     return *_host;
 }
 
-// ---- requests --------------------------------------------------------------------
-
 Result<Instance> Module_Session::enumerate(const std::string& className) {
     return host().enumerateInstances(kNameSpace, className);
 }
@@ -191,32 +188,6 @@ Result<ObjectPath> Module_Session::enumerateNames(const std::string& className) 
 }
 
 InstanceResult Module_Session::get(const ObjectPath& path) { return host().getInstance(path); }
-
-Result<Instance> Module_Session::associators(const ObjectPath& path, const std::string& assocClass,
-                                             const std::string& resultClass,
-                                             const std::string& role,
-                                             const std::string& resultRole) {
-    return host().associators(path, assocClass, resultClass, role, resultRole);
-}
-
-Result<ObjectPath> Module_Session::associatorNames(const ObjectPath& path,
-                                                   const std::string& assocClass,
-                                                   const std::string& resultClass,
-                                                   const std::string& role,
-                                                   const std::string& resultRole) {
-    return host().associatorNames(path, assocClass, resultClass, role, resultRole);
-}
-
-Result<Instance> Module_Session::references(const ObjectPath& path, const std::string& assocClass,
-                                            const std::string& role) {
-    return host().references(path, assocClass, role);
-}
-
-Result<ObjectPath> Module_Session::referenceNames(const ObjectPath& path,
-                                                  const std::string& assocClass,
-                                                  const std::string& role) {
-    return host().referenceNames(path, assocClass, role);
-}
 
 MethodResult Module_Session::invoke(const ObjectPath& path, const std::string& method,
                                     const PropertyVector& in) {
@@ -248,8 +219,6 @@ std::string Module_Session::cli(const std::string& commandLine, int* status) {
     return masked(out.str() + err.str());
 }
 
-// ---- text --------------------------------------------------------------------
-
 std::string Module_Session::masked(const std::string& text) const {
     if (_hostName.empty())
         return text;
@@ -272,20 +241,6 @@ std::string Module_Session::masked(const std::string& text) const {
     return out;
 }
 
-std::string Module_Session::mof(const Instance& instance) const {
-    return masked(tvrnhost::cli::formatInstance(instance));
-}
-
-std::string Module_Session::mof(const std::vector<Instance>& instances) const {
-    return masked(tvrnhost::cli::formatInstances(instances));
-}
-
-std::string Module_Session::paths(const std::vector<ObjectPath>& paths) const {
-    return masked(tvrnhost::cli::formatPaths(paths));
-}
-
-// ---- log ---------------------------------------------------------------------
-
 void Module_Session::markLog() { _logMark = logSize(); }
 
 std::vector<std::string> Module_Session::logLines() const {
@@ -305,8 +260,6 @@ std::size_t Module_Session::logCount(const std::string& text) const {
     }));
 }
 
-// ---- simulator -------------------------------------------------------------------
-
 unsigned long long Module_Session::calls(const std::string& entryPoint) const {
     return tvrn_sim_call_count(entryPoint.c_str());
 }
@@ -318,7 +271,7 @@ void Module_Session::resetCounters() { tvrn_sim_reset_counters(); }
 std::vector<std::string> Module_Session::recordedEntries() const {
     Json::Value calls;
     Json::CharReaderBuilder builder;
-    std::istringstream is(recording());
+    std::istringstream is(tvrn_sim_recorded_calls());
     std::string errors;
     std::vector<std::string> entries;
     if (Json::parseFromStream(builder, is, &calls, &errors) && calls.isArray())
@@ -326,8 +279,6 @@ std::vector<std::string> Module_Session::recordedEntries() const {
             entries.push_back(call["entry"].asString());
     return entries;
 }
-
-std::string Module_Session::recording() const { return tvrn_sim_recorded_calls(); }
 
 void Module_Session::clearRecording() { tvrn_sim_clear_recording(); }
 

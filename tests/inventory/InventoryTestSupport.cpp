@@ -32,36 +32,21 @@ int fakeDomainName(char* name, size_t length) {
 }
 
 bool fakeResolve(const char*, std::vector<std::string>& addresses) {
-    hostCounters().resolves++;
-    switch (gMode) {
-    case HostMode::ADDRESS:
+    hostResolves()++;
+    if (gMode == HostMode::ADDRESS)
         addresses = {"127.0.1.1", kHostAddress};
-        return true;
-    case HostMode::LOOPBACK_ONLY:
+    else if (gMode == HostMode::LOOPBACK_ONLY)
         addresses = {"127.0.0.1"};
-        return true;
-    default:
-        return false;
-    }
+    return gMode == HostMode::ADDRESS || gMode == HostMode::LOOPBACK_ONLY;
 }
 
 const HostLookup kFakeHost = {fakeHostName, fakeDomainName, fakeResolve};
 
-// The provider start-up, once per program, against the simulator.
-void startProvider() {
-    static bool started = [] {
-        gwtest::boundSimulator();
-        static ProviderInit init;
-        return true;
-    }();
-    (void)started;
-}
-
 }  // namespace
 
-HostCounters& hostCounters() {
-    static HostCounters counters;
-    return counters;
+int& hostResolves() {
+    static int resolves = 0;
+    return resolves;
 }
 
 void setHostMode(HostMode mode) { gMode = mode; }
@@ -69,19 +54,16 @@ void setHostMode(HostMode mode) { gMode = mode; }
 Instances::~Instances() { destroyInstances(_items); }
 
 void InventoryTest::SetUp() {
-    startProvider();
     _sim = &gwtest::boundSimulator();  // back to the built-in host
+    static ProviderInit init;           // the provider start-up, once per program
     ProviderInit::driverStatus = 0;
     gMode = HostMode::ADDRESS;
     ProviderUtil::setHostLookup(&kFakeHost);
-    hostCounters() = HostCounters();
+    hostResolves() = 0;
     gwtest::LogCapture::get().mark();
 }
 
-void InventoryTest::TearDown() {
-    ProviderInit::driverStatus = 0;
-    gMode = HostMode::ADDRESS;
-}
+void InventoryTest::TearDown() { ProviderInit::driverStatus = 0; }
 
 void InventoryTest::loadJson(const Json::Value& fixture) {
     Json::StreamWriterBuilder writer;

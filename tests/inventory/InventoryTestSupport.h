@@ -6,7 +6,6 @@
 
 #include <gtest/gtest.h>
 
-#include <functional>
 #include <string>
 
 #include "framework/Array.h"
@@ -17,15 +16,12 @@
 
 namespace invtest {
 
-// The fake host: named "invhost", resolving to 127.0.1.1 and kHostAddress.
+// The fake host: named "invhost", resolving to 127.0.1.1 and kHostAddress
+// (ADDRESS), or as the mode says; hostResolves() counts its look-ups.
 extern const char kHostAddress[];
-struct HostCounters {
-    int resolves = 0;
-};
-HostCounters& hostCounters();
-// How the fake host answers from now on.
 enum class HostMode { ADDRESS, LOOPBACK_ONLY, UNRESOLVABLE, NO_NAME };
 void setHostMode(HostMode mode);
+int& hostResolves();
 
 // An owned instance array: every instance is destroyed with it.
 class Instances {
@@ -37,7 +33,6 @@ public:
 
     size_t size() const { return _items.size(); }
     bool empty() const { return _items.size() == 0; }
-    CPTA::Instance* operator[](size_t i) const { return _items[i]; }
     template <class T>
     T* at(size_t i) const {
         return i < _items.size() && _items[i] != nullptr && _items[i]->meta_class == &T::static_meta_class
@@ -74,15 +69,11 @@ inline CPTA::Array<CPTA::String> strings(std::initializer_list<const char*> valu
     return out;
 }
 
-inline CPTA::Array<CPTA::uint16> u16s(std::initializer_list<CPTA::uint16> values) {
-    return CPTA::Array<CPTA::uint16>(values.begin(), values.size());
-}
-
 // The JSON of a fixture of the simulator's source tree ("default", "variants", ...).
 Json::Value fixtureJson(const char* name);
 
-// Base of the inventory tests: a usable driver, the simulator's built-in host
-// (or `fixture`), the fake host, and the log marked.
+// Base of the inventory tests: a usable driver, the simulator's built-in host,
+// the fake host in ADDRESS mode, and the log marked.
 class InventoryTest : public ::testing::Test {
 protected:
     void SetUp() override;
@@ -90,12 +81,9 @@ protected:
 
     gwtest::SimLibrary& sim() { return *_sim; }
     void load(const char* fixture) { _sim->loadFixture(fixture); }
-    // A fixture from JSON text or a JSON value.
-    void loadText(const std::string& json) { _sim->loadFixtureText(json); }
     void loadJson(const Json::Value& fixture);
-    void fault(const char* entry, const char* key, int kind, const char* text = nullptr,
-               int times = 0, int code = 7) {
-        _sim->setFault(entry, key, kind, code, text, times);
+    void fault(const char* entry, const char* key, int kind, const char* text = nullptr) {
+        _sim->setFault(entry, key, kind, 7, text, 0);
     }
 
     // The dispatchers' answers.

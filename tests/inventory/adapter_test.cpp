@@ -10,7 +10,16 @@ using namespace invtest;
 
 namespace {
 
-class Adapters : public InventoryTest {};
+class Adapters : public InventoryTest {
+protected:
+    // Adapter 1 of the built-in host with one "hbaData" member changed.
+    void loadWithFirstAdapter(const char* member, const Json::Value& value) {
+        Json::Value fixture = fixtureJson("default");
+        fixture["adapters"][0]["hbaData"][member] = value;
+        loadJson(fixture);
+    }
+    Instances identities() { return Instances(fchba(CID_ADAPTER_SOFTWARE_IDENTITY)); }
+};
 
 TEST_F(Adapters, NetworkDriverComesBeforeStorageDriverOnACnaListedFirst) {
     Json::Value fixture = fixtureJson("default");
@@ -19,44 +28,35 @@ TEST_F(Adapters, NetworkDriverComesBeforeStorageDriverOnACnaListedFirst) {
     fixture["adapters"].append(cna);
     fixture["adapters"].append(fixtureJson("variants")["adapters"][4]);  // a second CNA, not flashed
     loadJson(fixture);
-    Instances ids(fchba(CID_ADAPTER_SOFTWARE_IDENTITY));
-    EXPECT_EQ(ids.values(&TAVRIN_AdapterSoftwareIdentity::InstanceID),
+    EXPECT_EQ(identities().values(&TAVRIN_AdapterSoftwareIdentity::InstanceID),
               (std::vector<std::string>{"tna", "tvfc", "00051e8a4b00_bios", "00051e8a4b00_firmware",
                                         "00051e9c5d00_firmware"}));
 }
 
 TEST_F(Adapters, DellMezzanineHasFirmwareButNoBios) {
     load("variants");
-    Instances ids(fchba(CID_ADAPTER_SOFTWARE_IDENTITY));
+    Instances ids = identities();
     EXPECT_NE(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e7e8f90_firmware"), nullptr);
     EXPECT_EQ(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e7e8f90_bios"), nullptr);
 }
 
-// Adapter 1 of the built-in host with changed "hbaData" members.
-Json::Value hostWithFirstAdapter(const char* member, const Json::Value& value) {
-    Json::Value fixture = fixtureJson("default");
-    fixture["adapters"][0]["hbaData"][member] = value;
-    return fixture;
-}
-
 TEST_F(Adapters, AdapterWithoutPortsYieldsNothing) {
-    loadJson(hostWithFirstAdapter("portCount", 0));
-    for (classId_t id : {CID_PORT_CONTROLLER, CID_PHYSICAL_PACKAGE, CID_PRODUCT}) {
-        Instances got(fchba(id));
-        EXPECT_EQ(got.size(), 2u) << "class id " << id;
-    }
-    Instances ids(fchba(CID_ADAPTER_SOFTWARE_IDENTITY));
-    EXPECT_EQ(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e0a0b0c_firmware"),
+    loadWithFirstAdapter("portCount", 0);
+    for (classId_t id : {CID_PORT_CONTROLLER, CID_PHYSICAL_PACKAGE, CID_PRODUCT})
+        EXPECT_EQ(Instances(fchba(id)).size(), 2u) << "class id " << id;
+    EXPECT_EQ(identities().find(&TAVRIN_AdapterSoftwareIdentity::InstanceID,
+                                "200000051e0a0b0c_firmware"),
               nullptr);
     EXPECT_GE(logged("WARN", "There are no ports associated to Adapter id 1"), 1);
 }
 
 TEST_F(Adapters, StoppedAdapterIsReportedDisabled) {
-    loadJson(hostWithFirstAdapter("hbaStatus", false));
+    loadWithFirstAdapter("hbaStatus", false);
     Instances controllers(fchba(CID_PORT_CONTROLLER));
     auto* pc = controllers.at<TAVRIN_PortController>(0);
     ASSERT_NE(pc, nullptr);
-    EXPECT_EQ(pc->OperationalStatus.value, u16s({10}));
+    ASSERT_EQ(pc->OperationalStatus.value.size(), 1u);
+    EXPECT_EQ(pc->OperationalStatus.value[0], 10);
     EXPECT_EQ(pc->EnabledState.value, 3);
     EXPECT_EQ(pc->StatusDescriptions.value, strings({"The adapter is disabled"}));
 }
@@ -66,11 +66,10 @@ TEST_F(Adapters, BiosTextThatIsNotUtf8IsDropped) {
     // as they are (a JSON writer would replace them).
     Json::Value fixture = fixtureJson("default");
     fixture["adapters"][0]["firmware"]["biosVersion"] = "BIOS-MARK";
-    Json::StreamWriterBuilder writer;
-    std::string text = Json::writeString(writer, fixture);
+    std::string text = Json::writeString(Json::StreamWriterBuilder(), fixture);
     text.replace(text.find("BIOS-MARK"), 9, "\x80\x81");
-    loadText(text);
-    Instances ids(fchba(CID_ADAPTER_SOFTWARE_IDENTITY));
+    sim().loadFixtureText(text);
+    Instances ids = identities();
     auto* bios = ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e0a0b0c_bios");
     ASSERT_NE(bios, nullptr);
     EXPECT_STREQ(bios->VersionString.value.c_str(), "");

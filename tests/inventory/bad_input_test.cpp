@@ -13,7 +13,12 @@ using namespace invtest;
 
 namespace {
 
-class BadInput : public InventoryTest {};
+class BadInput : public InventoryTest {
+protected:
+    static size_t count(bool fromHdr, classId_t id) {
+        return Instances(fromHdr ? hdr(id) : fchba(id)).size();
+    }
+};
 
 const int kAnswerFaults[] = {TVRN_SIM_FAULT_NULL_ANSWER, TVRN_SIM_FAULT_ERROR_OBJECT};
 const int kThrowFaults[] = {TVRN_SIM_FAULT_HBA_AGENT_ERROR, TVRN_SIM_FAULT_STD_EXCEPTION,
@@ -75,28 +80,21 @@ const Site kSites[] = {
      "AdapterHelper::getInstancesByClass ended by User exception 7: boom"},
 };
 
-size_t countOf(const Site& s) {
-    Array<Instance*> got = s.hdr ? HDRManager::getHDRManager()->getInstances(s.classId)
-                                 : FCHBAManager::getFCHBAManager()->getInstances(s.classId);
-    Instances owned(got);
-    return owned.size();
-}
-
 TEST_F(BadInput, EveryCallSiteSurvivesUnusableAnswersAndExceptions) {
     for (const Site& s : kSites) {
         SCOPED_TRACE(std::string(s.entry) + " for class id " + std::to_string(s.classId));
         tvrn_sim_clear_faults();
-        ASSERT_EQ(countOf(s), s.total);
+        ASSERT_EQ(count(s.hdr, s.classId), s.total);
         for (int kind : kAnswerFaults) {
             tvrn_sim_clear_faults();
             fault(s.entry, s.key, kind, "boom");
-            EXPECT_EQ(countOf(s), s.afterBadAnswer) << "fault kind " << kind;
+            EXPECT_EQ(count(s.hdr, s.classId), s.afterBadAnswer) << "fault kind " << kind;
         }
         for (int kind : kThrowFaults) {
             tvrn_sim_clear_faults();
             gwtest::LogCapture::get().mark();
             fault(s.entry, s.key, kind, "boom");
-            EXPECT_EQ(countOf(s), s.afterException) << "fault kind " << kind;
+            EXPECT_EQ(count(s.hdr, s.classId), s.afterException) << "fault kind " << kind;
             if (kind == TVRN_SIM_FAULT_HBA_AGENT_ERROR) {
                 EXPECT_EQ(logged("ERR", s.exceptionLine), 1) << log();
             }
@@ -176,12 +174,12 @@ TEST_F(BadInput, MembersMissingOrOfTheWrongTypeCountAsMissing) {
         tvrn_sim_clear_faults();
         gwtest::LogCapture::get().mark();
         fault(c.entry, c.key, c.kind, c.member);
-        Array<Instance*> got =
-            c.classId == CID_NONE
-                ? FCHBAManager::getFCHBAManager()->getEthernetPortInstancesByAdapter("00051e8a4b01")
-                : c.hdr ? hdr(c.classId) : fchba(c.classId);
-        Instances owned(got);
-        EXPECT_EQ(owned.size(), c.count);
+        EXPECT_EQ(c.classId == CID_NONE
+                      ? Instances(FCHBAManager::getFCHBAManager()->getEthernetPortInstancesByAdapter(
+                                      "00051e8a4b01"))
+                            .size()
+                      : count(c.hdr, c.classId),
+                  c.count);
         if (c.line != nullptr) {
             EXPECT_EQ(logged("ERR", c.line) + logged("INFO", c.line), 1) << log();
         }

@@ -31,12 +31,9 @@ TEST_F(Ports, StatisticsListsThatCannotBeReadLeaveCountersAtZero) {
         {"id": 1410, "value": "99999999999999999999999"}, {"value": "3"}, 17,
         {"id": 1411, "value": "4"}, {"id": 1626, "value": "9"}])");
     prov_pport_stats_s fc = PortHelper::readStatistics(list, false);
-    EXPECT_EQ(fc.txFrames, 0u);
-    EXPECT_EQ(fc.txWords, 0u);
-    EXPECT_EQ(fc.rxFrames, 0u);
-    EXPECT_EQ(fc.rxWords, 0u);
-    EXPECT_EQ(fc.lipCount, 4u);
-    EXPECT_EQ(fc.fcoeCrc, 0u);
+    EXPECT_EQ((std::vector<uint64>{fc.txFrames, fc.txWords, fc.rxFrames, fc.rxWords, fc.lipCount,
+                                   fc.fcoeCrc}),
+              (std::vector<uint64>{0, 0, 0, 0, 4, 0}));
     EXPECT_EQ(PortHelper::readStatistics(list, true).fcoeCrc, 9u);
     EXPECT_EQ(PortHelper::readStatistics(Json::Value("text"), false).lipCount, 0u);
 }
@@ -82,14 +79,13 @@ TEST_F(Ports, SetAlarmStateOutcomes) {
 }
 
 TEST_F(Ports, ThrowingLibraryMakesSetAlarmStateFail) {
-    for (const char* entry : {"getPortByWwn", "setPortByWwn"}) {
+    for (const char* entry : {"getPortByWwn", "setPortByWwn"})
         for (int kind : {TVRN_SIM_FAULT_HBA_AGENT_ERROR, TVRN_SIM_FAULT_STD_EXCEPTION,
                          TVRN_SIM_FAULT_NON_STANDARD}) {
             tvrn_sim_clear_faults();
             fault(entry, nullptr, kind, "boom");
             EXPECT_EQ(ports()->setAlarmState("100000051e0a0b0c", 3), 0) << entry << " " << kind;
         }
-    }
     EXPECT_EQ(logged("ERR", "libGetPortByWwn got User exception 7: boom"), 1);
     EXPECT_EQ(logged("ERR", "libSetPortByWwn got std exception: boom"), 1);
     EXPECT_EQ(logged("ERR", "libSetPortByWwn got default exception"), 1);

@@ -90,10 +90,6 @@ std::vector<std::string> methods_of(const CPTA::Meta_Class* mc) {
     return names;
 }
 
-//------------------------------------------------------------------------------
-// What the module shows the server
-//------------------------------------------------------------------------------
-
 TEST(Module, ExportsOnlyTheRegistrationListAndTheMiFactories) {
     std::set<std::string> expected = {"cimple_module"};
     for (const Row& r : provider_table()) {
@@ -109,7 +105,6 @@ TEST(Module, ExportsOnlyTheRegistrationListAndTheMiFactories) {
             expected.insert("TAVRIN_" + r.name + "_Create_" + k + "MI");
         }
     }
-    ASSERT_EQ(expected.size(), 1u + 2u * (76 + 75 + 41 + 1));
 
     FILE* nm = popen("nm -D --defined-only " TVRN_MODULE, "r");
     ASSERT_TRUE(nm);
@@ -141,49 +136,31 @@ TEST(Module, RegistersEveryProviderOnceInTableOrder) {
         EXPECT_EQ(r->meta_class->name, "TAVRIN_" + row.name);
         EXPECT_EQ((r->meta_class->flags & CPTA::FLAG_ASSOCIATION) != 0, row.association);
 
-        const CPTA::Meta_Class* mc = nullptr;
-        EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_GET_META_CLASS, &mc), 0);
-        EXPECT_EQ(mc, r->meta_class);
-        const CPTA::Meta_Repository* repository = nullptr;
-        EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_GET_REPOSITORY, &repository), 0);
-        EXPECT_EQ(repository, mc->meta_repository);
-
+        // Meta class, repository, load and unload are reached through the
+        // binding by EveryProviderAnswersWithoutAdapters.
         void* provider = nullptr;
         ASSERT_EQ(Registrations::call(r, CPTA::OPERATION_CREATE_PROVIDER, &provider), 0);
         ASSERT_TRUE(provider);
-        EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_LOAD, provider), 0);
-        // Operations the provider does not have.
-        int served_by_associations = row.association ? 111 : -1;  // UNSUPPORTED
+        // Operations the provider does not have (111 and 121: unsupported).
         CPTA::String empty;
         EXPECT_EQ(r->proc(r, CPTA::OPERATION_ENUM_ASSOCIATOR_NAMES, provider, nullptr, &empty,
                           &empty, &empty, nullptr, nullptr, nullptr),
-                  served_by_associations);
+                  row.association ? 111 : -1);
         EXPECT_EQ(r->proc(r, CPTA::OPERATION_ENUM_REFERENCES, provider, nullptr, nullptr,
                           &empty, nullptr, nullptr, nullptr, nullptr),
                   row.association ? 121 : -1);
         EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_DISABLE_INDICATIONS, provider),
                   row.indication ? 0 : -1);
         EXPECT_EQ(Registrations::call(r, 17, provider), -1);
-        EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_UNLOAD, provider), 0);
         EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_DESTROY_PROVIDER, provider), 0);
     }
 }
 
-//------------------------------------------------------------------------------
-// The providers on a host without adapters (this program runs on the
-// simulator's "empty" host): nothing to enumerate but the host itself,
-// nothing to change, no method but SetAlarmState
-//------------------------------------------------------------------------------
-
-class Loaded : public ::testing::Test {
-protected:
-    void SetUp() override { ASSERT_TRUE(host.load(TVRN_MODULE, TVRN_MODULE_REG).ok()); }
-    void TearDown() override { EXPECT_TRUE(host.unload().ok()); }
-
+// This program runs on the simulator's "empty" host: nothing to enumerate but
+// the host itself, nothing to change, no method but SetAlarmState.
+TEST(Module, EveryProviderAnswersWithoutAdapters) {
     Host host;
-};
-
-TEST_F(Loaded, EveryProviderAnswersWithoutAdapters) {
+    ASSERT_TRUE(host.load(TVRN_MODULE, TVRN_MODULE_REG).ok());
     Registrations regs;
     std::map<std::string, const CPTA::Meta_Class*> classes;
     for (CPTA::Registration* r : regs.list)
@@ -235,30 +212,18 @@ TEST_F(Loaded, EveryProviderAnswersWithoutAdapters) {
 
     EXPECT_TRUE(host.subscribe(NS, "TAVRIN_AlertIndication").ok());
     EXPECT_TRUE(host.unsubscribe(NS, "TAVRIN_AlertIndication").ok());
+    EXPECT_TRUE(host.unload().ok());
 }
 
 TEST(Module, ClassesAreCheckedAgainstTheProvidersClass) {
     // Classes routed to the FC port provider that it does not serve as such.
     std::string reg = tvrntest::log_home() + "/routing.reg";
-    std::ofstream(reg) << R"(
-[No_Such_Class]
-   provider: TAVRIN_FCPort_Provider
-   location: tvrnprovider
-   type: instance method
-   namespace: root/tavrin
-
-[CIM_FCPort]
-   provider: TAVRIN_FCPort_Provider
-   location: tvrnprovider
-   type: instance method
-   namespace: root/tavrin
-
-[TAVRIN_PortController]
-   provider: TAVRIN_FCPort_Provider
-   location: tvrnprovider
-   type: instance method
-   namespace: root/tavrin
-)";
+    {
+        std::ofstream os(reg);
+        for (const char* c : {"No_Such_Class", "CIM_FCPort", "TAVRIN_PortController"})
+            os << "[" << c << "]\n   provider: TAVRIN_FCPort_Provider\n   location: tvrnprovider\n"
+               << "   type: instance method\n   namespace: root/tavrin\n\n";
+    }
     Host host;
     ASSERT_TRUE(host.load(TVRN_MODULE, reg).ok());
     EXPECT_EQ(host.enumerateInstances(NS, "No_Such_Class").rc, CMPI_RC_ERR_FAILED);
