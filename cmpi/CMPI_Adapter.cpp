@@ -191,8 +191,7 @@ int _request_class(CMPI_Adapter* adapter, const CMPIObjectPath* op, const Meta_C
     return mc ? CMPI_RC_OK : CMPI_RC_ERR_FAILED;
 }
 
-Entry_Status _target_class(CMPI_Adapter* adapter, const CMPIObjectPath* op,
-                           const Meta_Class*& mc) {
+Entry_Status _target_class(CMPI_Adapter* adapter, const CMPIObjectPath* op, const Meta_Class*& mc) {
     if (_request_class(adapter, op, mc) != CMPI_RC_OK)
         return CMPI_RC_ERR_FAILED;
     const Meta_Class* own = adapter->meta_class();
@@ -342,13 +341,13 @@ int cimple_cmpi_adapter(CMPI_Static_Data* static_data, const Registration* regis
 }
 
 void* __create_mi(CMPI_Static_Data* static_data, const Registration* registration,
-                  const CMPIBroker* broker, const CMPIContext* context,
-                  const char* provider_name, char kind, CMPIStatus* rc) {
+                  const CMPIBroker* broker, const CMPIContext* context, const char* provider_name,
+                  char kind, CMPIStatus* rc) {
     String message;
     try {
         void* mi = nullptr;
-        if (cimple_cmpi_adapter(static_data, registration, broker, context, provider_name,
-                                kind, &mi) == 0) {
+        if (cimple_cmpi_adapter(static_data, registration, broker, context, provider_name, kind,
+                                &mi) == 0) {
             if (rc) {
                 rc->rc = CMPI_RC_OK;
                 rc->msg = nullptr;
@@ -450,129 +449,133 @@ CMPIStatus CMPI_Adapter::associationCleanup(CMPIAssociationMI* mi, const CMPICon
 
 CMPIStatus CMPI_Adapter::enumInstanceNames(CMPIInstanceMI* mi, const CMPIContext* context,
                                            const CMPIResult* result, const CMPIObjectPath* op) {
-    return run_entry("enumInstanceNames", mi ? mi->hdl : nullptr, context,
-                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
-        Instance* model = nullptr;
-        int rc = make_cimple_reference(adapter->_broker, mc, op, model);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(model);
-        __set_null_flags(model, false, true, true);  // only the keys are wanted
+    return run_entry(
+        "enumInstanceNames", mi ? mi->hdl : nullptr, context,
+        [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+            const Meta_Class* mc = nullptr;
+            Entry_Status cls = _target_class(adapter, op, mc);
+            if (cls.rc != CMPI_RC_OK)
+                return cls;
+            Instance* model = nullptr;
+            int rc = make_cimple_reference(adapter->_broker, mc, op, model);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            Ref<> hold(model);
+            __set_null_flags(model, false, true, true);  // only the keys are wanted
 
-        Result_Data data = {adapter->_broker, result, name_space_of(op), nullptr, false};
-        Enum_Instances_Status status =
-            adapter->enum_instances(model, _enum_instance_names_proc, &data);
-        if (status == ENUM_INSTANCES_FAILED)
-            return CMPI_RC_ERR_FAILED;
-        if (status == ENUM_INSTANCES_ACCESS_DENIED)
-            return CMPI_RC_ERR_ACCESS_DENIED;
-        return _done(result);
-    });
+            Result_Data data = {adapter->_broker, result, name_space_of(op), nullptr, false};
+            Enum_Instances_Status status =
+                adapter->enum_instances(model, _enum_instance_names_proc, &data);
+            if (status == ENUM_INSTANCES_FAILED)
+                return CMPI_RC_ERR_FAILED;
+            if (status == ENUM_INSTANCES_ACCESS_DENIED)
+                return CMPI_RC_ERR_ACCESS_DENIED;
+            return _done(result);
+        });
 }
 
 CMPIStatus CMPI_Adapter::enumInstances(CMPIInstanceMI* mi, const CMPIContext* context,
                                        const CMPIResult* result, const CMPIObjectPath* op,
                                        const char** properties) {
-    return run_entry("enumInstances", mi ? mi->hdl : nullptr, context,
-                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
-        Instance* model = nullptr;
-        int rc = make_cimple_reference(adapter->_broker, mc, op, model);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(model);
-        if (properties)
-            filter_properties(model, properties, true);
+    return run_entry(
+        "enumInstances", mi ? mi->hdl : nullptr, context,
+        [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+            const Meta_Class* mc = nullptr;
+            Entry_Status cls = _target_class(adapter, op, mc);
+            if (cls.rc != CMPI_RC_OK)
+                return cls;
+            Instance* model = nullptr;
+            int rc = make_cimple_reference(adapter->_broker, mc, op, model);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            Ref<> hold(model);
+            if (properties)
+                filter_properties(model, properties, true);
 
-        Result_Data data = {adapter->_broker, result, name_space_of(op), properties, false};
-        Enum_Instances_Status status =
-            adapter->enum_instances(model, _enum_instances_proc, &data);
-        if (status == ENUM_INSTANCES_FAILED)
-            return CMPI_RC_ERR_FAILED;
-        if (status == ENUM_INSTANCES_ACCESS_DENIED)
-            return CMPI_RC_ERR_ACCESS_DENIED;
-        return _done(result);
-    });
+            Result_Data data = {adapter->_broker, result, name_space_of(op), properties, false};
+            Enum_Instances_Status status =
+                adapter->enum_instances(model, _enum_instances_proc, &data);
+            if (status == ENUM_INSTANCES_FAILED)
+                return CMPI_RC_ERR_FAILED;
+            if (status == ENUM_INSTANCES_ACCESS_DENIED)
+                return CMPI_RC_ERR_ACCESS_DENIED;
+            return _done(result);
+        });
 }
 
 CMPIStatus CMPI_Adapter::getInstance(CMPIInstanceMI* mi, const CMPIContext* context,
                                      const CMPIResult* result, const CMPIObjectPath* op,
                                      const char** properties) {
-    return run_entry("getInstance", mi ? mi->hdl : nullptr, context,
-                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
-        Instance* model = nullptr;
-        int rc = make_cimple_reference(adapter->_broker, mc, op, model);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(model);
-        filter_properties(model, nullptr, true);
-        if (properties)
-            filter_properties(model, properties, true);
+    return run_entry(
+        "getInstance", mi ? mi->hdl : nullptr, context,
+        [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+            const Meta_Class* mc = nullptr;
+            Entry_Status cls = _target_class(adapter, op, mc);
+            if (cls.rc != CMPI_RC_OK)
+                return cls;
+            Instance* model = nullptr;
+            int rc = make_cimple_reference(adapter->_broker, mc, op, model);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            Ref<> hold(model);
+            filter_properties(model, nullptr, true);
+            if (properties)
+                filter_properties(model, properties, true);
 
-        Instance* found = nullptr;
-        Get_Instance_Status status = adapter->get_instance(model, found);
-        Ref<> hold_found(found);
-        switch (status) {
-            case GET_INSTANCE_NOT_FOUND: return CMPI_RC_ERR_NOT_FOUND;
-            case GET_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_FAILED;
-            case GET_INSTANCE_INVALID_PARAMETER: return CMPI_RC_ERR_INVALID_PARAMETER;
-            case GET_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
-            case GET_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
-            default: break;
-        }
-        if (!found)
-            return Entry_Status(CMPI_RC_ERR_FAILED, "provider returned no instance");
-        Result_Data data = {adapter->_broker, result, name_space_of(op), properties, false};
-        rc = _return_instance(&data, found);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        return _done(result);
-    });
+            Instance* found = nullptr;
+            Get_Instance_Status status = adapter->get_instance(model, found);
+            Ref<> hold_found(found);
+            switch (status) {
+                case GET_INSTANCE_NOT_FOUND: return CMPI_RC_ERR_NOT_FOUND;
+                case GET_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_FAILED;
+                case GET_INSTANCE_INVALID_PARAMETER: return CMPI_RC_ERR_INVALID_PARAMETER;
+                case GET_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+                case GET_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
+                default: break;
+            }
+            if (!found)
+                return Entry_Status(CMPI_RC_ERR_FAILED, "provider returned no instance");
+            Result_Data data = {adapter->_broker, result, name_space_of(op), properties, false};
+            rc = _return_instance(&data, found);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            return _done(result);
+        });
 }
 
 CMPIStatus CMPI_Adapter::createInstance(CMPIInstanceMI* mi, const CMPIContext* context,
                                         const CMPIResult* result, const CMPIObjectPath* op,
                                         const CMPIInstance* cmpi_instance) {
-    return run_entry("createInstance", mi ? mi->hdl : nullptr, context,
-                     [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
-        Instance* instance = nullptr;
-        int rc = make_cimple_instance(adapter->_broker, mc, op, cmpi_instance, instance);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(instance);
+    return run_entry(
+        "createInstance", mi ? mi->hdl : nullptr, context,
+        [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
+            const Meta_Class* mc = nullptr;
+            Entry_Status cls = _target_class(adapter, op, mc);
+            if (cls.rc != CMPI_RC_OK)
+                return cls;
+            Instance* instance = nullptr;
+            int rc = make_cimple_instance(adapter->_broker, mc, op, cmpi_instance, instance);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            Ref<> hold(instance);
 
-        switch (adapter->create_instance(instance)) {
-            case CREATE_INSTANCE_DUPLICATE: return CMPI_RC_ERR_ALREADY_EXISTS;
-            case CREATE_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
-            case CREATE_INSTANCE_INVALID_PARAMETER: return CMPI_RC_ERR_INVALID_PARAMETER;
-            case CREATE_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
-            case CREATE_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
-            default: break;
-        }
-        String ns = name_space_of(op);
-        CMPIObjectPath* created = nullptr;
-        rc = make_cmpi_object_path(adapter->_broker, instance, ns.c_str(), created);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Cmpi_Ptr<CMPIObjectPath> hold_path(created);
-        CMReturnObjectPath(result, created);
-        return _done(result);
-    });
+            switch (adapter->create_instance(instance)) {
+                case CREATE_INSTANCE_DUPLICATE: return CMPI_RC_ERR_ALREADY_EXISTS;
+                case CREATE_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+                case CREATE_INSTANCE_INVALID_PARAMETER: return CMPI_RC_ERR_INVALID_PARAMETER;
+                case CREATE_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+                case CREATE_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
+                default: break;
+            }
+            String ns = name_space_of(op);
+            CMPIObjectPath* created = nullptr;
+            rc = make_cmpi_object_path(adapter->_broker, instance, ns.c_str(), created);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            Cmpi_Ptr<CMPIObjectPath> hold_path(created);
+            CMReturnObjectPath(result, created);
+            return _done(result);
+        });
 }
 
 CMPIStatus CMPI_Adapter::modifyInstance(CMPIInstanceMI* mi, const CMPIContext* context,
@@ -581,65 +584,66 @@ CMPIStatus CMPI_Adapter::modifyInstance(CMPIInstanceMI* mi, const CMPIContext* c
                                         const char** properties) {
     return run_entry("modifyInstance", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
-        Instance* instance = nullptr;
-        int rc = make_cimple_instance(adapter->_broker, mc, op, cmpi_instance, instance);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(instance);
-        Ref<> model(clone(instance));
-        if (!model)
-            return CMPI_RC_ERR_FAILED;
-        if (properties)
-            filter_properties(model.ptr(), properties, true);
+                         const Meta_Class* mc = nullptr;
+                         Entry_Status cls = _target_class(adapter, op, mc);
+                         if (cls.rc != CMPI_RC_OK)
+                             return cls;
+                         Instance* instance = nullptr;
+                         int rc = make_cimple_instance(adapter->_broker, mc, op, cmpi_instance,
+                                                       instance);
+                         if (rc != CMPI_RC_OK)
+                             return rc;
+                         Ref<> hold(instance);
+                         Ref<> model(clone(instance));
+                         if (!model)
+                             return CMPI_RC_ERR_FAILED;
+                         if (properties)
+                             filter_properties(model.ptr(), properties, true);
 
-        switch (adapter->modify_instance(model.ptr(), instance)) {
-            case MODIFY_INSTANCE_NOT_FOUND: return CMPI_RC_ERR_NOT_FOUND;
-            case MODIFY_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
-            case MODIFY_INSTANCE_INVALID_PARAMETER: return CMPI_RC_ERR_INVALID_PARAMETER;
-            case MODIFY_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
-            case MODIFY_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
-            default: break;
-        }
-        return _done(result);
-    });
+                         switch (adapter->modify_instance(model.ptr(), instance)) {
+                             case MODIFY_INSTANCE_NOT_FOUND: return CMPI_RC_ERR_NOT_FOUND;
+                             case MODIFY_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+                             case MODIFY_INSTANCE_INVALID_PARAMETER:
+                                 return CMPI_RC_ERR_INVALID_PARAMETER;
+                             case MODIFY_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+                             case MODIFY_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
+                             default: break;
+                         }
+                         return _done(result);
+                     });
 }
 
 CMPIStatus CMPI_Adapter::deleteInstance(CMPIInstanceMI* mi, const CMPIContext* context,
                                         const CMPIResult* result, const CMPIObjectPath* op) {
     return run_entry("deleteInstance", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
-        Instance* instance = nullptr;
-        int rc = make_cimple_reference(adapter->_broker, mc, op, instance);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(instance);
+                         const Meta_Class* mc = nullptr;
+                         Entry_Status cls = _target_class(adapter, op, mc);
+                         if (cls.rc != CMPI_RC_OK)
+                             return cls;
+                         Instance* instance = nullptr;
+                         int rc = make_cimple_reference(adapter->_broker, mc, op, instance);
+                         if (rc != CMPI_RC_OK)
+                             return rc;
+                         Ref<> hold(instance);
 
-        switch (adapter->delete_instance(instance)) {
-            case DELETE_INSTANCE_NOT_FOUND: return CMPI_RC_ERR_NOT_FOUND;
-            case DELETE_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
-            case DELETE_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
-            case DELETE_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
-            default: break;
-        }
-        return _done(result);
-    });
+                         switch (adapter->delete_instance(instance)) {
+                             case DELETE_INSTANCE_NOT_FOUND: return CMPI_RC_ERR_NOT_FOUND;
+                             case DELETE_INSTANCE_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+                             case DELETE_INSTANCE_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+                             case DELETE_INSTANCE_FAILED: return CMPI_RC_ERR_FAILED;
+                             default: break;
+                         }
+                         return _done(result);
+                     });
 }
 
 CMPIStatus CMPI_Adapter::execQuery(CMPIInstanceMI* mi, const CMPIContext* context,
                                    const CMPIResult*, const CMPIObjectPath*, const char*,
                                    const char*) {
-    return run_entry("execQuery", mi ? mi->hdl : nullptr, context,
-                     [&](CMPI_Adapter*, Entry_Scope&) -> Entry_Status {
-                         return CMPI_RC_ERR_NOT_SUPPORTED;
-                     });
+    return run_entry(
+        "execQuery", mi ? mi->hdl : nullptr, context,
+        [&](CMPI_Adapter*, Entry_Scope&) -> Entry_Status { return CMPI_RC_ERR_NOT_SUPPORTED; });
 }
 
 }  // namespace CPTA

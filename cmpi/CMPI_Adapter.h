@@ -56,9 +56,8 @@ class CMPI_Adapter : public Provider_Handle {
 public:
     // Creates and loads the provider (within a thread context of this call)
     // and fills the static data.
-    CMPI_Adapter(const CMPIBroker* broker, const CMPIContext* context,
-                 const char* provider_name, const Registration* registration,
-                 CMPI_Static_Data* static_data);
+    CMPI_Adapter(const CMPIBroker* broker, const CMPIContext* context, const char* provider_name,
+                 const Registration* registration, CMPI_Static_Data* static_data);
     // Marks the static data dead and destroys the provider.
     ~CMPI_Adapter() override;
 
@@ -73,8 +72,7 @@ public:
     static CMPI_Adapter* from_handle(void* hdl);
 
     // Shared by the four cleanup entries.
-    static CMPIStatus cleanup(CMPI_Adapter* adapter, const CMPIContext* context,
-                              bool terminating);
+    static CMPIStatus cleanup(CMPI_Adapter* adapter, const CMPIContext* context, bool terminating);
 
     // The entries of the four MI function tables.
     static CMPIStatus instanceCleanup(CMPIInstanceMI* mi, const CMPIContext* context,
@@ -177,8 +175,8 @@ int cimple_cmpi_adapter(CMPI_Static_Data* static_data, const Registration* regis
 // What the exported MI factories do: the MI record of the kind, or null
 // with *rc set to CMPI_RC_ERR_FAILED and a message. Never throws.
 void* __create_mi(CMPI_Static_Data* static_data, const Registration* registration,
-                  const CMPIBroker* broker, const CMPIContext* context,
-                  const char* provider_name, char kind, CMPIStatus* rc);
+                  const CMPIBroker* broker, const CMPIContext* context, const char* provider_name,
+                  char kind, CMPIStatus* rc);
 
 // The name of a CMPI return code, for the log.
 const char* _rc_to_str(int rc);

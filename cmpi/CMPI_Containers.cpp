@@ -219,8 +219,8 @@ int _read_elements(const Meta_Repository* meta_repository, const CMPIBroker* bro
 
 // Instances: the value takes over one reference per element.
 int _read_instance_elements(const Meta_Repository* meta_repository, const CMPIBroker* broker,
-                            const char* name_space, const CMPIArray* array,
-                            CMPIType element_type, Value& value) {
+                            const char* name_space, const CMPIArray* array, CMPIType element_type,
+                            Value& value) {
     CMPIStatus rc = {CMPI_RC_OK, nullptr};
     CMPICount n = CMGetArrayCount(array, &rc);
     if (rc.rc != CMPI_RC_OK)
@@ -271,21 +271,51 @@ int _read_array(const Meta_Repository* meta_repository, const CMPIBroker* broker
     }
     const CMPIArray* a = data.value.array;
     switch (tag) {
-        case Value::BOOLEAN: return _read_elements<boolean>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::UINT8: return _read_elements<uint8>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::SINT8: return _read_elements<sint8>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::UINT16: return _read_elements<uint16>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::SINT16: return _read_elements<sint16>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::UINT32: return _read_elements<uint32>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::SINT32: return _read_elements<sint32>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::UINT64: return _read_elements<uint64>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::SINT64: return _read_elements<sint64>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::REAL32: return _read_elements<real32>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::REAL64: return _read_elements<real64>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::CHAR16: return _read_elements<char16>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::STRING: return _read_elements<String>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::DATETIME: return _read_elements<Datetime>(meta_repository, broker, name_space, a, element_type, value);
-        case Value::INSTANCE: return _read_instance_elements(meta_repository, broker, name_space, a, element_type, value);
+        case Value::BOOLEAN:
+            return _read_elements<boolean>(meta_repository, broker, name_space, a, element_type,
+                                           value);
+        case Value::UINT8:
+            return _read_elements<uint8>(meta_repository, broker, name_space, a, element_type,
+                                         value);
+        case Value::SINT8:
+            return _read_elements<sint8>(meta_repository, broker, name_space, a, element_type,
+                                         value);
+        case Value::UINT16:
+            return _read_elements<uint16>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::SINT16:
+            return _read_elements<sint16>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::UINT32:
+            return _read_elements<uint32>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::SINT32:
+            return _read_elements<sint32>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::UINT64:
+            return _read_elements<uint64>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::SINT64:
+            return _read_elements<sint64>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::REAL32:
+            return _read_elements<real32>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::REAL64:
+            return _read_elements<real64>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::CHAR16:
+            return _read_elements<char16>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::STRING:
+            return _read_elements<String>(meta_repository, broker, name_space, a, element_type,
+                                          value);
+        case Value::DATETIME:
+            return _read_elements<Datetime>(meta_repository, broker, name_space, a, element_type,
+                                            value);
+        case Value::INSTANCE:
+            return _read_instance_elements(meta_repository, broker, name_space, a, element_type,
+                                           value);
         default: break;
     }
     TVRN_WARN("type mismatch");
@@ -344,8 +374,8 @@ int _instance_to_cmpi(const Meta_Repository* meta_repository, const CMPIBroker* 
 
 template <class T>
 int _write_elements(const Meta_Repository* meta_repository, const CMPIBroker* broker,
-                    const char* name_space, const Value& value, uint32 flags,
-                    CMPIType element_type, CMPIArray*& out, Cmpi_Objects* made) {
+                    const char* name_space, const Value& value, uint32 flags, CMPIType element_type,
+                    CMPIArray*& out, Cmpi_Objects* made) {
     Array<T> elements;
     if (value.get_value(elements) != 0)
         return -1;
@@ -416,21 +446,51 @@ int _write_array(const Meta_Repository* meta_repository, const CMPIBroker* broke
                  const char* name_space, const Value& value, uint32 flags, CMPIType element_type,
                  CMPIArray*& out, Cmpi_Objects* made) {
     switch (value.type() - Value::ARRAY) {
-        case Value::BOOLEAN: return _write_elements<boolean>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::UINT8: return _write_elements<uint8>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::SINT8: return _write_elements<sint8>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::UINT16: return _write_elements<uint16>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::SINT16: return _write_elements<sint16>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::UINT32: return _write_elements<uint32>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::SINT32: return _write_elements<sint32>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::UINT64: return _write_elements<uint64>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::SINT64: return _write_elements<sint64>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::REAL32: return _write_elements<real32>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::REAL64: return _write_elements<real64>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::CHAR16: return _write_elements<char16>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::STRING: return _write_elements<String>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::DATETIME: return _write_elements<Datetime>(meta_repository, broker, name_space, value, flags, element_type, out, made);
-        case Value::INSTANCE: return _write_elements<Instance*>(meta_repository, broker, name_space, value, flags, element_type, out, made);
+        case Value::BOOLEAN:
+            return _write_elements<boolean>(meta_repository, broker, name_space, value, flags,
+                                            element_type, out, made);
+        case Value::UINT8:
+            return _write_elements<uint8>(meta_repository, broker, name_space, value, flags,
+                                          element_type, out, made);
+        case Value::SINT8:
+            return _write_elements<sint8>(meta_repository, broker, name_space, value, flags,
+                                          element_type, out, made);
+        case Value::UINT16:
+            return _write_elements<uint16>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::SINT16:
+            return _write_elements<sint16>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::UINT32:
+            return _write_elements<uint32>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::SINT32:
+            return _write_elements<sint32>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::UINT64:
+            return _write_elements<uint64>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::SINT64:
+            return _write_elements<sint64>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::REAL32:
+            return _write_elements<real32>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::REAL64:
+            return _write_elements<real64>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::CHAR16:
+            return _write_elements<char16>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::STRING:
+            return _write_elements<String>(meta_repository, broker, name_space, value, flags,
+                                           element_type, out, made);
+        case Value::DATETIME:
+            return _write_elements<Datetime>(meta_repository, broker, name_space, value, flags,
+                                             element_type, out, made);
+        case Value::INSTANCE:
+            return _write_elements<Instance*>(meta_repository, broker, name_space, value, flags,
+                                              element_type, out, made);
         default: break;
     }
     TVRN_WARN("missing type");
@@ -541,8 +601,7 @@ int cmpi_to_cimple_value(const Meta_Repository* meta_repository, const CMPIBroke
 
         case CMPI_dateTime: {
             String text;
-            if (!v.dateTime ||
-                !_take_string(CMGetStringFormat(v.dateTime, nullptr), text)) {
+            if (!v.dateTime || !_take_string(CMGetStringFormat(v.dateTime, nullptr), text)) {
                 TVRN_WARN("CMGetStringFormat() failed");
                 return -1;
             }
@@ -558,19 +617,17 @@ int cmpi_to_cimple_value(const Meta_Repository* meta_repository, const CMPIBroke
         case CMPI_ref:
         case CMPI_instance: {
             Instance* instance = nullptr;
-            int r = data.type == CMPI_ref
-                        ? _object_to_instance(meta_repository, broker, name_space, v.ref,
-                                              nullptr, instance)
-                        : _object_to_instance(meta_repository, broker, name_space, nullptr,
-                                              v.inst, instance);
+            int r = data.type == CMPI_ref ? _object_to_instance(meta_repository, broker, name_space,
+                                                                v.ref, nullptr, instance)
+                                          : _object_to_instance(meta_repository, broker, name_space,
+                                                                nullptr, v.inst, instance);
             if (r != 0)
                 return -1;
             value.set_value(instance);
             return 0;
         }
 
-        default:
-            break;
+        default: break;
     }
     TVRN_WARN("type mismatch");
     return -1;
@@ -588,18 +645,38 @@ int to_cmpi_scalar(const Meta_Repository* meta_repository, const CMPIBroker* bro
     CMPIStatus rc = {CMPI_RC_OK, nullptr};
 
     switch (value.type()) {
-        case Value::BOOLEAN: { boolean x = false; value.get_value(x); cv.boolean = x; return 0; }
+        case Value::BOOLEAN: {
+            boolean x = false;
+            value.get_value(x);
+            cv.boolean = x;
+            return 0;
+        }
         case Value::UINT8: value.get_value(cv.uint8); return 0;
         case Value::SINT8: value.get_value(cv.sint8); return 0;
         case Value::UINT16: value.get_value(cv.uint16); return 0;
         case Value::SINT16: value.get_value(cv.sint16); return 0;
         case Value::UINT32: value.get_value(cv.uint32); return 0;
         case Value::SINT32: value.get_value(cv.sint32); return 0;
-        case Value::UINT64: { uint64 x = 0; value.get_value(x); cv.uint64 = x; return 0; }
-        case Value::SINT64: { sint64 x = 0; value.get_value(x); cv.sint64 = x; return 0; }
+        case Value::UINT64: {
+            uint64 x = 0;
+            value.get_value(x);
+            cv.uint64 = x;
+            return 0;
+        }
+        case Value::SINT64: {
+            sint64 x = 0;
+            value.get_value(x);
+            cv.sint64 = x;
+            return 0;
+        }
         case Value::REAL32: value.get_value(cv.real32); return 0;
         case Value::REAL64: value.get_value(cv.real64); return 0;
-        case Value::CHAR16: { char16 x; value.get_value(x); cv.char16 = x.code; return 0; }
+        case Value::CHAR16: {
+            char16 x;
+            value.get_value(x);
+            cv.char16 = x.code;
+            return 0;
+        }
 
         case Value::STRING: {
             String s;
@@ -644,8 +721,7 @@ int to_cmpi_scalar(const Meta_Repository* meta_repository, const CMPIBroker* bro
             return 0;
         }
 
-        default:
-            break;
+        default: break;
     }
     TVRN_WARN("unexpected type");
     return -1;
@@ -671,8 +747,7 @@ int _to_cmpi_data(const Meta_Repository* meta_repository, const CMPIBroker* brok
     }
     if (is_array) {
         CMPIArray* array = nullptr;
-        if (_write_array(meta_repository, broker, name_space, value, flags, type, array, made) !=
-            0)
+        if (_write_array(meta_repository, broker, name_space, value, flags, type, array, made) != 0)
             return -1;
         if (made)
             made->add(array);
@@ -680,8 +755,8 @@ int _to_cmpi_data(const Meta_Repository* meta_repository, const CMPIBroker* brok
         data.value.array = array;
         return 0;
     }
-    return to_cmpi_scalar(meta_repository, broker, name_space, value, flags, data.value,
-                          data.type, made);
+    return to_cmpi_scalar(meta_repository, broker, name_space, value, flags, data.value, data.type,
+                          made);
 }
 
 //------------------------------------------------------------------------------
@@ -750,23 +825,21 @@ int CMPIInstance_Container::get_name(size_t pos, String& name) {
 }
 
 int CMPIInstance_Container::get_value(size_t pos, Value::Type expected, Value& value) {
-    return _get_value(pos, expected, value, "CMGetPropertyAt()",
-                      [this](CMPICount i, CMPIStatus* rc) {
-                          return CMGetPropertyAt(_instance, i, nullptr, rc);
-                      });
+    return _get_value(
+        pos, expected, value, "CMGetPropertyAt()",
+        [this](CMPICount i, CMPIStatus* rc) { return CMGetPropertyAt(_instance, i, nullptr, rc); });
 }
 
 int CMPIInstance_Container::set_value(const char* name, const Value& value, uint32 flags) {
     CMPIData data;
     Cmpi_Objects made;
-    if (_to_cmpi_data(meta_repository(), _broker, _name_space.c_str(), value, flags, data,
-                      &made) != 0) {
+    if (_to_cmpi_data(meta_repository(), _broker, _name_space.c_str(), value, flags, data, &made) !=
+        0) {
         TVRN_WARN("_to_cmpi_data() failed: feature=%s", name);
         return -1;
     }
     CMPIStatus rc = CMSetProperty(_instance, name,
-                                  (data.state & CMPI_nullValue) ? nullptr : &data.value,
-                                  data.type);
+                                  (data.state & CMPI_nullValue) ? nullptr : &data.value, data.type);
     if (rc.rc != CMPI_RC_OK) {
         TVRN_WARN("CMSetProperty() failed: %s", name);
         return -1;
@@ -777,8 +850,7 @@ int CMPIInstance_Container::set_value(const char* name, const Value& value, uint
 // Object paths
 
 CMPIObjectPath_Container::CMPIObjectPath_Container(const Meta_Repository* meta_repository,
-                                                   const CMPIBroker* broker,
-                                                   const char* name_space,
+                                                   const CMPIBroker* broker, const char* name_space,
                                                    const CMPIObjectPath* object_path)
     : CMPI_Container(meta_repository, broker, name_space), _object_path(object_path) {}
 
@@ -795,10 +867,9 @@ int CMPIObjectPath_Container::get_name(size_t pos, String& name) {
 }
 
 int CMPIObjectPath_Container::get_value(size_t pos, Value::Type expected, Value& value) {
-    return _get_value(pos, expected, value, "CMGetKeyAt()",
-                      [this](CMPICount i, CMPIStatus* rc) {
-                          return CMGetKeyAt(_object_path, i, nullptr, rc);
-                      });
+    return _get_value(pos, expected, value, "CMGetKeyAt()", [this](CMPICount i, CMPIStatus* rc) {
+        return CMGetKeyAt(_object_path, i, nullptr, rc);
+    });
 }
 
 bool CMPIObjectPath_Container::_repair(Value& value, Value::Type expected) {
@@ -809,8 +880,8 @@ bool CMPIObjectPath_Container::_repair(Value& value, Value::Type expected) {
 int CMPIObjectPath_Container::set_value(const char* name, const Value& value, uint32 flags) {
     CMPIData data;
     Cmpi_Objects made;
-    if (_to_cmpi_data(meta_repository(), _broker, _name_space.c_str(), value, flags, data,
-                      &made) != 0) {
+    if (_to_cmpi_data(meta_repository(), _broker, _name_space.c_str(), value, flags, data, &made) !=
+        0) {
         TVRN_WARN("_to_cmpi_data() failed: feature=%s", name);
         return -1;
     }
@@ -828,9 +899,7 @@ int CMPIObjectPath_Container::set_value(const char* name, const Value& value, ui
 CMPIArgs_Container::CMPIArgs_Container(const Meta_Repository* meta_repository,
                                        const CMPIBroker* broker, const char* name_space,
                                        const CMPIArgs* args)
-    : CMPI_Container(meta_repository, broker, name_space),
-      _args(args),
-      _has_return_value(false) {
+    : CMPI_Container(meta_repository, broker, name_space), _args(args), _has_return_value(false) {
     std::memset(&_return_value, 0, sizeof(_return_value));
 }
 
@@ -843,16 +912,14 @@ size_t CMPIArgs_Container::get_size() {
 }
 
 int CMPIArgs_Container::get_name(size_t pos, String& name) {
-    return _fetch_name(name, [&](CMPIString** s, CMPIStatus* rc) {
-        CMGetArgAt(_args, CMPICount(pos), s, rc);
-    });
+    return _fetch_name(
+        name, [&](CMPIString** s, CMPIStatus* rc) { CMGetArgAt(_args, CMPICount(pos), s, rc); });
 }
 
 int CMPIArgs_Container::get_value(size_t pos, Value::Type expected, Value& value) {
-    return _get_value(pos, expected, value, "CMGetArgAt()",
-                      [this](CMPICount i, CMPIStatus* rc) {
-                          return CMGetArgAt(_args, i, nullptr, rc);
-                      });
+    return _get_value(pos, expected, value, "CMGetArgAt()", [this](CMPICount i, CMPIStatus* rc) {
+        return CMGetArgAt(_args, i, nullptr, rc);
+    });
 }
 
 bool CMPIArgs_Container::_repair(Value& value, Value::Type expected) {
@@ -868,8 +935,8 @@ bool CMPIArgs_Container::_repair(Value& value, Value::Type expected) {
 int CMPIArgs_Container::set_value(const char* name, const Value& value, uint32 flags) {
     CMPIData data;
     Cmpi_Objects made;
-    if (_to_cmpi_data(meta_repository(), _broker, _name_space.c_str(), value, flags, data,
-                      &made) != 0) {
+    if (_to_cmpi_data(meta_repository(), _broker, _name_space.c_str(), value, flags, data, &made) !=
+        0) {
         TVRN_WARN("_to_cmpi_data() failed: feature=%s", name);
         return -1;
     }
@@ -880,8 +947,8 @@ int CMPIArgs_Container::set_value(const char* name, const Value& value, uint32 f
         _has_return_value = true;
         return 0;
     }
-    CMPIStatus rc = CMAddArg(_args, name, (data.state & CMPI_nullValue) ? nullptr : &data.value,
-                             data.type);
+    CMPIStatus rc =
+        CMAddArg(_args, name, (data.state & CMPI_nullValue) ? nullptr : &data.value, data.type);
     if (rc.rc != CMPI_RC_OK) {
         TVRN_WARN("CMAddArg() failed");
         return -1;
@@ -889,8 +956,7 @@ int CMPIArgs_Container::set_value(const char* name, const Value& value, uint32 f
     return 0;
 }
 
-bool CMPIArgs_Container::take_return_value(CMPIValue& value, CMPIType& type,
-                                           Cmpi_Objects* made) {
+bool CMPIArgs_Container::take_return_value(CMPIValue& value, CMPIType& type, Cmpi_Objects* made) {
     if (!_has_return_value)
         return false;
     value = _return_value.value;

@@ -87,8 +87,8 @@ bool _associator_instances_proc(Instance* instance, Enum_Associator_Names_Status
             return rc;
         Cmpi_Ptr<CMPIObjectPath> hold_op(op);
         CMPIStatus st = {CMPI_RC_OK, nullptr};
-        CMPIInstance* ci = CBGetInstance(d->broker, d->context, op,
-                                         const_cast<const char**>(d->properties), &st);
+        CMPIInstance* ci =
+            CBGetInstance(d->broker, d->context, op, const_cast<const char**>(d->properties), &st);
         if (!ci)
             return CMPI_RC_ERR_NOT_FOUND;
         Cmpi_Ptr<CMPIInstance> hold_ci(ci);
@@ -146,8 +146,7 @@ bool _references_proc(Instance* instance, Enum_References_Status, void* data) {
     });
 }
 
-Entry_Status _map_associator_names(Enum_Associator_Names_Status status,
-                                   const CMPIResult* result) {
+Entry_Status _map_associator_names(Enum_Associator_Names_Status status, const CMPIResult* result) {
     switch (status) {
         case ENUM_ASSOCIATOR_NAMES_FAILED: return CMPI_RC_ERR_FAILED;
         case ENUM_ASSOCIATOR_NAMES_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
@@ -190,101 +189,102 @@ CMPIStatus CMPI_Adapter::associators(CMPIAssociationMI* mi, const CMPIContext* c
                                      const char* result_role, const char** properties) {
     return run_entry("associators", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
-        Instance* source = nullptr;
-        int rc = _source(adapter, op, source);
-        if (rc == CMPI_RC_ERR_INVALID_CLASS)
-            return CMPI_RC_OK;  // nothing is associated with an unknown class
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(source);
+                         Instance* source = nullptr;
+                         int rc = _source(adapter, op, source);
+                         if (rc == CMPI_RC_ERR_INVALID_CLASS)
+                             return CMPI_RC_OK;  // nothing is associated with an unknown class
+                         if (rc != CMPI_RC_OK)
+                             return rc;
+                         Ref<> hold(source);
 
-        String rcls = _string_or_empty(result_class), rl = _string_or_empty(role),
-               rrl = _string_or_empty(result_role);
-        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
-                                 name_space_of(op), properties, false};
-        Enum_Associators_Status status =
-            adapter->enum_associators(source, rcls, rl, rrl, _associators_proc, &data);
-        switch (status) {
-            case ENUM_ASSOCIATORS_FAILED: return CMPI_RC_ERR_FAILED;
-            case ENUM_ASSOCIATORS_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
-            case ENUM_ASSOCIATORS_UNSUPPORTED: break;
-            default: CMReturnDone(result); return CMPI_RC_OK;
-        }
-        return _map_associator_names(
-            adapter->enum_associator_names(source, rcls, rl, rrl, _associator_instances_proc,
-                                           &data),
-            result);
-    });
+                         String rcls = _string_or_empty(result_class), rl = _string_or_empty(role),
+                                rrl = _string_or_empty(result_role);
+                         Association_Data data = {adapter->_broker,  scope.cmpi_context(), result,
+                                                  name_space_of(op), properties,           false};
+                         Enum_Associators_Status status = adapter->enum_associators(
+                             source, rcls, rl, rrl, _associators_proc, &data);
+                         switch (status) {
+                             case ENUM_ASSOCIATORS_FAILED: return CMPI_RC_ERR_FAILED;
+                             case ENUM_ASSOCIATORS_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+                             case ENUM_ASSOCIATORS_UNSUPPORTED: break;
+                             default: CMReturnDone(result); return CMPI_RC_OK;
+                         }
+                         return _map_associator_names(
+                             adapter->enum_associator_names(source, rcls, rl, rrl,
+                                                            _associator_instances_proc, &data),
+                             result);
+                     });
 }
 
 CMPIStatus CMPI_Adapter::associatorNames(CMPIAssociationMI* mi, const CMPIContext* context,
                                          const CMPIResult* result, const CMPIObjectPath* op,
-                                         const char*, const char* result_class,
-                                         const char* role, const char* result_role) {
+                                         const char*, const char* result_class, const char* role,
+                                         const char* result_role) {
     return run_entry("associatorNames", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
-        Instance* source = nullptr;
-        int rc = _source(adapter, op, source);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(source);
+                         Instance* source = nullptr;
+                         int rc = _source(adapter, op, source);
+                         if (rc != CMPI_RC_OK)
+                             return rc;
+                         Ref<> hold(source);
 
-        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
-                                 name_space_of(op), nullptr, false};
-        return _map_associator_names(
-            adapter->enum_associator_names(source, _string_or_empty(result_class),
-                                           _string_or_empty(role),
-                                           _string_or_empty(result_role),
-                                           _associator_names_proc, &data),
-            result);
-    });
+                         Association_Data data = {adapter->_broker, scope.cmpi_context(),
+                                                  result,           name_space_of(op),
+                                                  nullptr,          false};
+                         return _map_associator_names(
+                             adapter->enum_associator_names(
+                                 source, _string_or_empty(result_class), _string_or_empty(role),
+                                 _string_or_empty(result_role), _associator_names_proc, &data),
+                             result);
+                     });
 }
 
 CMPIStatus CMPI_Adapter::references(CMPIAssociationMI* mi, const CMPIContext* context,
-                                    const CMPIResult* result, const CMPIObjectPath* op,
-                                    const char*, const char* role, const char** properties) {
+                                    const CMPIResult* result, const CMPIObjectPath* op, const char*,
+                                    const char* role, const char** properties) {
     return run_entry("references", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
-        Instance* source = nullptr;
-        int rc = _source(adapter, op, source);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(source);
-        Ref<> model(create(adapter->_meta_class, false));  // every property wanted
-        if (!model)
-            return CMPI_RC_ERR_FAILED;
+                         Instance* source = nullptr;
+                         int rc = _source(adapter, op, source);
+                         if (rc != CMPI_RC_OK)
+                             return rc;
+                         Ref<> hold(source);
+                         Ref<> model(create(adapter->_meta_class, false));  // every property wanted
+                         if (!model)
+                             return CMPI_RC_ERR_FAILED;
 
-        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
-                                 name_space_of(op), properties, false};
-        return _map_references(adapter->enum_references(source, model.ptr(),
-                                                        _string_or_empty(role),
-                                                        _references_proc, &data),
-                               result);
-    });
+                         Association_Data data = {adapter->_broker,  scope.cmpi_context(), result,
+                                                  name_space_of(op), properties,           false};
+                         return _map_references(
+                             adapter->enum_references(source, model.ptr(), _string_or_empty(role),
+                                                      _references_proc, &data),
+                             result);
+                     });
 }
 
 CMPIStatus CMPI_Adapter::referenceNames(CMPIAssociationMI* mi, const CMPIContext* context,
                                         const CMPIResult* result, const CMPIObjectPath* op,
                                         const char*, const char* role) {
-    return run_entry("referenceNames", mi ? mi->hdl : nullptr, context,
-                     [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
-        Instance* source = nullptr;
-        int rc = _source(adapter, op, source);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        Ref<> hold(source);
-        Ref<> model(create(adapter->_meta_class, false));
-        if (!model)
-            return CMPI_RC_ERR_FAILED;
-        __set_null_flags(model.ptr(), false, true, true);  // only the keys are wanted
+    return run_entry(
+        "referenceNames", mi ? mi->hdl : nullptr, context,
+        [&](CMPI_Adapter* adapter, Entry_Scope& scope) -> Entry_Status {
+            Instance* source = nullptr;
+            int rc = _source(adapter, op, source);
+            if (rc != CMPI_RC_OK)
+                return rc;
+            Ref<> hold(source);
+            Ref<> model(create(adapter->_meta_class, false));
+            if (!model)
+                return CMPI_RC_ERR_FAILED;
+            __set_null_flags(model.ptr(), false, true, true);  // only the keys are wanted
 
-        Association_Data data = {adapter->_broker, scope.cmpi_context(), result,
-                                 name_space_of(op), nullptr, false};
-        return _map_references(adapter->enum_references(source, model.ptr(),
-                                                        _string_or_empty(role),
-                                                        _reference_names_proc, &data),
-                               result);
-    });
+            Association_Data data = {
+                adapter->_broker, scope.cmpi_context(), result, name_space_of(op), nullptr, false};
+            return _map_references(
+                adapter->enum_references(source, model.ptr(), _string_or_empty(role),
+                                         _reference_names_proc, &data),
+                result);
+        });
 }
 
 //------------------------------------------------------------------------------
@@ -296,53 +296,54 @@ CMPIStatus CMPI_Adapter::invokeMethod(CMPIMethodMI* mi, const CMPIContext* conte
                                       const char* method, const CMPIArgs* in, CMPIArgs* out) {
     return run_entry("invokeMethod", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        const Meta_Class* mc = nullptr;
-        Entry_Status cls = _target_class(adapter, op, mc);
-        if (cls.rc == CMPI_RC_ERR_FAILED)
-            return Entry_Status(CMPI_RC_ERR_FAILED, "MetaClass not found");
-        if (cls.rc != CMPI_RC_OK)
-            return cls;
+                         const Meta_Class* mc = nullptr;
+                         Entry_Status cls = _target_class(adapter, op, mc);
+                         if (cls.rc == CMPI_RC_ERR_FAILED)
+                             return Entry_Status(CMPI_RC_ERR_FAILED, "MetaClass not found");
+                         if (cls.rc != CMPI_RC_OK)
+                             return cls;
 
-        const Meta_Method* mm = method ? find_method(mc, method) : nullptr;
-        if (!mm)
-            return Entry_Status(CMPI_RC_ERR_METHOD_NOT_FOUND, _string_or_empty(method));
+                         const Meta_Method* mm = method ? find_method(mc, method) : nullptr;
+                         if (!mm)
+                             return Entry_Status(CMPI_RC_ERR_METHOD_NOT_FOUND,
+                                                 _string_or_empty(method));
 
-        Instance* target = nullptr;
-        int rc = make_cimple_reference(adapter->_broker, mc, op, target);
-        if (rc != CMPI_RC_OK)
-            return Entry_Status(rc, "CIMPLE reference creation failed");
-        Ref<> hold_target(target);
+                         Instance* target = nullptr;
+                         int rc = make_cimple_reference(adapter->_broker, mc, op, target);
+                         if (rc != CMPI_RC_OK)
+                             return Entry_Status(rc, "CIMPLE reference creation failed");
+                         Ref<> hold_target(target);
 
-        Instance* meth = nullptr;
-        rc = make_cimple_method(adapter->_broker, mc, mm, op, in, meth);
-        if (rc != CMPI_RC_OK)
-            return Entry_Status(rc, "CIMPLE make_cimple_method function failed");
-        Ref<> hold_meth(meth);
+                         Instance* meth = nullptr;
+                         rc = make_cimple_method(adapter->_broker, mc, mm, op, in, meth);
+                         if (rc != CMPI_RC_OK)
+                             return Entry_Status(rc, "CIMPLE make_cimple_method function failed");
+                         Ref<> hold_meth(meth);
 
-        switch (adapter->invoke_method(target, meth)) {
-            case INVOKE_METHOD_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
-            case INVOKE_METHOD_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
-            case INVOKE_METHOD_FAILED: return CMPI_RC_ERR_FAILED;
-            case -1:
-                // The provider does not know the method (a subclass's method
-                // on a provider of its superclass).
-                return Entry_Status(CMPI_RC_ERR_METHOD_NOT_FOUND, mm->name);
-            default: break;
-        }
+                         switch (adapter->invoke_method(target, meth)) {
+                             case INVOKE_METHOD_UNSUPPORTED: return CMPI_RC_ERR_NOT_SUPPORTED;
+                             case INVOKE_METHOD_ACCESS_DENIED: return CMPI_RC_ERR_ACCESS_DENIED;
+                             case INVOKE_METHOD_FAILED: return CMPI_RC_ERR_FAILED;
+                             case -1:
+                                 // The provider does not know the method (a subclass's method
+                                 // on a provider of its superclass).
+                                 return Entry_Status(CMPI_RC_ERR_METHOD_NOT_FOUND, mm->name);
+                             default: break;
+                         }
 
-        String ns = name_space_of(op);
-        CMPIValue return_value;
-        CMPIType return_type;
-        Cmpi_Objects made;
-        rc = make_cmpi_method(adapter->_broker, ns.c_str(), meth, out, return_value, return_type,
-                              &made);
-        if (rc != CMPI_RC_OK)
-            return rc;
-        if (return_type != CMPI_null)
-            CMReturnData(result, &return_value, return_type);
-        CMReturnDone(result);
-        return CMPI_RC_OK;
-    });
+                         String ns = name_space_of(op);
+                         CMPIValue return_value;
+                         CMPIType return_type;
+                         Cmpi_Objects made;
+                         rc = make_cmpi_method(adapter->_broker, ns.c_str(), meth, out,
+                                               return_value, return_type, &made);
+                         if (rc != CMPI_RC_OK)
+                             return rc;
+                         if (return_type != CMPI_null)
+                             CMReturnData(result, &return_value, return_type);
+                         CMReturnDone(result);
+                         return CMPI_RC_OK;
+                     });
 }
 
 //------------------------------------------------------------------------------
@@ -350,8 +351,8 @@ CMPIStatus CMPI_Adapter::invokeMethod(CMPIMethodMI* mi, const CMPIContext* conte
 //------------------------------------------------------------------------------
 
 CMPIStatus CMPI_Adapter::authorizeFilter(CMPIIndicationMI* mi, const CMPIContext* context,
-                                         const CMPISelectExp*, const char*,
-                                         const CMPIObjectPath*, const char*) {
+                                         const CMPISelectExp*, const char*, const CMPIObjectPath*,
+                                         const char*) {
     return run_entry("authorizeFilter", mi ? mi->hdl : nullptr, context,
                      [](CMPI_Adapter*, Entry_Scope&) -> Entry_Status { return CMPI_RC_OK; });
 }
@@ -367,16 +368,16 @@ CMPIStatus CMPI_Adapter::activateFilter(CMPIIndicationMI* mi, const CMPIContext*
                                         const CMPIObjectPath* class_path, CMPIBoolean) {
     return run_entry("activateFilter", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        if (!class_path)
-            return Entry_Status(CMPI_RC_ERR_INVALID_PARAMETER, "no class path");
-        Name_Space_Entry entry = {name_space_of(class_path), 1};
-        size_t pos = adapter->_name_spaces.find(entry);
-        if (pos == size_t(-1))
-            adapter->_name_spaces.append(entry);
-        else
-            adapter->_name_spaces[pos].count++;
-        return CMPI_RC_OK;
-    });
+                         if (!class_path)
+                             return Entry_Status(CMPI_RC_ERR_INVALID_PARAMETER, "no class path");
+                         Name_Space_Entry entry = {name_space_of(class_path), 1};
+                         size_t pos = adapter->_name_spaces.find(entry);
+                         if (pos == size_t(-1))
+                             adapter->_name_spaces.append(entry);
+                         else
+                             adapter->_name_spaces[pos].count++;
+                         return CMPI_RC_OK;
+                     });
 }
 
 CMPIStatus CMPI_Adapter::deactivateFilter(CMPIIndicationMI* mi, const CMPIContext* context,
@@ -384,50 +385,51 @@ CMPIStatus CMPI_Adapter::deactivateFilter(CMPIIndicationMI* mi, const CMPIContex
                                           const CMPIObjectPath* class_path, CMPIBoolean) {
     return run_entry("deactivateFilter", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        if (!class_path)
-            return Entry_Status(CMPI_RC_ERR_INVALID_PARAMETER, "no class path");
-        Name_Space_Entry entry = {name_space_of(class_path), 0};
-        size_t pos = adapter->_name_spaces.find(entry);
-        if (pos != size_t(-1)) {
-            if (adapter->_name_spaces[pos].count <= 1)
-                adapter->_name_spaces.remove(pos);
-            else
-                adapter->_name_spaces[pos].count--;
-        }
-        return CMPI_RC_OK;
-    });
+                         if (!class_path)
+                             return Entry_Status(CMPI_RC_ERR_INVALID_PARAMETER, "no class path");
+                         Name_Space_Entry entry = {name_space_of(class_path), 0};
+                         size_t pos = adapter->_name_spaces.find(entry);
+                         if (pos != size_t(-1)) {
+                             if (adapter->_name_spaces[pos].count <= 1)
+                                 adapter->_name_spaces.remove(pos);
+                             else
+                                 adapter->_name_spaces[pos].count--;
+                         }
+                         return CMPI_RC_OK;
+                     });
 }
 
 CMPIStatus CMPI_Adapter::enableIndications(CMPIIndicationMI* mi, const CMPIContext* context) {
     return run_entry("enableIndications", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        if (adapter->_indications_enabled)
-            return CMPI_RC_OK;
-        adapter->_indications_enabled = true;
-        if (adapter->enable_indications(_indication_proc, adapter) ==
-            ENABLE_INDICATIONS_FAILED) {
-            // Not enabled: a later request must ask the provider again.
-            adapter->_indications_enabled = false;
-            return CMPI_RC_ERR_FAILED;
-        }
-        return CMPI_RC_OK;
-    });
+                         if (adapter->_indications_enabled)
+                             return CMPI_RC_OK;
+                         adapter->_indications_enabled = true;
+                         if (adapter->enable_indications(_indication_proc, adapter) ==
+                             ENABLE_INDICATIONS_FAILED) {
+                             // Not enabled: a later request must ask the provider again.
+                             adapter->_indications_enabled = false;
+                             return CMPI_RC_ERR_FAILED;
+                         }
+                         return CMPI_RC_OK;
+                     });
 }
 
 CMPIStatus CMPI_Adapter::disableIndications(CMPIIndicationMI* mi, const CMPIContext* context) {
     return run_entry("disableIndications", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-        if (!adapter->_indications_enabled)
-            return CMPI_RC_OK;
-        struct Disabling {
-            std::atomic<bool>& flag;
-            explicit Disabling(std::atomic<bool>& f) : flag(f) { flag = true; }
-            ~Disabling() { flag = false; }
-        } disabling(adapter->_disabling);
-        Disable_Indications_Status status = adapter->disable_indications();
-        adapter->_indications_enabled = false;
-        return status == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK;
-    });
+                         if (!adapter->_indications_enabled)
+                             return CMPI_RC_OK;
+                         struct Disabling {
+                             std::atomic<bool>& flag;
+                             explicit Disabling(std::atomic<bool>& f) : flag(f) { flag = true; }
+                             ~Disabling() { flag = false; }
+                         } disabling(adapter->_disabling);
+                         Disable_Indications_Status status = adapter->disable_indications();
+                         adapter->_indications_enabled = false;
+                         return status == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED
+                                                                     : CMPI_RC_OK;
+                     });
 }
 
 namespace {

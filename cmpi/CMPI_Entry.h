@@ -4,8 +4,8 @@
 #ifndef CPTA_CMPI_CMPI_ENTRY_H
 #define CPTA_CMPI_CMPI_ENTRY_H
 
-#include "cmpi/Cmpi_Ptr.h"
 #include <cmpimacs.h>
+#include "cmpi/Cmpi_Ptr.h"
 
 #include <exception>
 #include <memory>
@@ -116,8 +116,7 @@ int _request_class(CMPI_Adapter* adapter, const CMPIObjectPath* op, const Meta_C
 // The same for requests that hand the provider an instance of the class: a
 // class above the provider's class is served as the provider's class; a
 // class outside its line is refused with CMPI_RC_ERR_INVALID_CLASS.
-Entry_Status _target_class(CMPI_Adapter* adapter, const CMPIObjectPath* op,
-                           const Meta_Class*& mc);
+Entry_Status _target_class(CMPI_Adapter* adapter, const CMPIObjectPath* op, const Meta_Class*& mc);
 
 }  // namespace CPTA
 

@@ -3,8 +3,8 @@
 #include <cmpimacs.h>
 
 #include "cmpi/CMPI_Adapter.h"
-#include "cmpi/Cmpi_Ptr.h"
 #include "cmpi/CMPI_Containers.h"
+#include "cmpi/Cmpi_Ptr.h"
 #include "cmpi/Converter.h"
 #include "framework/Log.h"
 
@@ -98,8 +98,8 @@ Instance_Enumerator_Rep* CMPI_Thread_Context::instance_enumerator_create(const c
             CMRelease(enumeration);
             return nullptr;
         }
-        Instance_Enumerator_Rep* rep = new Instance_Enumerator_Rep{enumeration, model->meta_class,
-                                                                   Ref<>()};
+        Instance_Enumerator_Rep* rep =
+            new Instance_Enumerator_Rep{enumeration, model->meta_class, Ref<>()};
         instance_enumerator_next(rep);
         return rep;
     } catch (...) {
@@ -177,13 +177,12 @@ Instance* CMPI_Thread_Context::get_instance(const char* name_space, const Instan
 }
 
 int CMPI_Thread_Context::create_instance(const char* name_space, const Instance* instance) {
-    return _write_up_call(_broker, name_space, instance, true,
-                          [this](CMPIObjectPath* op, CMPIInstance* ci) {
-                              CMPIStatus rc = {CMPI_RC_OK, nullptr};
-                              Cmpi_Ptr<CMPIObjectPath> created(
-                                  CBCreateInstance(_broker, _context, op, ci, &rc));
-                              return rc.rc;
-                          });
+    return _write_up_call(
+        _broker, name_space, instance, true, [this](CMPIObjectPath* op, CMPIInstance* ci) {
+            CMPIStatus rc = {CMPI_RC_OK, nullptr};
+            Cmpi_Ptr<CMPIObjectPath> created(CBCreateInstance(_broker, _context, op, ci, &rc));
+            return rc.rc;
+        });
 }
 
 int CMPI_Thread_Context::modify_instance(const char* name_space, const Instance* instance) {

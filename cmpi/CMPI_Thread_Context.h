@@ -22,8 +22,7 @@ struct Instance_Enumerator_Rep {
 
 class CMPI_Thread_Context : public Thread_Context {
 public:
-    CMPI_Thread_Context(const CMPIBroker* broker, const CMPIContext* context,
-                        CMPI_Adapter* adapter)
+    CMPI_Thread_Context(const CMPIBroker* broker, const CMPIContext* context, CMPI_Adapter* adapter)
         : _broker(broker), _context(context), _adapter(adapter) {}
     ~CMPI_Thread_Context() override;
 
@@ -42,8 +41,7 @@ public:
     int create_instance(const char* name_space, const Instance* instance) override;
     int delete_instance(const char* name_space, const Instance* instance) override;
     int modify_instance(const char* name_space, const Instance* instance) override;
-    int invoke_method(const char* name_space, const Instance* instance,
-                      Instance* meth) override;
+    int invoke_method(const char* name_space, const Instance* instance, Instance* meth) override;
     void allow_unload(bool flag) override;
     bool get_username(String& user_name) override;
 

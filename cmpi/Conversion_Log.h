@@ -6,11 +6,11 @@
 #include "framework/Log.h"
 
 // A note at LL_INFO.
-#define TVRN_NOTE(fmt, ...)                                                          \
-    do {                                                                             \
-        if (::CPTA::_log_enabled_state)                                              \
-            ::CPTA::Log_Call_Frame(::CPTA::LL_INFO, TVRN_SOURCE_FILE, __LINE__)      \
-                .invoke(fmt, ##__VA_ARGS__);                                         \
+#define TVRN_NOTE(fmt, ...)                                                     \
+    do {                                                                        \
+        if (::CPTA::_log_enabled_state)                                         \
+            ::CPTA::Log_Call_Frame(::CPTA::LL_INFO, TVRN_SOURCE_FILE, __LINE__) \
+                .invoke(fmt, ##__VA_ARGS__);                                    \
     } while (0)
 
 #endif

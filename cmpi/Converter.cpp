@@ -43,8 +43,7 @@ int make_cimple_reference(const CMPIBroker* broker, const Meta_Class* meta_class
     if (!meta_class || !object_path)
         return CMPI_RC_ERR_FAILED;
     String ns = name_space_of(object_path);
-    CMPIObjectPath_Container container(_repository_of(meta_class), broker, ns.c_str(),
-                                       object_path);
+    CMPIObjectPath_Container container(_repository_of(meta_class), broker, ns.c_str(), object_path);
     Instance* result = nullptr;
     if (container.convert(meta_class, FLAG_KEY, result) != 0 || !result)
         return CMPI_RC_ERR_FAILED;
@@ -58,8 +57,7 @@ int make_cimple_instance(const CMPIBroker* broker, const Meta_Class* meta_class,
     if (!meta_class || !cmpi_instance)
         return CMPI_RC_ERR_FAILED;
     String ns = name_space_of(object_path);
-    CMPIInstance_Container container(_repository_of(meta_class), broker, ns.c_str(),
-                                     cmpi_instance);
+    CMPIInstance_Container container(_repository_of(meta_class), broker, ns.c_str(), cmpi_instance);
     Instance* result = nullptr;
     if (container.convert(meta_class, 0, result) != 0 || !result)
         return CMPI_RC_ERR_FAILED;
@@ -78,8 +76,7 @@ int make_cimple_method(const CMPIBroker* broker, const Meta_Class* meta_class,
         return CMPI_RC_ERR_FAILED;
     __set_null_flags(result, true, true, true);
     CMPIArgs_Container container(_repository_of(meta_class), broker, ns.c_str(), in);
-    if (container.convert(reinterpret_cast<const Meta_Class*>(meta_method), FLAG_IN, result) !=
-        0) {
+    if (container.convert(reinterpret_cast<const Meta_Class*>(meta_method), FLAG_IN, result) != 0) {
         destroy(result);
         return CMPI_RC_ERR_FAILED;
     }
@@ -95,8 +92,8 @@ int make_cmpi_object_path(const CMPIBroker* broker, const Instance* instance,
     CMPIObjectPath* op = CMNewObjectPath(broker, name_space, instance->meta_class->name, &rc);
     if (!op || rc.rc != CMPI_RC_OK)
         return CMPI_RC_ERR_FAILED;
-    CMPIObjectPath_Container container(_repository_of(instance->meta_class), broker,
-                                       name_space, op);
+    CMPIObjectPath_Container container(_repository_of(instance->meta_class), broker, name_space,
+                                       op);
     if (container.convert(instance, FLAG_KEY) != 0 || container.failures() != 0) {
         CMRelease(op);
         return CMPI_RC_ERR_FAILED;
@@ -105,9 +102,9 @@ int make_cmpi_object_path(const CMPIBroker* broker, const Instance* instance,
     return CMPI_RC_OK;
 }
 
-int make_cmpi_instance(const CMPIBroker* broker, const Instance* instance,
-                       const char* name_space, const CMPIObjectPath* object_path,
-                       const char* const* properties, CMPIInstance*& cmpi_instance) {
+int make_cmpi_instance(const CMPIBroker* broker, const Instance* instance, const char* name_space,
+                       const CMPIObjectPath* object_path, const char* const* properties,
+                       CMPIInstance*& cmpi_instance) {
     cmpi_instance = nullptr;
     if (!instance || !instance->meta_class)
         return CMPI_RC_ERR_FAILED;
@@ -143,8 +140,7 @@ int make_cmpi_instance(const CMPIBroker* broker, const Instance* instance,
         }
     }
 
-    CMPIInstance_Container container(_repository_of(instance->meta_class), broker, name_space,
-                                     ci);
+    CMPIInstance_Container container(_repository_of(instance->meta_class), broker, name_space, ci);
     if (container.convert(instance, 0) != 0) {
         CMRelease(ci);
         return CMPI_RC_ERR_FAILED;

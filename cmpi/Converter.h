@@ -42,9 +42,9 @@ int make_cmpi_object_path(const CMPIBroker* broker, const Instance* instance,
 // An instance on object_path (built here when null) with every non-null
 // property and reference; restricted to properties (closed by a null entry)
 // when given.
-int make_cmpi_instance(const CMPIBroker* broker, const Instance* instance,
-                       const char* name_space, const CMPIObjectPath* object_path,
-                       const char* const* properties, CMPIInstance*& cmpi_instance);
+int make_cmpi_instance(const CMPIBroker* broker, const Instance* instance, const char* name_space,
+                       const CMPIObjectPath* object_path, const char* const* properties,
+                       CMPIInstance*& cmpi_instance);
 
 // Adds the non-null output parameters of the record to out and hands the
 // return value back separately (return_type CMPI_null when it is null). The

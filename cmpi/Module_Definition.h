@@ -77,22 +77,22 @@ struct Registrar {
 #include TVRN_MODULE_ROWS
 #undef TVRN_ROW
 
-#define TVRN_FACTORY(P, S, KIND, LETTER)                                                    \
-    extern "C" CMPI_EXPORT CMPI##KIND##MI* P##_Create_##KIND##MI(                           \
-        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {             \
-        return static_cast<CMPI##KIND##MI*>(                                                \
-            ::CPTA::__create_mi(&_cmpi_static_data_##P, &_registrations[TVRN_INDEX_##P],    \
-                                broker, context, #P, LETTER, rc));                          \
-    }                                                                                       \
-    extern "C" CMPI_EXPORT CMPI##KIND##MI* S##_Create_##KIND##MI(                           \
-        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {             \
-        return P##_Create_##KIND##MI(broker, context, rc);                                  \
+#define TVRN_FACTORY(P, S, KIND, LETTER)                                                           \
+    extern "C" CMPI_EXPORT CMPI##KIND##MI* P##_Create_##KIND##MI(                                  \
+        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {                    \
+        return static_cast<CMPI##KIND##MI*>(::CPTA::__create_mi(&_cmpi_static_data_##P,            \
+                                                                &_registrations[TVRN_INDEX_##P],   \
+                                                                broker, context, #P, LETTER, rc)); \
+    }                                                                                              \
+    extern "C" CMPI_EXPORT CMPI##KIND##MI* S##_Create_##KIND##MI(                                  \
+        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {                    \
+        return P##_Create_##KIND##MI(broker, context, rc);                                         \
     }
 
-#define TVRN_ROW(P, S, I, A, N)                                 \
-    TVRN_FACTORY(P, S, Method, 'M')                             \
-    TVRN_IF(I, TVRN_FACTORY(P, S, Instance, 'I'))               \
-    TVRN_IF(A, TVRN_FACTORY(P, S, Association, 'A'))            \
+#define TVRN_ROW(P, S, I, A, N)                      \
+    TVRN_FACTORY(P, S, Method, 'M')                  \
+    TVRN_IF(I, TVRN_FACTORY(P, S, Instance, 'I'))    \
+    TVRN_IF(A, TVRN_FACTORY(P, S, Association, 'A')) \
     TVRN_IF(N, TVRN_FACTORY(P, S, Indication, 'N'))
 #include TVRN_MODULE_ROWS
 #undef TVRN_ROW

@@ -103,8 +103,8 @@ bool _references_proc(Instance* association, Enum_Instances_Status, void* client
 
 Provider_Handle::Provider_Handle(const Registration* registration)
     : _registration(registration), _proc(registration->proc), _provider(nullptr) {
-    _proc(_registration, OPERATION_CREATE_PROVIDER, &_provider, nullptr, nullptr, nullptr,
-          nullptr, nullptr, nullptr, nullptr);
+    _proc(_registration, OPERATION_CREATE_PROVIDER, &_provider, nullptr, nullptr, nullptr, nullptr,
+          nullptr, nullptr, nullptr);
 }
 
 Provider_Handle::~Provider_Handle() {
@@ -112,22 +112,22 @@ Provider_Handle::~Provider_Handle() {
         call(OPERATION_DESTROY_PROVIDER);
 }
 
-int Provider_Handle::call(int operation, void* a1, void* a2, void* a3, void* a4, void* a5,
-                          void* a6, void* a7) {
+int Provider_Handle::call(int operation, void* a1, void* a2, void* a3, void* a4, void* a5, void* a6,
+                          void* a7) {
     return _proc(_registration, operation, _provider, a1, a2, a3, a4, a5, a6, a7);
 }
 
 const Meta_Class* Provider_Handle::get_meta_class() const {
     const Meta_Class* meta_class = nullptr;
-    _proc(_registration, OPERATION_GET_META_CLASS, &meta_class, nullptr, nullptr, nullptr,
-          nullptr, nullptr, nullptr, nullptr);
+    _proc(_registration, OPERATION_GET_META_CLASS, &meta_class, nullptr, nullptr, nullptr, nullptr,
+          nullptr, nullptr, nullptr);
     return meta_class;
 }
 
 const Meta_Repository* Provider_Handle::get_repository() const {
     const Meta_Repository* repository = nullptr;
-    _proc(_registration, OPERATION_GET_REPOSITORY, &repository, nullptr, nullptr, nullptr,
-          nullptr, nullptr, nullptr, nullptr);
+    _proc(_registration, OPERATION_GET_REPOSITORY, &repository, nullptr, nullptr, nullptr, nullptr,
+          nullptr, nullptr, nullptr);
     return repository;
 }
 
@@ -163,8 +163,7 @@ Get_Instance_Status Provider_Handle::get_instance(const Instance* model, Instanc
 }
 
 Enum_Instances_Status Provider_Handle::enum_instances(const Instance* model,
-                                                      Enum_Instances_Proc proc,
-                                                      void* client_data) {
+                                                      Enum_Instances_Proc proc, void* client_data) {
     return Enum_Instances_Status(call(OPERATION_ENUM_INSTANCES, const_cast<Instance*>(model),
                                       reinterpret_cast<void*>(proc), client_data));
 }
@@ -174,8 +173,7 @@ Create_Instance_Status Provider_Handle::create_instance(Instance* instance) {
 }
 
 Delete_Instance_Status Provider_Handle::delete_instance(const Instance* instance) {
-    return Delete_Instance_Status(
-        call(OPERATION_DELETE_INSTANCE, const_cast<Instance*>(instance)));
+    return Delete_Instance_Status(call(OPERATION_DELETE_INSTANCE, const_cast<Instance*>(instance)));
 }
 
 Modify_Instance_Status Provider_Handle::modify_instance(const Instance* model,
@@ -201,10 +199,10 @@ Disable_Indications_Status Provider_Handle::disable_indications() {
 Enum_Associators_Status Provider_Handle::enum_associators(
     const Instance* instance, const String& result_class, const String& role,
     const String& result_role, Enum_Associators_Proc proc, void* client_data) {
-    return Enum_Associators_Status(call(
-        OPERATION_ENUM_ASSOCIATORS, const_cast<Instance*>(instance),
-        const_cast<String*>(&result_class), const_cast<String*>(&role),
-        const_cast<String*>(&result_role), reinterpret_cast<void*>(proc), client_data));
+    return Enum_Associators_Status(
+        call(OPERATION_ENUM_ASSOCIATORS, const_cast<Instance*>(instance),
+             const_cast<String*>(&result_class), const_cast<String*>(&role),
+             const_cast<String*>(&result_role), reinterpret_cast<void*>(proc), client_data));
 }
 
 Enum_Associator_Names_Status Provider_Handle::enum_associator_names(
@@ -214,10 +212,10 @@ Enum_Associator_Names_Status Provider_Handle::enum_associator_names(
     if (!meta_class || !(meta_class->flags & FLAG_ASSOCIATION))
         return ENUM_ASSOCIATOR_NAMES_FAILED;
 
-    int status = call(OPERATION_ENUM_ASSOCIATOR_NAMES, const_cast<Instance*>(instance),
-                      const_cast<String*>(&result_class), const_cast<String*>(&role),
-                      const_cast<String*>(&result_role), reinterpret_cast<void*>(proc),
-                      client_data);
+    int status =
+        call(OPERATION_ENUM_ASSOCIATOR_NAMES, const_cast<Instance*>(instance),
+             const_cast<String*>(&result_class), const_cast<String*>(&role),
+             const_cast<String*>(&result_role), reinterpret_cast<void*>(proc), client_data);
     if (status == ENUM_ASSOCIATOR_NAMES_OK)
         return ENUM_ASSOCIATOR_NAMES_OK;
     if (status != ENUM_ASSOCIATOR_NAMES_UNSUPPORTED)
@@ -248,8 +246,7 @@ Enum_Associator_Names_Status Provider_Handle::enum_associator_names(
 }
 
 Enum_References_Status Provider_Handle::enum_references(const Instance* instance,
-                                                        const Instance* model,
-                                                        const String& role,
+                                                        const Instance* model, const String& role,
                                                         Enum_References_Proc proc,
                                                         void* client_data) {
     const Meta_Class* meta_class = get_meta_class();

@@ -49,21 +49,17 @@ public:
     Disable_Indications_Status disable_indications();
 
     // The provider's own enum_associators (operation 16), no fallback.
-    Enum_Associators_Status enum_associators(const Instance* instance,
-                                             const String& result_class, const String& role,
-                                             const String& result_role,
+    Enum_Associators_Status enum_associators(const Instance* instance, const String& result_class,
+                                             const String& role, const String& result_role,
                                              Enum_Associators_Proc proc, void* client_data);
 
     // Operation 14; when unsupported, the other ends of the association
     // instances that the provider enumerates and that refer to instance.
     // The proc gets a closing call with no instance in every case but a
     // class that is not an association.
-    Enum_Associator_Names_Status enum_associator_names(const Instance* instance,
-                                                       const String& result_class,
-                                                       const String& role,
-                                                       const String& result_role,
-                                                       Enum_Associator_Names_Proc proc,
-                                                       void* client_data);
+    Enum_Associator_Names_Status enum_associator_names(
+        const Instance* instance, const String& result_class, const String& role,
+        const String& result_role, Enum_Associator_Names_Proc proc, void* client_data);
 
     // Operation 15; when unsupported, the enumerated association instances
     // that refer to instance (in role, when given).

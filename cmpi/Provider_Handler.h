@@ -17,8 +17,7 @@ namespace CPTA {
 
 typedef bool (*Enum_Instances_Proc)(Instance* instance, Enum_Instances_Status status,
                                     void* client_data);
-typedef bool (*Enum_Associator_Names_Proc)(Instance* instance,
-                                           Enum_Associator_Names_Status status,
+typedef bool (*Enum_Associator_Names_Proc)(Instance* instance, Enum_Associator_Names_Status status,
                                            void* client_data);
 typedef bool (*Enum_Associators_Proc)(Instance* instance, Enum_Associators_Status status,
                                       void* client_data);
@@ -41,8 +40,7 @@ private:
 };
 
 template <class T>
-class Enum_Instances_Handler
-    : public Result_Handler<T, Enum_Instances_Status, ENUM_INSTANCES_OK> {
+class Enum_Instances_Handler : public Result_Handler<T, Enum_Instances_Status, ENUM_INSTANCES_OK> {
 public:
     using Result_Handler<T, Enum_Instances_Status, ENUM_INSTANCES_OK>::Result_Handler;
 };
@@ -51,8 +49,7 @@ template <class T>
 class Enum_Associator_Names_Handler
     : public Result_Handler<T, Enum_Associator_Names_Status, ENUM_ASSOCIATOR_NAMES_OK> {
 public:
-    using Result_Handler<T, Enum_Associator_Names_Status,
-                         ENUM_ASSOCIATOR_NAMES_OK>::Result_Handler;
+    using Result_Handler<T, Enum_Associator_Names_Status, ENUM_ASSOCIATOR_NAMES_OK>::Result_Handler;
 };
 
 template <class T>

@@ -33,19 +33,13 @@ int provider_proc(const Registration*, int operation, void* a0, void* a1, void* 
             *static_cast<const Meta_Class**>(a0) = &C::static_meta_class;
             return 0;
 
-        case OPERATION_CREATE_PROVIDER:
-            *static_cast<void**>(a0) = new P;
-            return 0;
+        case OPERATION_CREATE_PROVIDER: *static_cast<void**>(a0) = new P; return 0;
 
-        case OPERATION_DESTROY_PROVIDER:
-            delete provider;
-            return 0;
+        case OPERATION_DESTROY_PROVIDER: delete provider; return 0;
 
-        case OPERATION_LOAD:
-            return provider->load();
+        case OPERATION_LOAD: return provider->load();
 
-        case OPERATION_UNLOAD:
-            return provider->unload();
+        case OPERATION_UNLOAD: return provider->unload();
 
         case OPERATION_GET_INSTANCE: {
             C* instance = nullptr;
@@ -63,15 +57,12 @@ int provider_proc(const Registration*, int operation, void* a0, void* a1, void* 
             return status;
         }
 
-        case OPERATION_CREATE_INSTANCE:
-            return provider->create_instance(static_cast<C*>(a1));
+        case OPERATION_CREATE_INSTANCE: return provider->create_instance(static_cast<C*>(a1));
 
-        case OPERATION_DELETE_INSTANCE:
-            return provider->delete_instance(static_cast<const C*>(a1));
+        case OPERATION_DELETE_INSTANCE: return provider->delete_instance(static_cast<const C*>(a1));
 
         case OPERATION_MODIFY_INSTANCE:
-            return provider->modify_instance(static_cast<const C*>(a1),
-                                             static_cast<const C*>(a2));
+            return provider->modify_instance(static_cast<const C*>(a1), static_cast<const C*>(a2));
 
         case OPERATION_INVOKE_METHOD:
             return INVOKE(provider, static_cast<const C*>(a1), static_cast<Instance*>(a2));
@@ -140,27 +131,26 @@ int provider_proc(const Registration*, int operation, void* a0, void* a1, void* 
                 return -1;
             }
 
-        default:
-            return -1;
+        default: return -1;
     }
 }
 
 }  // namespace CPTA
 
 // Declares the proc of a provider (in namespace CPTA).
-#define TVRN_DECLARE_PROC(PROVIDER)                                                          \
-    int PROVIDER##_proc(const ::CPTA::Registration* registration, int operation, void* a0,  \
+#define TVRN_DECLARE_PROC(PROVIDER)                                                        \
+    int PROVIDER##_proc(const ::CPTA::Registration* registration, int operation, void* a0, \
                         void* a1, void* a2, void* a3, void* a4, void* a5, void* a6, void* a7)
 
 // Defines the proc of provider class CPTA::PROVIDER serving CPTA::CLASS.
 // Used once, at the end of the provider's source, outside any namespace.
-#define TVRN_DEFINE_PROC(PROVIDER, CLASS)                                                    \
-    namespace CPTA {                                                                         \
-    TVRN_DECLARE_PROC(PROVIDER);                                                             \
-    TVRN_DECLARE_PROC(PROVIDER) {                                                            \
-        return provider_proc<PROVIDER, &CLASS##_invoke_method<PROVIDER>>(                    \
-            registration, operation, a0, a1, a2, a3, a4, a5, a6, a7);                        \
-    }                                                                                        \
+#define TVRN_DEFINE_PROC(PROVIDER, CLASS)                                 \
+    namespace CPTA {                                                      \
+    TVRN_DECLARE_PROC(PROVIDER);                                          \
+    TVRN_DECLARE_PROC(PROVIDER) {                                         \
+        return provider_proc<PROVIDER, &CLASS##_invoke_method<PROVIDER>>( \
+            registration, operation, a0, a1, a2, a3, a4, a5, a6, a7);     \
+    }                                                                     \
     }
 
 #endif

@@ -72,15 +72,9 @@ enum Invoke_Method_Status {
     INVOKE_METHOD_ACCESS_DENIED = 132
 };
 
-enum Enable_Indications_Status {
-    ENABLE_INDICATIONS_OK = 0,
-    ENABLE_INDICATIONS_FAILED = 140
-};
+enum Enable_Indications_Status { ENABLE_INDICATIONS_OK = 0, ENABLE_INDICATIONS_FAILED = 140 };
 
-enum Disable_Indications_Status {
-    DISABLE_INDICATIONS_OK = 0,
-    DISABLE_INDICATIONS_FAILED = 150
-};
+enum Disable_Indications_Status { DISABLE_INDICATIONS_OK = 0, DISABLE_INDICATIONS_FAILED = 150 };
 
 enum Enum_Associators_Status {
     ENUM_ASSOCIATORS_OK = 0,

@@ -14,13 +14,14 @@
 //   6  enum_instances          a0 provider, a1 model, a2 Enum_Instances_Proc, a3 data
 //                              -> Enum_Instances_Status; the proc is then called once
 //                                 more with no instance and that status
-//   7  create_instance         a0 provider, a1 instance                    -> Create_Instance_Status
-//   8  delete_instance         a0 provider, a1 instance (keys)             -> Delete_Instance_Status
-//   9  modify_instance         a0 provider, a1 model, a2 instance          -> Modify_Instance_Status
+//   7  create_instance         a0 provider, a1 instance                    ->
+//   Create_Instance_Status 8  delete_instance         a0 provider, a1 instance (keys) ->
+//   Delete_Instance_Status 9  modify_instance         a0 provider, a1 model, a2 instance ->
+//   Modify_Instance_Status
 //  10  invoke method           a0 provider, a1 instance (keys), a2 parameter record
 //                              -> Invoke_Method_Status, -1 for an unknown method
-//  11  enable_indications      a0 provider, a1 Indication_Proc, a2 data    -> Enable_Indications_Status
-//  12  disable_indications     a0 provider                                 -> Disable_Indications_Status
+//  11  enable_indications      a0 provider, a1 Indication_Proc, a2 data    ->
+//  Enable_Indications_Status 12  disable_indications     a0 provider -> Disable_Indications_Status
 //  13  get meta repository     a0: const Meta_Repository** out             -> 0
 //  14  enum_associator_names   a0 provider, a1 instance, a2 result class, a3 role,
 //                              a4 result role (const String*), a5 proc, a6 data
@@ -39,8 +40,8 @@ namespace CPTA {
 struct Registration;
 
 typedef int (*Provider_Proc)(const Registration* registration, int operation, void* arg0,
-                             void* arg1, void* arg2, void* arg3, void* arg4, void* arg5,
-                             void* arg6, void* arg7);
+                             void* arg1, void* arg2, void* arg3, void* arg4, void* arg5, void* arg6,
+                             void* arg7);
 
 enum Provider_Operation {
     OPERATION_GET_META_CLASS = 0,

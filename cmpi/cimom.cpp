@@ -45,8 +45,7 @@ Instance* get_instance(const char* name_space, const Instance* model) {
     return context ? context->get_instance(name_space, model) : nullptr;
 }
 
-int enum_instances(const char* name_space, const Instance* model,
-                   Instance_Enumerator& enumerator) {
+int enum_instances(const char* name_space, const Instance* model, Instance_Enumerator& enumerator) {
     Thread_Context* context = Thread_Context::top();
     if (!context)
         return -1;

@@ -49,8 +49,7 @@ namespace cimom {
 Instance* get_instance(const char* name_space, const Instance* model);
 
 // Starts an enumeration of the model's class; 0 or -1.
-int enum_instances(const char* name_space, const Instance* model,
-                   Instance_Enumerator& enumerator);
+int enum_instances(const char* name_space, const Instance* model, Instance_Enumerator& enumerator);
 
 int create_instance(const char* name_space, const Instance* instance);
 int modify_instance(const char* name_space, const Instance* instance);

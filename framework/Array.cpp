@@ -100,19 +100,19 @@ const __Array_Traits _traits_datetime = {sizeof(Datetime), _copy<Datetime>, _des
 }  // namespace
 
 const __Array_Traits* const __cim_array_traits[NUM_TYPES] = {
-    &_traits_8bit,    // BOOLEAN
-    &_traits_8bit,    // UINT8
-    &_traits_8bit,    // SINT8
-    &_traits_16bit,   // UINT16
-    &_traits_16bit,   // SINT16
-    &_traits_32bit,   // UINT32
-    &_traits_32bit,   // SINT32
-    &_traits_64bit,   // UINT64
-    &_traits_64bit,   // SINT64
-    &_traits_real32,  // REAL32
-    &_traits_real64,  // REAL64
-    &_traits_16bit,   // CHAR16
-    &_traits_string,  // STRING
+    &_traits_8bit,      // BOOLEAN
+    &_traits_8bit,      // UINT8
+    &_traits_8bit,      // SINT8
+    &_traits_16bit,     // UINT16
+    &_traits_16bit,     // SINT16
+    &_traits_32bit,     // UINT32
+    &_traits_32bit,     // SINT32
+    &_traits_64bit,     // UINT64
+    &_traits_64bit,     // SINT64
+    &_traits_real32,    // REAL32
+    &_traits_real64,    // REAL64
+    &_traits_16bit,     // CHAR16
+    &_traits_string,    // STRING
     &_traits_datetime,  // DATETIME
 };
 

@@ -94,9 +94,9 @@ struct __Array_Traits_Factory<T*> {
     static const __Array_Traits* traits() { return __Array_Traits_Factory_Raw<void*>::traits(); }
 };
 
-#define CPTA_CIM_ARRAY_TRAITS(T, CODE)                                         \
-    template <>                                                                \
-    struct __Array_Traits_Factory<T> {                                         \
+#define CPTA_CIM_ARRAY_TRAITS(T, CODE)                                             \
+    template <>                                                                    \
+    struct __Array_Traits_Factory<T> {                                             \
         static const __Array_Traits* traits() { return __cim_array_traits[CODE]; } \
     }
 

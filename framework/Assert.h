@@ -14,10 +14,10 @@ void __cimple_trace(const char* file, int line, const char* function);
 }  // namespace CPTA
 
 // Always checked: the conditions guard states that cannot be recovered from.
-#define CPTA_ASSERT(COND)                                                    \
-    do {                                                                     \
-        if (!(COND))                                                         \
-            ::CPTA::__cimple_assert(__FILE__, __LINE__, __func__, #COND);    \
+#define CPTA_ASSERT(COND)                                                 \
+    do {                                                                  \
+        if (!(COND))                                                      \
+            ::CPTA::__cimple_assert(__FILE__, __LINE__, __func__, #COND); \
     } while (0)
 
 #define CPTA_TRACE ::CPTA::__cimple_trace(__FILE__, __LINE__, __func__)

@@ -196,8 +196,8 @@ void Datetime::get_interval(uint32& days, uint32& hours, uint32& minutes, uint32
     microseconds = uint32(usec % SEC);
 }
 
-bool Datetime::set_timestamp(uint32 year, uint32 month, uint32 day, uint32 hours,
-                             uint32 minutes, uint32 seconds, uint32 microseconds, sint32 utc) {
+bool Datetime::set_timestamp(uint32 year, uint32 month, uint32 day, uint32 hours, uint32 minutes,
+                             uint32 seconds, uint32 microseconds, sint32 utc) {
     time_t t;
     if (!_to_seconds(year, month, day, hours, minutes, seconds, t))
         return false;
@@ -242,7 +242,8 @@ void Datetime::ascii(char* buffer, bool prettify) const {
     } else {
         uint32 days, hours, minutes, seconds, microseconds;
         get_interval(days, hours, minutes, seconds, microseconds);
-        const char* format = prettify ? "%08u %02u %02u %02u.%06u:000" : "%08u%02u%02u%02u.%06u:000";
+        const char* format =
+            prettify ? "%08u %02u %02u %02u.%06u:000" : "%08u%02u%02u%02u.%06u:000";
         snprintf(buffer, BUFFER_SIZE, format, days, hours, minutes, seconds, microseconds);
     }
 }

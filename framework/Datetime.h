@@ -32,8 +32,8 @@ public:
     // Size of a buffer that ascii() can always fill.
     static constexpr size_t BUFFER_SIZE = 32;
 
-    Datetime();  // the zero interval
-    explicit Datetime(uint64 usec);  // an interval
+    Datetime();                            // the zero interval
+    explicit Datetime(uint64 usec);        // an interval
     Datetime(uint64 usec, sint32 offset);  // a timestamp
     // The zero timestamp, then parsed from the text (left as is on failure).
     explicit Datetime(const char* text);
@@ -98,8 +98,12 @@ private:
     Datetime_Rep* _rep;
 };
 
-inline bool operator==(const Datetime& a, const Datetime& b) { return a.equal(b); }
-inline bool operator!=(const Datetime& a, const Datetime& b) { return !a.equal(b); }
+inline bool operator==(const Datetime& a, const Datetime& b) {
+    return a.equal(b);
+}
+inline bool operator!=(const Datetime& a, const Datetime& b) {
+    return !a.equal(b);
+}
 
 }  // namespace CPTA
 

@@ -62,15 +62,14 @@ void _set_default_scalar(unsigned char* slot, const Meta_Property* mp) {
                     static_cast<const Meta_Value_Scalar<const char*>*>(value)->value))
                 __null_flag(slot, mp) = 1;
             break;
-        default:
-            std::memcpy(slot, value, type_size(mp->type));
-            break;
+        default: std::memcpy(slot, value, type_size(mp->type)); break;
     }
 }
 
 void _append_default_array(__Array_Rep*& rep, const Meta_Property* mp) {
     // Every Meta_Value_Array<T> has the same layout: elements, then count.
-    const Meta_Value_Array<char>* value = reinterpret_cast<const Meta_Value_Array<char>*>(mp->value);
+    const Meta_Value_Array<char>* value =
+        reinterpret_cast<const Meta_Value_Array<char>*>(mp->value);
     size_t n = value->num_elements;
     if (n == 0 || !value->elements)
         return;
@@ -529,9 +528,7 @@ namespace {
 void _append_key_value(String& out, int type, const unsigned char* p) {
     char buffer[64];
     switch (type) {
-        case BOOLEAN:
-            out.append(*reinterpret_cast<const boolean*>(p) ? "true" : "false");
-            return;
+        case BOOLEAN: out.append(*reinterpret_cast<const boolean*>(p) ? "true" : "false"); return;
         case UINT8:
             snprintf(buffer, sizeof(buffer), "%u", unsigned(*reinterpret_cast<const uint8*>(p)));
             break;
@@ -573,11 +570,8 @@ void _append_key_value(String& out, int type, const unsigned char* p) {
             out.append(*reinterpret_cast<const String*>(p));
             out.append('"');
             return;
-        case DATETIME:
-            reinterpret_cast<const Datetime*>(p)->ascii(buffer, false);
-            break;
-        default:
-            return;
+        case DATETIME: reinterpret_cast<const Datetime*>(p)->ascii(buffer, false); break;
+        default: return;
     }
     out.append(buffer);
 }
@@ -665,9 +659,8 @@ bool is_reference_of(const Instance* instance, const Instance* association, cons
     return false;
 }
 
-int get_associators(const Instance* instance, const Instance* association,
-                    const char* result_class, const char* role, const char* result_role,
-                    const Instance** out) {
+int get_associators(const Instance* instance, const Instance* association, const char* result_class,
+                    const char* role, const char* result_role, const Instance** out) {
     if (!instance || !association || !out)
         return -1;
     bool found = false;

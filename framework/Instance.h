@@ -112,9 +112,8 @@ bool is_reference_of(const Instance* instance, const Instance* association, cons
 // Writes borrowed pointers to out, which needs room for one entry per
 // reference of the association, and returns their number; -1 when the
 // association does not refer to instance in that role.
-int get_associators(const Instance* instance, const Instance* association,
-                    const char* result_class, const char* role, const char* result_role,
-                    const Instance** out);
+int get_associators(const Instance* instance, const Instance* association, const char* result_class,
+                    const char* role, const char* result_role, const Instance** out);
 
 // Diagnostic dump of the instance (only its keys when keys_only).
 void print(const Instance* instance, bool keys_only = false);

@@ -106,8 +106,8 @@ bool _same_identity(const Config_Identity& a, const Config_Identity& b) {
     // again without its size or time stamps showing it: trust it only later.
     if (b.ctime.tv_sec >= b.seen - 1)
         return false;
-    return a.dev == b.dev && a.ino == b.ino && a.size == b.size &&
-           _same_time(a.mtime, b.mtime) && _same_time(a.ctime, b.ctime);
+    return a.dev == b.dev && a.ino == b.ino && a.size == b.size && _same_time(a.mtime, b.mtime) &&
+           _same_time(a.ctime, b.ctime);
 }
 
 // The value of the first LOG_LEVEL line of the configuration file, or -1.

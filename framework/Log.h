@@ -62,15 +62,14 @@ struct Log_Call_Frame {
 #endif
 
 // Logs with the caller's source file name and line.
-#define TVRN_LOG(level, fmt, ...) \
-    ::CPTA::log(level, TVRN_SOURCE_FILE, __LINE__, fmt, ##__VA_ARGS__)
+#define TVRN_LOG(level, fmt, ...) ::CPTA::log(level, TVRN_SOURCE_FILE, __LINE__, fmt, ##__VA_ARGS__)
 
 // A conversion warning: logged at LL_WARN, only while _log_enabled_state holds.
-#define TVRN_WARN(fmt, ...)                                                          \
-    do {                                                                             \
-        if (::CPTA::_log_enabled_state)                                              \
-            ::CPTA::Log_Call_Frame(::CPTA::LL_WARN, TVRN_SOURCE_FILE, __LINE__)      \
-                .invoke(fmt, ##__VA_ARGS__);                                         \
+#define TVRN_WARN(fmt, ...)                                                     \
+    do {                                                                        \
+        if (::CPTA::_log_enabled_state)                                         \
+            ::CPTA::Log_Call_Frame(::CPTA::LL_WARN, TVRN_SOURCE_FILE, __LINE__) \
+                .invoke(fmt, ##__VA_ARGS__);                                    \
     } while (0)
 
 #endif

@@ -99,9 +99,9 @@ struct Meta_Property {
     const Meta_Qualifier* const* meta_qualifiers;
     size_t num_meta_qualifiers;
     // Property
-    uint16 type;       // Type code
-    sint16 subscript;  // 0 scalar, -1 variable-size array, N fixed-size array
-    uint32 offset;     // offset of the Property<T> slot in the instance
+    uint16 type;              // Type code
+    sint16 subscript;         // 0 scalar, -1 variable-size array, N fixed-size array
+    uint32 offset;            // offset of the Property<T> slot in the instance
     const Meta_Value* value;  // default value, or null
 };
 
@@ -113,9 +113,9 @@ struct Meta_Reference {
     const Meta_Qualifier* const* meta_qualifiers;
     size_t num_meta_qualifiers;
     // Reference
-    sint16 subscript;               // 0 single reference, non-zero reference array
-    const Meta_Class* meta_class;   // class of the referenced instances
-    uint32 offset;                  // offset of the slot in the instance
+    sint16 subscript;              // 0 single reference, non-zero reference array
+    const Meta_Class* meta_class;  // class of the referenced instances
+    uint32 offset;                 // offset of the slot in the instance
 };
 
 // A method begins exactly like a Meta_Class so that a parameter record can be
@@ -144,9 +144,9 @@ struct Meta_Class {
     // Class
     const Meta_Feature* const* meta_features;  // all features, root class first
     size_t num_meta_features;
-    uint32 size;                               // instance size in bytes
-    const bool* locals;                        // true where the class (re)declares the feature
-    const Meta_Class* super_meta_class;        // null for a root class
+    uint32 size;                         // instance size in bytes
+    const bool* locals;                  // true where the class (re)declares the feature
+    const Meta_Class* super_meta_class;  // null for a root class
     size_t num_keys;
     const Meta_Repository* meta_repository;
 };

@@ -11,9 +11,15 @@
 
 namespace CPTA {
 
-inline bool __is_property(const Meta_Feature* mf) { return (mf->flags & FLAG_PROPERTY) != 0; }
-inline bool __is_reference(const Meta_Feature* mf) { return (mf->flags & FLAG_REFERENCE) != 0; }
-inline bool __is_key(const Meta_Feature* mf) { return (mf->flags & FLAG_KEY) != 0; }
+inline bool __is_property(const Meta_Feature* mf) {
+    return (mf->flags & FLAG_PROPERTY) != 0;
+}
+inline bool __is_reference(const Meta_Feature* mf) {
+    return (mf->flags & FLAG_REFERENCE) != 0;
+}
+inline bool __is_key(const Meta_Feature* mf) {
+    return (mf->flags & FLAG_KEY) != 0;
+}
 
 inline const Meta_Property* __as_property(const Meta_Feature* mf) {
     return reinterpret_cast<const Meta_Property*>(mf);
@@ -57,8 +63,12 @@ inline Instance* __ref_slot(const unsigned char* slot) {
 }
 
 // Reference arrays: an Array of instance pointers, then the null flag.
-inline uint8& __ref_array_null(unsigned char* slot) { return slot[ARRAY_SLOT_SIZE]; }
-inline uint8 __ref_array_null(const unsigned char* slot) { return slot[ARRAY_SLOT_SIZE]; }
+inline uint8& __ref_array_null(unsigned char* slot) {
+    return slot[ARRAY_SLOT_SIZE];
+}
+inline uint8 __ref_array_null(const unsigned char* slot) {
+    return slot[ARRAY_SLOT_SIZE];
+}
 inline Instance* const* __ref_array_data(const unsigned char* slot) {
     return reinterpret_cast<Instance* const*>(__array_rep(slot)->data());
 }

@@ -99,12 +99,24 @@ private:
     friend struct __String_Access;
 };
 
-inline bool operator==(const String& a, const String& b) { return a.equal(b); }
-inline bool operator==(const String& a, const char* b) { return a.equal(b); }
-inline bool operator==(const char* a, const String& b) { return b.equal(a); }
-inline bool operator!=(const String& a, const String& b) { return !a.equal(b); }
-inline bool operator!=(const String& a, const char* b) { return !a.equal(b); }
-inline bool operator!=(const char* a, const String& b) { return !b.equal(a); }
+inline bool operator==(const String& a, const String& b) {
+    return a.equal(b);
+}
+inline bool operator==(const String& a, const char* b) {
+    return a.equal(b);
+}
+inline bool operator==(const char* a, const String& b) {
+    return b.equal(a);
+}
+inline bool operator!=(const String& a, const String& b) {
+    return !a.equal(b);
+}
+inline bool operator!=(const String& a, const char* b) {
+    return !a.equal(b);
+}
+inline bool operator!=(const char* a, const String& b) {
+    return !b.equal(a);
+}
 
 // Bounded copy and concatenation into a buffer of size bytes; the result is
 // always NUL-terminated (when size > 0). Both return the length of the string

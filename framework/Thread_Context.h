@@ -38,8 +38,7 @@ public:
     virtual int create_instance(const char* name_space, const Instance* instance) = 0;
     virtual int delete_instance(const char* name_space, const Instance* instance) = 0;
     virtual int modify_instance(const char* name_space, const Instance* instance) = 0;
-    virtual int invoke_method(const char* name_space, const Instance* instance,
-                              Instance* meth) = 0;
+    virtual int invoke_method(const char* name_space, const Instance* instance, Instance* meth) = 0;
     virtual void allow_unload(bool flag) = 0;
     virtual bool get_username(String& user_name) = 0;
 

@@ -12,8 +12,8 @@ struct Type_Entry {
 };
 
 const Type_Entry _types[NUM_TYPES] = {
-    {"boolean", 1}, {"uint8", 1},  {"sint8", 1},  {"uint16", 2},  {"sint16", 2},
-    {"uint32", 4},  {"sint32", 4}, {"uint64", 8}, {"sint64", 8},  {"real32", 4},
+    {"boolean", 1}, {"uint8", 1},  {"sint8", 1},  {"uint16", 2},   {"sint16", 2},
+    {"uint32", 4},  {"sint32", 4}, {"uint64", 8}, {"sint64", 8},   {"real32", 4},
     {"real64", 8},  {"char16", 2}, {"string", 8}, {"datetime", 8},
 };
 

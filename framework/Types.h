@@ -28,8 +28,12 @@ struct char16 {
     operator uint16() const { return code; }
 };
 
-inline bool operator==(char16 a, char16 b) { return a.code == b.code; }
-inline bool operator!=(char16 a, char16 b) { return a.code != b.code; }
+inline bool operator==(char16 a, char16 b) {
+    return a.code == b.code;
+}
+inline bool operator!=(char16 a, char16 b) {
+    return a.code != b.code;
+}
 
 // The CIM scalar type of a property or parameter.
 enum Type {

@@ -165,15 +165,9 @@ void Value::swap(Value& x) noexcept {
 
 void Value::clear() {
     switch (_type) {
-        case STRING:
-            _string(&_u).~String();
-            break;
-        case DATETIME:
-            _datetime(&_u).~Datetime();
-            break;
-        case INSTANCE:
-            unref(static_cast<Instance*>(_u.ptr));
-            break;
+        case STRING: _string(&_u).~String(); break;
+        case DATETIME: _datetime(&_u).~Datetime(); break;
+        case INSTANCE: unref(static_cast<Instance*>(_u.ptr)); break;
         default:
             if (_is_array(_type)) {
                 __Array_Rep* rep = static_cast<__Array_Rep*>(_u.ptr);
@@ -229,11 +223,19 @@ int Value::_get_array(Type type, __Array_Rep*& rep) const {
     return 0;
 }
 
-#define CPTA_VALUE_SCALAR(T, TAG)                                                  \
-    void Value::set_value(T x) { _set_scalar(TAG, &x, sizeof(x)); }                \
-    int Value::get_value(T& x) const { return _get_scalar(TAG, &x, sizeof(x)); }   \
-    void Value::set_value(const Array<T>& x) { _set_array(TAG##_ARRAY, x.__rep()); } \
-    int Value::get_value(Array<T>& x) const { return _get_array(TAG##_ARRAY, x.__rep()); }
+#define CPTA_VALUE_SCALAR(T, TAG)                  \
+    void Value::set_value(T x) {                   \
+        _set_scalar(TAG, &x, sizeof(x));           \
+    }                                              \
+    int Value::get_value(T& x) const {             \
+        return _get_scalar(TAG, &x, sizeof(x));    \
+    }                                              \
+    void Value::set_value(const Array<T>& x) {     \
+        _set_array(TAG##_ARRAY, x.__rep());        \
+    }                                              \
+    int Value::get_value(Array<T>& x) const {      \
+        return _get_array(TAG##_ARRAY, x.__rep()); \
+    }
 
 CPTA_VALUE_SCALAR(boolean, BOOLEAN)
 CPTA_VALUE_SCALAR(uint8, UINT8)
@@ -355,7 +357,8 @@ int Value::get(Instance* instance, const Meta_Feature* feature) const {
         if (mp->subscript)
             __assign(__array_rep(slot), static_cast<const __Array_Rep*>(_u.ptr));
         else if (mp->type == STRING)
-            *reinterpret_cast<String*>(slot) = _string(const_cast<void*>(static_cast<const void*>(&_u)));
+            *reinterpret_cast<String*>(slot) =
+                _string(const_cast<void*>(static_cast<const void*>(&_u)));
         else if (mp->type == DATETIME)
             *reinterpret_cast<Datetime*>(slot) =
                 _datetime(const_cast<void*>(static_cast<const void*>(&_u)));
@@ -388,8 +391,8 @@ int Value::get(Instance* instance, const Meta_Feature* feature) const {
     Instance* const* elements = reinterpret_cast<Instance* const*>(rep->data());
     for (size_t i = 0; i < rep->size; i++) {
         if (!_assignable(mr->meta_class, elements[i])) {
-            TVRN_WARN("failed to assign instance of %s to %s.%s", _class_name(elements[i]),
-                      target, feature->name);
+            TVRN_WARN("failed to assign instance of %s to %s.%s", _class_name(elements[i]), target,
+                      feature->name);
             return -1;
         }
     }

@@ -8,10 +8,18 @@
 
 namespace CPTA {
 
-Json::Value default_JsonReqFP(const Json::Value&) { return Json::Value(); }
-int default_voidRetIntFP() { return -1; }
-unsigned int default_voidRetUIntFP() { return 0xFFFF; }
-const char* default_voidRetStrFP() { return nullptr; }
+Json::Value default_JsonReqFP(const Json::Value&) {
+    return Json::Value();
+}
+int default_voidRetIntFP() {
+    return -1;
+}
+unsigned int default_voidRetUIntFP() {
+    return 0xFFFF;
+}
+const char* default_voidRetStrFP() {
+    return nullptr;
+}
 void default_evtProcessCBRetVoidFP(EvtProcessCB) {}
 void default_log4cxxMsgRetVoidFP(LogMsgCB) {}
 void default_JsonReqVoidFP(const Json::Value&) {}

@@ -50,7 +50,11 @@ public:
     // A call about the object named by `key` (a WWN, MAC or index string).
     LibCall(const char* pointer, const String& key, Wording wording = KEY_FIRST,
             int line = __builtin_LINE(), const char* file = __builtin_FILE())
-        : _pointer(pointer), _key(key), _hasKey(true), _wording(wording), _file(file),
+        : _pointer(pointer),
+          _key(key),
+          _hasKey(true),
+          _wording(wording),
+          _file(file),
           _line(line) {}
 
     LibCall(const char* pointer, const char* key, Wording wording = KEY_FIRST,

@@ -30,14 +30,14 @@ inline const Json::Value* jsonMember(const Json::Value& v, const char* name) {
 // intValue / uintValue mean "fits an int / unsigned", realValue means any number.
 inline bool jsonIsType(const Json::Value& v, Json::ValueType type) {
     switch (type) {
-    case Json::nullValue:    return v.isNull();
-    case Json::intValue:     return v.isInt();
-    case Json::uintValue:    return v.isUInt();
-    case Json::realValue:    return v.isNumeric() && !v.isBool();
-    case Json::stringValue:  return v.isString();
-    case Json::booleanValue: return v.isBool();
-    case Json::arrayValue:   return v.isArray();
-    case Json::objectValue:  return v.isObject();
+        case Json::nullValue: return v.isNull();
+        case Json::intValue: return v.isInt();
+        case Json::uintValue: return v.isUInt();
+        case Json::realValue: return v.isNumeric() && !v.isBool();
+        case Json::stringValue: return v.isString();
+        case Json::booleanValue: return v.isBool();
+        case Json::arrayValue: return v.isArray();
+        case Json::objectValue: return v.isObject();
     }
     return false;
 }

@@ -80,6 +80,8 @@ ProviderInit::~ProviderInit() {
         guardedCall(LibCall("libRegisterLogMsgCb"), [] { libRegisterLogMsgCb(nullptr); });
 }
 
-int ProviderInit::getDriverStatus() { return driverStatus; }
+int ProviderInit::getDriverStatus() {
+    return driverStatus;
+}
 
 }  // namespace CPTA

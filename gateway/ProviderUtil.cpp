@@ -73,9 +73,13 @@ const size_t kMacLength = 17;  // colon format
 
 // ---- host look-up ---------------------------------------------------------
 
-int systemHostName(char* name, size_t length) { return ::gethostname(name, length); }
+int systemHostName(char* name, size_t length) {
+    return ::gethostname(name, length);
+}
 
-int systemDomainName(char* name, size_t length) { return ::getdomainname(name, length); }
+int systemDomainName(char* name, size_t length) {
+    return ::getdomainname(name, length);
+}
 
 bool systemResolveIPv4(const char* name, std::vector<std::string>& addresses) {
     addrinfo hints{};
@@ -174,7 +178,9 @@ bool readHexBytes(const char* text, unsigned char* out, size_t count) {
     return true;
 }
 
-Json::Value jsonText(const String& s) { return Json::Value(s.c_str(), s.c_str() + s.size()); }
+Json::Value jsonText(const String& s) {
+    return Json::Value(s.c_str(), s.c_str() + s.size());
+}
 
 bool readSmallFile(const std::string& path, std::string& content, size_t limit) {
     int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
@@ -291,7 +297,8 @@ int ProviderUtil::getHostInfo(char* hostString, size_t length) {
     std::vector<std::string> addresses;
     if (!hostLookup().resolveIPv4(name, addresses) || addresses.empty()) {
         copyOut(hostString, length, name);
-        TVRN_LOG(LL_INFO, "gethostbyname() FAILED. hostString will have hostname instead of ipAddress");
+        TVRN_LOG(LL_INFO,
+                 "gethostbyname() FAILED. hostString will have hostname instead of ipAddress");
         return 2;
     }
     for (const std::string& address : addresses) {
@@ -497,9 +504,13 @@ int ProviderUtil::getAdapterId(const String& address) {
     return -1;
 }
 
-int ProviderUtil::getAdapterIdByNWWN(const String& wwn) { return getAdapterIdByIndexStr(wwn); }
+int ProviderUtil::getAdapterIdByNWWN(const String& wwn) {
+    return getAdapterIdByIndexStr(wwn);
+}
 
-int ProviderUtil::getAdapterIdByMacAddr(const String& mac) { return getAdapterIdByIndexStr(mac); }
+int ProviderUtil::getAdapterIdByMacAddr(const String& mac) {
+    return getAdapterIdByIndexStr(mac);
+}
 
 int ProviderUtil::getAdapterIdByIndexStr(const String& address) {
     Json::Value request(Json::objectValue);
@@ -571,7 +582,9 @@ bool ProviderUtil::isProcessRunning(const char* name, const char* procRoot) {
     return found;
 }
 
-int ProviderUtil::getAgentPort() { return isProcessRunning("mdcagent") ? AGENT_PORT : 0; }
+int ProviderUtil::getAgentPort() {
+    return isProcessRunning("mdcagent") ? AGENT_PORT : 0;
+}
 
 void ProviderUtil::setTftpDownloadDir(const String& dir) {
     TftpSettings& settings = tftpSettings();
@@ -723,11 +736,11 @@ void ProviderUtil::logMsg(int level, const char* file, int line, const char* mes
     std::snprintf(where, sizeof(where), "%s:%d ", file != nullptr ? file : "", line);
     Log_Level mapped;
     switch (level) {
-    case 2: mapped = LL_INFO; break;
-    case 3: mapped = LL_WARN; break;
-    case 4: mapped = LL_ERR; break;
-    case 5: mapped = LL_INFO; break;
-    default: mapped = LL_DBG; break;
+        case 2: mapped = LL_INFO; break;
+        case 3: mapped = LL_WARN; break;
+        case 4: mapped = LL_ERR; break;
+        case 5: mapped = LL_INFO; break;
+        default: mapped = LL_DBG; break;
     }
     // The library's text is data, never a format.
     TVRN_LOG(mapped, "%s%s", where, message != nullptr ? message : "");

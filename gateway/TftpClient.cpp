@@ -54,7 +54,9 @@ void put16(std::string& packet, uint16_t value) {
     packet.push_back(char(value & 0xFF));
 }
 
-uint16_t get16(const unsigned char* p) { return uint16_t((p[0] << 8) | p[1]); }
+uint16_t get16(const unsigned char* p) {
+    return uint16_t((p[0] << 8) | p[1]);
+}
 
 std::string ackPacket(uint16_t block) {
     std::string packet;
@@ -221,7 +223,8 @@ int Transfer::run(const char* remoteName, std::string& error) {
         uint16_t opcode = get16(buffer);
         uint16_t block = get16(buffer + 2);
         if (opcode == OP_ERROR) {
-            error = "server error " + std::to_string(block) + ": " + errorText(buffer + 4, size_t(n) - 4);
+            error = "server error " + std::to_string(block) + ": " +
+                    errorText(buffer + 4, size_t(n) - 4);
             return -1;
         }
         if (opcode != OP_DATA)

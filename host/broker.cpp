@@ -24,21 +24,18 @@ using B = const CMPIBroker *;
 using C = const CMPIContext *;
 using OP = const CMPIObjectPath *;
 
-CMPIString *newString(HostImpl &h, std::string s)
-{
+CMPIString *newString(HostImpl &h, std::string s) {
     return &make<StringObj>(h.currentArena(), std::move(s))->c;
 }
 
-void setStatus(HostImpl &h, CMPIStatus *rc, const Status &s)
-{
+void setStatus(HostImpl &h, CMPIStatus *rc, const Status &s) {
     if (!rc)
         return;
     rc->rc = static_cast<CMPIrc>(s.rc);
     rc->msg = s.msg.empty() ? nullptr : newString(h, s.msg);
 }
 
-CMPIStatus toStatus(HostImpl &h, const Status &s)
-{
+CMPIStatus toStatus(HostImpl &h, const Status &s) {
     CMPIStatus st;
     setStatus(h, &st, s);
     return st;
@@ -46,8 +43,7 @@ CMPIStatus toStatus(HostImpl &h, const Status &s)
 
 // Runs an up-call body with the host of `b`; no exception leaves it.
 template <class R, class F>
-R upcall(B b, CMPIStatus *rc, R fail, F &&f) noexcept
-{
+R upcall(B b, CMPIStatus *rc, R fail, F &&f) noexcept {
     try {
         HostImpl *h = HostImpl::of(b);
         if (!h) {
@@ -65,22 +61,19 @@ R upcall(B b, CMPIStatus *rc, R fail, F &&f) noexcept
 }
 
 template <class F>
-CMPIStatus upcallStatus(B b, F &&f) noexcept
-{
+CMPIStatus upcallStatus(B b, F &&f) noexcept {
     CMPIStatus st = status(CMPI_RC_OK);
     CMPIStatus r = upcall(b, &st, status(CMPI_RC_ERR_FAILED), std::forward<F>(f));
     return st.rc != CMPI_RC_OK ? st : r;
 }
 
-const ObjectPath *pathArg(OP op)
-{
+const ObjectPath *pathArg(OP op) {
     auto *p = objectOf<PathObj>(op);
     return p ? &p->path : nullptr;
 }
 
 // The path an up-call names, with its namespace filled in from the context.
-bool requestPath(HostImpl &h, OP op, C ctx, CMPIStatus *rc, ObjectPath &out)
-{
+bool requestPath(HostImpl &h, OP op, C ctx, CMPIStatus *rc, ObjectPath &out) {
     auto *p = objectOf<PathObj>(op);
     if (!p) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -92,8 +85,7 @@ bool requestPath(HostImpl &h, OP op, C ctx, CMPIStatus *rc, ObjectPath &out)
 }
 
 template <class T>
-CMPIEnumeration *enumeration(HostImpl &h, const std::vector<T> &items)
-{
+CMPIEnumeration *enumeration(HostImpl &h, const std::vector<T> &items) {
     std::vector<Value> vals;
     vals.reserve(items.size());
     for (const auto &i : items) {
@@ -110,8 +102,7 @@ CMPIEnumeration *enumeration(HostImpl &h, const std::vector<T> &items)
 // ---------------------------------------------------------------------------
 // CMPIBrokerFT
 // ---------------------------------------------------------------------------
-CMPIContext *bPrepareAttachThread(B b, C ctx)
-{
+CMPIContext *bPrepareAttachThread(B b, C ctx) {
     return upcall(b, nullptr, static_cast<CMPIContext *>(nullptr), [&](HostImpl &h) {
         auto *src = objectOf<ContextObj>(ctx);
         PropertyVector entries = src ? src->entries : PropertyVector{};
@@ -119,8 +110,7 @@ CMPIContext *bPrepareAttachThread(B b, C ctx)
     });
 }
 
-CMPIStatus bAttachThread(B b, C ctx)
-{
+CMPIStatus bAttachThread(B b, C ctx) {
     return upcallStatus(b, [&](HostImpl &) {
         if (!objectOf<ContextObj>(ctx))
             return status(CMPI_RC_ERR_INVALID_HANDLE);
@@ -132,8 +122,7 @@ CMPIStatus bAttachThread(B b, C ctx)
     });
 }
 
-CMPIStatus bDetachThread(B b, C ctx)
-{
+CMPIStatus bDetachThread(B b, C ctx) {
     return upcallStatus(b, [&](HostImpl &h) {
         ThreadState &ts = threadState();
         for (auto it = ts.attached.rbegin(); it != ts.attached.rend(); ++it) {
@@ -157,8 +146,7 @@ CMPIStatus bDetachThread(B b, C ctx)
     });
 }
 
-CMPIStatus bDeliverIndication(B b, C, const char *ns, const CMPIInstance *ind)
-{
+CMPIStatus bDeliverIndication(B b, C, const char *ns, const CMPIInstance *ind) {
     return upcallStatus(b, [&](HostImpl &h) {
         auto *i = objectOf<InstanceObj>(ind);
         if (!i)
@@ -168,8 +156,7 @@ CMPIStatus bDeliverIndication(B b, C, const char *ns, const CMPIInstance *ind)
     });
 }
 
-CMPIEnumeration *bEnumInstanceNames(B b, C ctx, OP op, CMPIStatus *rc)
-{
+CMPIEnumeration *bEnumInstanceNames(B b, C ctx, OP op, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIEnumeration *>(nullptr),
                   [&](HostImpl &h) -> CMPIEnumeration * {
                       ObjectPath p;
@@ -182,8 +169,7 @@ CMPIEnumeration *bEnumInstanceNames(B b, C ctx, OP op, CMPIStatus *rc)
                   });
 }
 
-CMPIEnumeration *bEnumInstances(B b, C ctx, OP op, const char **props, CMPIStatus *rc)
-{
+CMPIEnumeration *bEnumInstances(B b, C ctx, OP op, const char **props, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIEnumeration *>(nullptr),
                   [&](HostImpl &h) -> CMPIEnumeration * {
                       ObjectPath p;
@@ -197,23 +183,19 @@ CMPIEnumeration *bEnumInstances(B b, C ctx, OP op, const char **props, CMPIStatu
                   });
 }
 
-CMPIInstance *bGetInstance(B b, C ctx, OP op, const char **props, CMPIStatus *rc)
-{
-    return upcall(b, rc, static_cast<CMPIInstance *>(nullptr),
-                  [&](HostImpl &h) -> CMPIInstance * {
-                      ObjectPath p;
-                      if (!requestPath(h, op, ctx, rc, p))
-                          return nullptr;
-                      Instance out;
-                      Status s = h.getInstance(h.requestFrom(ctx), p, propertyList(props), out);
-                      setStatus(h, rc, s);
-                      return s.ok() ? &make<InstanceObj>(h.currentArena(), std::move(out))->c
-                                    : nullptr;
-                  });
+CMPIInstance *bGetInstance(B b, C ctx, OP op, const char **props, CMPIStatus *rc) {
+    return upcall(b, rc, static_cast<CMPIInstance *>(nullptr), [&](HostImpl &h) -> CMPIInstance * {
+        ObjectPath p;
+        if (!requestPath(h, op, ctx, rc, p))
+            return nullptr;
+        Instance out;
+        Status s = h.getInstance(h.requestFrom(ctx), p, propertyList(props), out);
+        setStatus(h, rc, s);
+        return s.ok() ? &make<InstanceObj>(h.currentArena(), std::move(out))->c : nullptr;
+    });
 }
 
-CMPIObjectPath *bCreateInstance(B b, C ctx, OP op, const CMPIInstance *inst, CMPIStatus *rc)
-{
+CMPIObjectPath *bCreateInstance(B b, C ctx, OP op, const CMPIInstance *inst, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIObjectPath *>(nullptr),
                   [&](HostImpl &h) -> CMPIObjectPath * {
                       ObjectPath p;
@@ -227,13 +209,11 @@ CMPIObjectPath *bCreateInstance(B b, C ctx, OP op, const CMPIInstance *inst, CMP
                       ObjectPath out;
                       Status s = h.createInstance(h.requestFrom(ctx), p, i->inst, out);
                       setStatus(h, rc, s);
-                      return s.ok() ? &make<PathObj>(h.currentArena(), std::move(out))->c
-                                    : nullptr;
+                      return s.ok() ? &make<PathObj>(h.currentArena(), std::move(out))->c : nullptr;
                   });
 }
 
-CMPIStatus bModifyInstance(B b, C ctx, OP op, const CMPIInstance *inst, const char **props)
-{
+CMPIStatus bModifyInstance(B b, C ctx, OP op, const CMPIInstance *inst, const char **props) {
     return upcallStatus(b, [&](HostImpl &h) {
         CMPIStatus st = status(CMPI_RC_OK);
         ObjectPath p;
@@ -244,8 +224,7 @@ CMPIStatus bModifyInstance(B b, C ctx, OP op, const CMPIInstance *inst, const ch
     });
 }
 
-CMPIStatus bDeleteInstance(B b, C ctx, OP op)
-{
+CMPIStatus bDeleteInstance(B b, C ctx, OP op) {
     return upcallStatus(b, [&](HostImpl &h) {
         CMPIStatus st = status(CMPI_RC_OK);
         ObjectPath p;
@@ -255,14 +234,12 @@ CMPIStatus bDeleteInstance(B b, C ctx, OP op)
     });
 }
 
-CMPIEnumeration *bExecQuery(B, C, OP, const char *, const char *, CMPIStatus *rc)
-{
+CMPIEnumeration *bExecQuery(B, C, OP, const char *, const char *, CMPIStatus *rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
-CMPIEnumeration *associationUpcall(B b, C ctx, OP op, AssocQuery q, CMPIStatus *rc)
-{
+CMPIEnumeration *associationUpcall(B b, C ctx, OP op, AssocQuery q, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIEnumeration *>(nullptr),
                   [&](HostImpl &h) -> CMPIEnumeration * {
                       if (!requestPath(h, op, ctx, rc, q.source))
@@ -274,50 +251,56 @@ CMPIEnumeration *associationUpcall(B b, C ctx, OP op, AssocQuery q, CMPIStatus *
                   });
 }
 
-std::string str(const char *s) { return s ? s : ""; }
+std::string str(const char *s) {
+    return s ? s : "";
+}
 
 CMPIEnumeration *bAssociators(B b, C ctx, OP op, const char *assocClass, const char *resultClass,
                               const char *role, const char *resultRole, const char **props,
-                              CMPIStatus *rc)
-{
+                              CMPIStatus *rc) {
     return associationUpcall(b, ctx, op,
-                             AssocQuery{AssocOp::Associators, {}, str(assocClass),
-                                        str(resultClass), str(role), str(resultRole),
+                             AssocQuery{AssocOp::Associators,
+                                        {},
+                                        str(assocClass),
+                                        str(resultClass),
+                                        str(role),
+                                        str(resultRole),
                                         propertyList(props)},
                              rc);
 }
 
 CMPIEnumeration *bAssociatorNames(B b, C ctx, OP op, const char *assocClass,
-                                  const char *resultClass, const char *role,
-                                  const char *resultRole, CMPIStatus *rc)
-{
+                                  const char *resultClass, const char *role, const char *resultRole,
+                                  CMPIStatus *rc) {
     return associationUpcall(b, ctx, op,
-                             AssocQuery{AssocOp::AssociatorNames, {}, str(assocClass),
-                                        str(resultClass), str(role), str(resultRole),
+                             AssocQuery{AssocOp::AssociatorNames,
+                                        {},
+                                        str(assocClass),
+                                        str(resultClass),
+                                        str(role),
+                                        str(resultRole),
                                         std::nullopt},
                              rc);
 }
 
 CMPIEnumeration *bReferences(B b, C ctx, OP op, const char *resultClass, const char *role,
-                             const char **props, CMPIStatus *rc)
-{
-    return associationUpcall(b, ctx, op,
-                             AssocQuery{AssocOp::References, {}, str(resultClass), "", str(role),
-                                        "", propertyList(props)},
-                             rc);
+                             const char **props, CMPIStatus *rc) {
+    return associationUpcall(
+        b, ctx, op,
+        AssocQuery{
+            AssocOp::References, {}, str(resultClass), "", str(role), "", propertyList(props)},
+        rc);
 }
 
 CMPIEnumeration *bReferenceNames(B b, C ctx, OP op, const char *resultClass, const char *role,
-                                 CMPIStatus *rc)
-{
-    return associationUpcall(b, ctx, op,
-                             AssocQuery{AssocOp::ReferenceNames, {}, str(resultClass), "",
-                                        str(role), "", std::nullopt},
-                             rc);
+                                 CMPIStatus *rc) {
+    return associationUpcall(
+        b, ctx, op,
+        AssocQuery{AssocOp::ReferenceNames, {}, str(resultClass), "", str(role), "", std::nullopt},
+        rc);
 }
 
-CMPIData noData()
-{
+CMPIData noData() {
     CMPIData d;
     std::memset(&d, 0, sizeof d);
     d.type = CMPI_null;
@@ -326,8 +309,7 @@ CMPIData noData()
 }
 
 CMPIData bInvokeMethod(B b, C ctx, OP op, const char *method, const CMPIArgs *in, CMPIArgs *out,
-                       CMPIStatus *rc)
-{
+                       CMPIStatus *rc) {
     return upcall(b, rc, noData(), [&](HostImpl &h) {
         ObjectPath p;
         if (!method || !requestPath(h, op, ctx, rc, p)) {
@@ -350,8 +332,7 @@ CMPIData bInvokeMethod(B b, C ctx, OP op, const char *method, const CMPIArgs *in
     });
 }
 
-CMPIStatus bSetProperty(B b, C ctx, OP op, const char *name, const CMPIValue *v, CMPIType t)
-{
+CMPIStatus bSetProperty(B b, C ctx, OP op, const char *name, const CMPIValue *v, CMPIType t) {
     return upcallStatus(b, [&](HostImpl &h) {
         CMPIStatus st = status(CMPI_RC_OK);
         ObjectPath p;
@@ -363,13 +344,12 @@ CMPIStatus bSetProperty(B b, C ctx, OP op, const char *name, const CMPIValue *v,
             return status(r);
         Instance inst(p);
         inst.set(name, std::move(val));
-        return toStatus(h, h.modifyInstance(h.requestFrom(ctx), p, inst,
-                                            std::vector<std::string>{name}));
+        return toStatus(
+            h, h.modifyInstance(h.requestFrom(ctx), p, inst, std::vector<std::string>{name}));
     });
 }
 
-CMPIData bGetProperty(B b, C ctx, OP op, const char *name, CMPIStatus *rc)
-{
+CMPIData bGetProperty(B b, C ctx, OP op, const char *name, CMPIStatus *rc) {
     return upcall(b, rc, noData(), [&](HostImpl &h) {
         ObjectPath p;
         if (!name || !requestPath(h, op, ctx, rc, p)) {
@@ -394,16 +374,14 @@ CMPIData bGetProperty(B b, C ctx, OP op, const char *name, CMPIStatus *rc)
 // CMPIBrokerEncFT
 // ---------------------------------------------------------------------------
 template <class O, class... A>
-typename O::CType *newObject(B b, CMPIStatus *rc, A &&...args)
-{
+typename O::CType *newObject(B b, CMPIStatus *rc, A &&...args) {
     using CT = typename O::CType;
     return upcall(b, rc, static_cast<CT *>(nullptr), [&](HostImpl &h) {
         return &make<O>(h.currentArena(), std::forward<A>(args)...)->c;
     });
 }
 
-CMPIInstance *eNewInstance(B b, OP op, CMPIStatus *rc)
-{
+CMPIInstance *eNewInstance(B b, OP op, CMPIStatus *rc) {
     auto *p = objectOf<PathObj>(op);
     if (!p) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -412,20 +390,19 @@ CMPIInstance *eNewInstance(B b, OP op, CMPIStatus *rc)
     return newObject<InstanceObj>(b, rc, Instance(p->path));
 }
 
-CMPIObjectPath *eNewObjectPath(B b, const char *ns, const char *cn, CMPIStatus *rc)
-{
+CMPIObjectPath *eNewObjectPath(B b, const char *ns, const char *cn, CMPIStatus *rc) {
     return newObject<PathObj>(b, rc, ObjectPath(str(ns), str(cn)));
 }
 
-CMPIArgs *eNewArgs(B b, CMPIStatus *rc) { return newObject<ArgsObj>(b, rc); }
+CMPIArgs *eNewArgs(B b, CMPIStatus *rc) {
+    return newObject<ArgsObj>(b, rc);
+}
 
-CMPIString *eNewString(B b, const char *data, CMPIStatus *rc)
-{
+CMPIString *eNewString(B b, const char *data, CMPIStatus *rc) {
     return newObject<StringObj>(b, rc, str(data));
 }
 
-CMPIArray *eNewArray(B b, CMPICount max, CMPIType type, CMPIStatus *rc)
-{
+CMPIArray *eNewArray(B b, CMPICount max, CMPIType type, CMPIStatus *rc) {
     auto t = hostType(type);
     if (!t || (type & ~CMPI_ARRAY) == CMPI_null) {
         setRc(rc, CMPI_RC_ERR_INVALID_DATA_TYPE);
@@ -434,18 +411,15 @@ CMPIArray *eNewArray(B b, CMPICount max, CMPIType type, CMPIStatus *rc)
     return newObject<ArrayObj>(b, rc, *t, std::vector<Value>(max, Value::null(*t)));
 }
 
-CMPIDateTime *eNewDateTime(B b, CMPIStatus *rc)
-{
+CMPIDateTime *eNewDateTime(B b, CMPIStatus *rc) {
     return newObject<DateTimeObj>(b, rc, DateTime::now());
 }
 
-CMPIDateTime *eNewDateTimeFromBinary(B b, CMPIUint64 bin, CMPIBoolean interval, CMPIStatus *rc)
-{
+CMPIDateTime *eNewDateTimeFromBinary(B b, CMPIUint64 bin, CMPIBoolean interval, CMPIStatus *rc) {
     return newObject<DateTimeObj>(b, rc, DateTime::fromBinary(bin, interval != 0));
 }
 
-CMPIDateTime *eNewDateTimeFromChars(B b, const char *text, CMPIStatus *rc)
-{
+CMPIDateTime *eNewDateTimeFromChars(B b, const char *text, CMPIStatus *rc) {
     auto dt = text ? DateTime::parse(text) : std::nullopt;
     if (!dt) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -455,16 +429,14 @@ CMPIDateTime *eNewDateTimeFromChars(B b, const char *text, CMPIStatus *rc)
 }
 
 CMPISelectExp *eNewSelectExp(B, const char *, const char *, CMPIArray **projection,
-                             CMPIStatus *rc)
-{
+                             CMPIStatus *rc) {
     if (projection)
         *projection = nullptr;
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
-CMPIBoolean eClassPathIsA(B b, OP op, const char *type, CMPIStatus *rc)
-{
+CMPIBoolean eClassPathIsA(B b, OP op, const char *type, CMPIStatus *rc) {
     return upcall(b, rc, CMPIBoolean(0), [&](HostImpl &h) {
         const ObjectPath *p = pathArg(op);
         if (!p || !type) {
@@ -476,8 +448,7 @@ CMPIBoolean eClassPathIsA(B b, OP op, const char *type, CMPIStatus *rc)
 }
 
 // The kind of an encapsulated object given as `const void *`.
-const Encap *encapOf(const void *object)
-{
+const Encap *encapOf(const void *object) {
     if (!object)
         return nullptr;
     const auto *shape = static_cast<const CMPIString *>(object);  // {hdl, ft}
@@ -485,41 +456,38 @@ const Encap *encapOf(const void *object)
     return e && e->magic == kMagic ? e : nullptr;
 }
 
-const char *typeNameOf(const Encap &e)
-{
+const char *typeNameOf(const Encap &e) {
     static const char *const names[] = {
-        "CMPIString", "CMPIArray",   "CMPIInstance", "CMPIObjectPath", "CMPIArgs",
-        "CMPIEnumeration", "CMPIDateTime", "CMPIContext", "CMPIResult", "CMPISelectExp",
+        "CMPIString",      "CMPIArray",    "CMPIInstance", "CMPIObjectPath", "CMPIArgs",
+        "CMPIEnumeration", "CMPIDateTime", "CMPIContext",  "CMPIResult",     "CMPISelectExp",
     };
     return names[static_cast<int>(e.kind)];
 }
 
-std::string describe(const Encap &e)
-{
+std::string describe(const Encap &e) {
     switch (e.kind) {
-    case Kind::String: return static_cast<const StringObj &>(e).s;
-    case Kind::ObjectPath: return static_cast<const PathObj &>(e).path.toString();
-    case Kind::Instance: return static_cast<const InstanceObj &>(e).inst.toString();
-    case Kind::DateTime: return static_cast<const DateTimeObj &>(e).dt.text();
-    case Kind::Array: {
-        const auto &a = static_cast<const ArrayObj &>(e);
-        return Value::array(a.elem, a.items).toString();
-    }
-    case Kind::Args:
-    case Kind::Context: {
-        const auto &list = e.kind == Kind::Args ? static_cast<const ArgsObj &>(e).args
-                                                : static_cast<const ContextObj &>(e).entries;
-        std::string s;
-        for (const auto &p : list)
-            s += (s.empty() ? "" : ", ") + p.name + "=" + p.value.toString();
-        return s;
-    }
-    default: return typeNameOf(e);
+        case Kind::String: return static_cast<const StringObj &>(e).s;
+        case Kind::ObjectPath: return static_cast<const PathObj &>(e).path.toString();
+        case Kind::Instance: return static_cast<const InstanceObj &>(e).inst.toString();
+        case Kind::DateTime: return static_cast<const DateTimeObj &>(e).dt.text();
+        case Kind::Array: {
+            const auto &a = static_cast<const ArrayObj &>(e);
+            return Value::array(a.elem, a.items).toString();
+        }
+        case Kind::Args:
+        case Kind::Context: {
+            const auto &list = e.kind == Kind::Args ? static_cast<const ArgsObj &>(e).args
+                                                    : static_cast<const ContextObj &>(e).entries;
+            std::string s;
+            for (const auto &p : list)
+                s += (s.empty() ? "" : ", ") + p.name + "=" + p.value.toString();
+            return s;
+        }
+        default: return typeNameOf(e);
     }
 }
 
-CMPIString *eToString(B b, const void *object, CMPIStatus *rc)
-{
+CMPIString *eToString(B b, const void *object, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIString *>(nullptr), [&](HostImpl &h) -> CMPIString * {
         const Encap *e = encapOf(object);
         if (!e) {
@@ -530,8 +498,7 @@ CMPIString *eToString(B b, const void *object, CMPIStatus *rc)
     });
 }
 
-CMPIBoolean eIsOfType(B, const void *object, const char *type, CMPIStatus *rc)
-{
+CMPIBoolean eIsOfType(B, const void *object, const char *type, CMPIStatus *rc) {
     const Encap *e = encapOf(object);
     if (!e || !type) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -541,8 +508,7 @@ CMPIBoolean eIsOfType(B, const void *object, const char *type, CMPIStatus *rc)
     return std::strcmp(typeNameOf(*e), type) == 0;
 }
 
-CMPIString *eGetType(B b, const void *object, CMPIStatus *rc)
-{
+CMPIString *eGetType(B b, const void *object, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIString *>(nullptr), [&](HostImpl &h) -> CMPIString * {
         const Encap *e = encapOf(object);
         if (!e) {
@@ -554,25 +520,24 @@ CMPIString *eGetType(B b, const void *object, CMPIStatus *rc)
 }
 
 // Replaces $0..$9 in `def` by the (type, value) pairs of the argument list.
-std::string formatMessage(const char *def, CMPICount count, va_list ap)
-{
+std::string formatMessage(const char *def, CMPICount count, va_list ap) {
     std::vector<std::string> args;
     for (CMPICount i = 0; i < count && i < 10; ++i) {
         const int type = va_arg(ap, int);
         switch (type) {
-        case CMPI_sint32: args.push_back(std::to_string(va_arg(ap, long))); break;
-        case CMPI_uint32: args.push_back(std::to_string(va_arg(ap, unsigned long))); break;
-        case CMPI_sint64: args.push_back(std::to_string(va_arg(ap, CMPISint64))); break;
-        case CMPI_uint64: args.push_back(std::to_string(va_arg(ap, CMPIUint64))); break;
-        case CMPI_real64: args.push_back(Value::real64(va_arg(ap, double)).toString()); break;
-        case CMPI_boolean: args.push_back(va_arg(ap, int) ? "true" : "false"); break;
-        case CMPI_chars: {
-            const char *s = va_arg(ap, const char *);
-            args.push_back(s ? s : "");
-            break;
-        }
-        case CMPI_string: args.push_back(readString(va_arg(ap, const CMPIString *))); break;
-        default: i = count;  // unknown tag: the rest cannot be read safely
+            case CMPI_sint32: args.push_back(std::to_string(va_arg(ap, long))); break;
+            case CMPI_uint32: args.push_back(std::to_string(va_arg(ap, unsigned long))); break;
+            case CMPI_sint64: args.push_back(std::to_string(va_arg(ap, CMPISint64))); break;
+            case CMPI_uint64: args.push_back(std::to_string(va_arg(ap, CMPIUint64))); break;
+            case CMPI_real64: args.push_back(Value::real64(va_arg(ap, double)).toString()); break;
+            case CMPI_boolean: args.push_back(va_arg(ap, int) ? "true" : "false"); break;
+            case CMPI_chars: {
+                const char *s = va_arg(ap, const char *);
+                args.push_back(s ? s : "");
+                break;
+            }
+            case CMPI_string: args.push_back(readString(va_arg(ap, const CMPIString *))); break;
+            default: i = count;  // unknown tag: the rest cannot be read safely
         }
     }
     std::string out;
@@ -589,8 +554,7 @@ std::string formatMessage(const char *def, CMPICount count, va_list ap)
 }
 
 CMPIString *eGetMessage(B b, const char *, const char *defMsg, CMPIStatus *rc, CMPICount count,
-                        ...)
-{
+                        ...) {
     va_list ap;
     va_start(ap, count);
     std::string text;
@@ -605,8 +569,7 @@ CMPIString *eGetMessage(B b, const char *, const char *defMsg, CMPIStatus *rc, C
 
 #ifdef CMPI_VER_100
 CMPIStatus eLogMessage(B b, CMPISeverity severity, const char *id, const char *text,
-                       const CMPIString *string)
-{
+                       const CMPIString *string) {
     return upcallStatus(b, [&](HostImpl &h) {
         h.log("log[" + std::to_string(severity) + "] " + str(id) + ": " +
               (text ? std::string(text) : readString(string)));
@@ -615,8 +578,7 @@ CMPIStatus eLogMessage(B b, CMPISeverity severity, const char *id, const char *t
 }
 
 CMPIStatus eTrace(B b, CMPILevel level, const char *component, const char *text,
-                  const CMPIString *string)
-{
+                  const CMPIString *string) {
     return upcallStatus(b, [&](HostImpl &h) {
         h.log("trace[" + std::to_string(level) + "] " + str(component) + ": " +
               (text ? std::string(text) : readString(string)));
@@ -627,25 +589,24 @@ CMPIStatus eTrace(B b, CMPILevel level, const char *component, const char *text,
 
 #ifdef CMPI_VER_200
 CMPIError *eNewCMPIError(B, const char *, const char *, const char *, const CMPIErrorSeverity,
-                         const CMPIErrorProbableCause, const CMPIrc, CMPIStatus *rc)
-{
+                         const CMPIErrorProbableCause, const CMPIrc, CMPIStatus *rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
-CMPIStatus eOpenMessageFile(B, const char *, CMPIMsgFileHandle *handle)
-{
+CMPIStatus eOpenMessageFile(B, const char *, CMPIMsgFileHandle *handle) {
     // No message catalogues: every look-up yields the default message.
     if (handle)
         *handle = nullptr;
     return status(CMPI_RC_OK);
 }
 
-CMPIStatus eCloseMessageFile(B, const CMPIMsgFileHandle) { return status(CMPI_RC_OK); }
+CMPIStatus eCloseMessageFile(B, const CMPIMsgFileHandle) {
+    return status(CMPI_RC_OK);
+}
 
 CMPIString *eGetMessage2(B b, const char *, const CMPIMsgFileHandle, const char *defMsg,
-                         CMPIStatus *rc, CMPICount count, ...)
-{
+                         CMPIStatus *rc, CMPICount count, ...) {
     va_list ap;
     va_start(ap, count);
     std::string text;
@@ -665,8 +626,7 @@ CMPIString *eGetMessage2(B b, const char *, const CMPIMsgFileHandle, const char 
 static_assert(sizeof(pthread_t) <= sizeof(void *), "thread handle fits CMPI_THREAD_TYPE");
 static_assert(sizeof(pthread_key_t) == sizeof(CMPI_THREAD_KEY_TYPE), "thread key type");
 
-char *xResolveFileName(const char *name)
-{
+char *xResolveFileName(const char *name) {
     if (!name)
         return nullptr;
     const size_t n = std::strlen(name) + sizeof "lib.so";
@@ -677,8 +637,7 @@ char *xResolveFileName(const char *name)
 }
 
 CMPI_THREAD_TYPE xNewThread(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL *start)(void *), void *parm,
-                            int detached)
-{
+                            int detached) {
     pthread_t t;
     if (pthread_create(&t, nullptr, start, parm) != 0)
         return nullptr;
@@ -687,25 +646,26 @@ CMPI_THREAD_TYPE xNewThread(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL *start)(void *)
     return reinterpret_cast<CMPI_THREAD_TYPE>(t);
 }
 
-int xJoinThread(CMPI_THREAD_TYPE t, CMPI_THREAD_RETURN *ret)
-{
+int xJoinThread(CMPI_THREAD_TYPE t, CMPI_THREAD_RETURN *ret) {
     return pthread_join(reinterpret_cast<pthread_t>(t), ret);
 }
 
-int xExitThread(CMPI_THREAD_RETURN rc) { pthread_exit(rc); }
+int xExitThread(CMPI_THREAD_RETURN rc) {
+    pthread_exit(rc);
+}
 
-int xCancelThread(CMPI_THREAD_TYPE t) { return pthread_cancel(reinterpret_cast<pthread_t>(t)); }
+int xCancelThread(CMPI_THREAD_TYPE t) {
+    return pthread_cancel(reinterpret_cast<pthread_t>(t));
+}
 
-int xThreadSleep(CMPIUint32 msec)
-{
+int xThreadSleep(CMPIUint32 msec) {
     timespec ts{static_cast<time_t>(msec / 1000), static_cast<long>(msec % 1000) * 1000000L};
     while (nanosleep(&ts, &ts) != 0 && errno == EINTR) {
     }
     return 0;
 }
 
-int xThreadOnce(int *once, void (*init)(void))
-{
+int xThreadOnce(int *once, void (*init)(void)) {
     static pthread_mutex_t m = PTHREAD_MUTEX_INITIALIZER;
     pthread_mutex_lock(&m);
     if (*once == 0) {
@@ -716,8 +676,7 @@ int xThreadOnce(int *once, void (*init)(void))
     return 0;
 }
 
-int xCreateThreadKey(CMPI_THREAD_KEY_TYPE *key, void (*cleanup)(void *))
-{
+int xCreateThreadKey(CMPI_THREAD_KEY_TYPE *key, void (*cleanup)(void *)) {
     pthread_key_t k;
     const int r = pthread_key_create(&k, cleanup);
     if (r == 0)
@@ -725,13 +684,18 @@ int xCreateThreadKey(CMPI_THREAD_KEY_TYPE *key, void (*cleanup)(void *))
     return r;
 }
 
-int xDestroyThreadKey(CMPI_THREAD_KEY_TYPE key) { return pthread_key_delete(key); }
-void *xGetThreadSpecific(CMPI_THREAD_KEY_TYPE key) { return pthread_getspecific(key); }
-int xSetThreadSpecific(CMPI_THREAD_KEY_TYPE key, void *v) { return pthread_setspecific(key, v); }
+int xDestroyThreadKey(CMPI_THREAD_KEY_TYPE key) {
+    return pthread_key_delete(key);
+}
+void *xGetThreadSpecific(CMPI_THREAD_KEY_TYPE key) {
+    return pthread_getspecific(key);
+}
+int xSetThreadSpecific(CMPI_THREAD_KEY_TYPE key, void *v) {
+    return pthread_setspecific(key, v);
+}
 
 // Broker mutexes are recursive.
-CMPI_MUTEX_TYPE xNewMutex(int)
-{
+CMPI_MUTEX_TYPE xNewMutex(int) {
     auto *m = new (std::nothrow) pthread_mutex_t;
     if (!m)
         return nullptr;
@@ -743,8 +707,7 @@ CMPI_MUTEX_TYPE xNewMutex(int)
     return m;
 }
 
-void xDestroyMutex(CMPI_MUTEX_TYPE m)
-{
+void xDestroyMutex(CMPI_MUTEX_TYPE m) {
     auto *pm = static_cast<pthread_mutex_t *>(m);
     if (!pm)
         return;
@@ -752,19 +715,21 @@ void xDestroyMutex(CMPI_MUTEX_TYPE m)
     delete pm;
 }
 
-void xLockMutex(CMPI_MUTEX_TYPE m) { pthread_mutex_lock(static_cast<pthread_mutex_t *>(m)); }
-void xUnlockMutex(CMPI_MUTEX_TYPE m) { pthread_mutex_unlock(static_cast<pthread_mutex_t *>(m)); }
+void xLockMutex(CMPI_MUTEX_TYPE m) {
+    pthread_mutex_lock(static_cast<pthread_mutex_t *>(m));
+}
+void xUnlockMutex(CMPI_MUTEX_TYPE m) {
+    pthread_mutex_unlock(static_cast<pthread_mutex_t *>(m));
+}
 
-CMPI_COND_TYPE xNewCondition(int)
-{
+CMPI_COND_TYPE xNewCondition(int) {
     auto *c = new (std::nothrow) pthread_cond_t;
     if (c)
         pthread_cond_init(c, nullptr);
     return c;
 }
 
-void xDestroyCondition(CMPI_COND_TYPE c)
-{
+void xDestroyCondition(CMPI_COND_TYPE c) {
     auto *pc = static_cast<pthread_cond_t *>(c);
     if (!pc)
         return;
@@ -772,18 +737,18 @@ void xDestroyCondition(CMPI_COND_TYPE c)
     delete pc;
 }
 
-int xCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m)
-{
+int xCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m) {
     return pthread_cond_wait(static_cast<pthread_cond_t *>(c), static_cast<pthread_mutex_t *>(m));
 }
 
-int xTimedCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m, struct timespec *wait)
-{
+int xTimedCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m, struct timespec *wait) {
     return pthread_cond_timedwait(static_cast<pthread_cond_t *>(c),
                                   static_cast<pthread_mutex_t *>(m), wait);
 }
 
-int xSignalCondition(CMPI_COND_TYPE c) { return pthread_cond_signal(static_cast<pthread_cond_t *>(c)); }
+int xSignalCondition(CMPI_COND_TYPE c) {
+    return pthread_cond_signal(static_cast<pthread_cond_t *>(c));
+}
 
 // ---------------------------------------------------------------------------
 // CMPIBrokerMemFT: allocations live in the current arena like objects do.
@@ -800,13 +765,11 @@ std::mutex gMemMutex;
 std::unordered_map<void *, struct MemBlock *> gBlocks;
 
 struct MemBlock : Node {
-    explicit MemBlock(void *p) : ptr(p)
-    {
+    explicit MemBlock(void *p) : ptr(p) {
         std::lock_guard<std::mutex> g(gMemMutex);
         gBlocks[ptr] = this;
     }
-    ~MemBlock() override
-    {
+    ~MemBlock() override {
         {
             std::lock_guard<std::mutex> g(gMemMutex);
             gBlocks.erase(ptr);
@@ -816,22 +779,19 @@ struct MemBlock : Node {
     void *ptr;
 };
 
-MemBlock *blockOf(void *p)
-{
+MemBlock *blockOf(void *p) {
     std::lock_guard<std::mutex> g(gMemMutex);
     auto it = gBlocks.find(p);
     return it == gBlocks.end() ? nullptr : it->second;
 }
 
-CMPIGcStat *mMark(B b, CMPIStatus *rc)
-{
+CMPIGcStat *mMark(B b, CMPIStatus *rc) {
     return upcall(b, rc, static_cast<CMPIGcStat *>(nullptr), [&](HostImpl &h) {
         return static_cast<CMPIGcStat *>(make<GcMark>(h.currentArena()));
     });
 }
 
-CMPIStatus mRelease(B, const CMPIGcStat *gc)
-{
+CMPIStatus mRelease(B, const CMPIGcStat *gc) {
     auto *m = static_cast<GcMark *>(const_cast<CMPIGcStat *>(gc));
     if (!m || m->magic != kMarkMagic || !m->owner)
         return status(CMPI_RC_ERR_INVALID_HANDLE);
@@ -839,8 +799,7 @@ CMPIStatus mRelease(B, const CMPIGcStat *gc)
     return status(CMPI_RC_OK);
 }
 
-void *adoptBlock(B b, void *p)
-{
+void *adoptBlock(B b, void *p) {
     if (!p)
         return nullptr;
     HostImpl *h = HostImpl::of(b);
@@ -857,18 +816,22 @@ void *adoptBlock(B b, void *p)
     }
 }
 
-void *mMalloc(B b, size_t n) { return adoptBlock(b, std::malloc(n)); }
-void *mCalloc(B b, size_t n, size_t s) { return adoptBlock(b, std::calloc(n, s)); }
-char *mStrDup(B b, const char *s) { return s ? static_cast<char *>(adoptBlock(b, strdup(s))) : nullptr; }
+void *mMalloc(B b, size_t n) {
+    return adoptBlock(b, std::malloc(n));
+}
+void *mCalloc(B b, size_t n, size_t s) {
+    return adoptBlock(b, std::calloc(n, s));
+}
+char *mStrDup(B b, const char *s) {
+    return s ? static_cast<char *>(adoptBlock(b, strdup(s))) : nullptr;
+}
 
-void mFree(B, void *p)
-{
+void mFree(B, void *p) {
     if (MemBlock *blk = p ? blockOf(p) : nullptr)
         destroy(blk);
 }
 
-void *mRealloc(B b, void *p, size_t n)
-{
+void *mRealloc(B b, void *p, size_t n) {
     if (!p)
         return mMalloc(b, n);
     MemBlock *blk = blockOf(p);
@@ -890,8 +853,7 @@ void *mRealloc(B b, void *p, size_t n)
 }
 
 template <class O>
-void mFreeObject(B, typename O::CType *c)
-{
+void mFreeObject(B, typename O::CType *c) {
     if (O *o = objectOf<O>(c))
         destroy(o);
 }
@@ -957,10 +919,10 @@ CMPIBrokerEncFT gBrokerEncFT = {
 
 #ifdef CMPI_VER_90
 CMPIBrokerExtFT gBrokerExtFT = {
-    CMPICurrentVersion, xResolveFileName, xNewThread,        xJoinThread,       xExitThread,
-    xCancelThread,      xThreadSleep,     xThreadOnce,       xCreateThreadKey,  xDestroyThreadKey,
-    xGetThreadSpecific, xSetThreadSpecific, xNewMutex,       xDestroyMutex,     xLockMutex,
-    xUnlockMutex,       xNewCondition,    xDestroyCondition, xCondWait,         xTimedCondWait,
+    CMPICurrentVersion, xResolveFileName,   xNewThread,        xJoinThread,      xExitThread,
+    xCancelThread,      xThreadSleep,       xThreadOnce,       xCreateThreadKey, xDestroyThreadKey,
+    xGetThreadSpecific, xSetThreadSpecific, xNewMutex,         xDestroyMutex,    xLockMutex,
+    xUnlockMutex,       xNewCondition,      xDestroyCondition, xCondWait,        xTimedCondWait,
     xSignalCondition,
 };
 #endif
@@ -985,8 +947,7 @@ CMPIBrokerMemFT gBrokerMemFT = {
 };
 #endif
 
-void initBroker(HostImpl &h)
-{
+void initBroker(HostImpl &h) {
     h.broker.hdl = &h;
     h.broker.bft = &gBrokerFT;
     h.broker.eft = &gBrokerEncFT;
@@ -998,8 +959,7 @@ void initBroker(HostImpl &h)
 #endif
 }
 
-HostImpl *HostImpl::of(const CMPIBroker *b)
-{
+HostImpl *HostImpl::of(const CMPIBroker *b) {
     if (!b || b->bft != &gBrokerFT || !b->hdl)
         return nullptr;
     return static_cast<HostImpl *>(b->hdl);

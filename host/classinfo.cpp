@@ -19,9 +19,7 @@ const uint32 KIND_FLAGS = FLAG_PROPERTY | FLAG_REFERENCE | FLAG_METHOD | FLAG_CL
 
 // "[A, B (x), C] " from the flags, or nothing. `embedded` names the class of
 // an EmbeddedInstance; a parameter always states In.
-std::string qualifiers(uint32 flags, const Meta_Class *embedded = nullptr,
-                       bool parameter = false)
-{
+std::string qualifiers(uint32 flags, const Meta_Class *embedded = nullptr, bool parameter = false) {
     std::string s;
     for (int bit = 0; bit < 32; ++bit) {
         const uint32 flag = 1u << bit;
@@ -40,16 +38,14 @@ std::string qualifiers(uint32 flags, const Meta_Class *embedded = nullptr,
     return s.empty() ? s : s + "] ";
 }
 
-std::string arrayMark(sint16 subscript)
-{
+std::string arrayMark(sint16 subscript) {
     if (subscript == 0)
         return "";
     return subscript < 0 ? "[]" : "[" + std::to_string(subscript) + "]";
 }
 
 template <class T>
-T load(const void *p)
-{
+T load(const void *p) {
     T v;
     std::memcpy(&v, p, sizeof v);
     return v;
@@ -57,39 +53,36 @@ T load(const void *p)
 
 // The value of a default stored as a T of the property's type (a string or
 // date-time as its C string).
-Value storedValue(int type, const void *p)
-{
+Value storedValue(int type, const void *p) {
     switch (type) {
-    case BOOLEAN: return Value::boolean(load<boolean>(p));
-    case UINT8: return Value::uint8(load<uint8>(p));
-    case SINT8: return Value::sint8(load<sint8>(p));
-    case UINT16: return Value::uint16(load<uint16>(p));
-    case SINT16: return Value::sint16(load<sint16>(p));
-    case UINT32: return Value::uint32(load<uint32>(p));
-    case SINT32: return Value::sint32(load<sint32>(p));
-    case UINT64: return Value::uint64(load<uint64>(p));
-    case SINT64: return Value::sint64(load<sint64>(p));
-    case REAL32: return Value::real32(load<real32>(p));
-    case REAL64: return Value::real64(load<real64>(p));
-    case CHAR16: return Value::char16(load<char16>(p).code);
-    case STRING: return Value::string(load<const char *>(p));
-    case DATETIME: {
-        const char *text = load<const char *>(p);
-        const auto dt = DateTime::parse(text);
-        return dt ? Value::dateTime(*dt) : Value::null(Type::DateTime);
-    }
+        case BOOLEAN: return Value::boolean(load<boolean>(p));
+        case UINT8: return Value::uint8(load<uint8>(p));
+        case SINT8: return Value::sint8(load<sint8>(p));
+        case UINT16: return Value::uint16(load<uint16>(p));
+        case SINT16: return Value::sint16(load<sint16>(p));
+        case UINT32: return Value::uint32(load<uint32>(p));
+        case SINT32: return Value::sint32(load<sint32>(p));
+        case UINT64: return Value::uint64(load<uint64>(p));
+        case SINT64: return Value::sint64(load<sint64>(p));
+        case REAL32: return Value::real32(load<real32>(p));
+        case REAL64: return Value::real64(load<real64>(p));
+        case CHAR16: return Value::char16(load<char16>(p).code);
+        case STRING: return Value::string(load<const char *>(p));
+        case DATETIME: {
+            const char *text = load<const char *>(p);
+            const auto dt = DateTime::parse(text);
+            return dt ? Value::dateTime(*dt) : Value::null(Type::DateTime);
+        }
     }
     return Value();
 }
 
-size_t storedSize(int type)
-{
+size_t storedSize(int type) {
     return type == STRING || type == DATETIME ? sizeof(const char *) : type_size(type);
 }
 
 // The property's default as a MOF literal.
-std::string defaultValue(const Meta_Property *mp)
-{
+std::string defaultValue(const Meta_Property *mp) {
     const void *value = mp->value;
     if (!type_name(mp->type))
         return "NULL";
@@ -103,15 +96,13 @@ std::string defaultValue(const Meta_Property *mp)
     return mofValue(Value::array(*typeFromName(type_name(mp->type)), elements));
 }
 
-const char *typeName(int type)
-{
+const char *typeName(int type) {
     const char *name = type_name(type);
     return name ? name : "void";
 }
 
 // A property, reference or parameter: "[qualifiers] type Name[] = default".
-std::string declaration(const Meta_Feature *mf, bool parameter)
-{
+std::string declaration(const Meta_Feature *mf, bool parameter) {
     if (mf->flags & FLAG_REFERENCE) {
         const auto *mr = reinterpret_cast<const Meta_Reference *>(mf);
         const char *cls = mr->meta_class ? mr->meta_class->name : "CIM_ManagedElement";
@@ -131,8 +122,7 @@ std::string declaration(const Meta_Feature *mf, bool parameter)
 
 // "[qualifiers] type Name([In] type A, ...)"; the return value is the
 // parameter named return_value.
-std::string methodDeclaration(const Meta_Method *mm)
-{
+std::string methodDeclaration(const Meta_Method *mm) {
     std::string params;
     for (size_t i = 0; i < mm->num_meta_features; ++i) {
         const Meta_Feature *p = mm->meta_features[i];
@@ -140,22 +130,19 @@ std::string methodDeclaration(const Meta_Method *mm)
             continue;
         params += (params.empty() ? "" : ", ") + declaration(p, true);
     }
-    return qualifiers(mm->flags) + typeName(mm->return_type) + ' ' + mm->name + '(' + params +
-           ')';
+    return qualifiers(mm->flags) + typeName(mm->return_type) + ' ' + mm->name + '(' + params + ')';
 }
 
 }  // namespace
 
-std::vector<std::string> classNames(const Meta_Repository &repository)
-{
+std::vector<std::string> classNames(const Meta_Repository &repository) {
     std::vector<std::string> names;
     for (size_t i = 0; i < repository.num_meta_classes; ++i)
         names.push_back(repository.meta_classes[i]->name);
     return names;
 }
 
-std::string classMof(const Meta_Class &mc)
-{
+std::string classMof(const Meta_Class &mc) {
     std::string s = qualifiers(mc.flags);
     if (!s.empty())
         s.back() = '\n';
@@ -166,29 +153,25 @@ std::string classMof(const Meta_Class &mc)
     for (size_t i = 0; i < mc.num_meta_features; ++i) {
         const Meta_Feature *mf = mc.meta_features[i];
         s += "    ";
-        s += mf->flags & FLAG_METHOD
-                 ? methodDeclaration(reinterpret_cast<const Meta_Method *>(mf))
-                 : declaration(mf, false);
+        s += mf->flags & FLAG_METHOD ? methodDeclaration(reinterpret_cast<const Meta_Method *>(mf))
+                                     : declaration(mf, false);
         s += ";\n";
     }
     return s + "};\n";
 }
 
-std::vector<std::string> RepositoryCatalog::classNames() const
-{
+std::vector<std::string> RepositoryCatalog::classNames() const {
     return classinfo::classNames(repository_);
 }
 
-std::optional<std::string> RepositoryCatalog::classMof(const std::string &name) const
-{
+std::optional<std::string> RepositoryCatalog::classMof(const std::string &name) const {
     const Meta_Class *mc = find_meta_class(&repository_, name.c_str());
     if (!mc)
         return std::nullopt;
     return classinfo::classMof(*mc);
 }
 
-const cli::ClassCatalog &moduleCatalog()
-{
+const cli::ClassCatalog &moduleCatalog() {
     static const RepositoryCatalog catalog(__meta_repository);
     return catalog;
 }

@@ -37,10 +37,7 @@ std::string classMof(const CPTA::Meta_Class &meta_class);
 
 class RepositoryCatalog : public cli::ClassCatalog {
 public:
-    explicit RepositoryCatalog(const CPTA::Meta_Repository &repository)
-        : repository_(repository)
-    {
-    }
+    explicit RepositoryCatalog(const CPTA::Meta_Repository &repository) : repository_(repository) {}
     std::vector<std::string> classNames() const override;
     std::optional<std::string> classMof(const std::string &name) const override;
 

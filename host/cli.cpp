@@ -16,8 +16,7 @@
 namespace tvrnhost {
 namespace cli {
 
-Defaults defaultsFor(const std::string &exePath)
-{
+Defaults defaultsFor(const std::string &exePath) {
     Defaults d;
     const size_t slash = exePath.rfind('/');
     const std::string dir = slash == std::string::npos ? "." : exePath.substr(0, slash);
@@ -31,13 +30,11 @@ Defaults defaultsFor(const std::string &exePath)
 // ---------------------------------------------------------------------------
 // Printing
 // ---------------------------------------------------------------------------
-std::string formatInstance(const Instance &inst)
-{
+std::string formatInstance(const Instance &inst) {
     return "// " + inst.path().toString() + '\n' + mofInstance(inst);
 }
 
-std::string formatInstances(const std::vector<Instance> &items)
-{
+std::string formatInstances(const std::vector<Instance> &items) {
     std::string s;
     for (size_t i = 0; i < items.size(); ++i) {
         if (i)
@@ -47,24 +44,21 @@ std::string formatInstances(const std::vector<Instance> &items)
     return s;
 }
 
-std::string formatPaths(const std::vector<ObjectPath> &items)
-{
+std::string formatPaths(const std::vector<ObjectPath> &items) {
     std::string s;
     for (const auto &p : items)
         s += p.toString() + '\n';
     return s;
 }
 
-std::string formatMethodResult(const MethodResult &r)
-{
+std::string formatMethodResult(const MethodResult &r) {
     std::string s = "ReturnValue = " + mofValue(r.returnValue) + ";\n";
     for (const auto &arg : r.out)
         s += arg.name + " = " + mofValue(arg.value) + ";\n";
     return s;
 }
 
-std::string formatFailure(const Status &st)
-{
+std::string formatFailure(const Status &st) {
     std::string s = "tvrncli: " + rcName(st.rc) + " (" + std::to_string(st.rc) + ")";
     if (!st.msg.empty()) {
         std::string msg = st.msg;
@@ -83,13 +77,11 @@ namespace {
 struct CommandArgs {
     std::vector<std::string> positional;
     std::map<std::string, std::string> options;
-    std::string option(const std::string &name) const
-    {
+    std::string option(const std::string &name) const {
         auto it = options.find(name);
         return it == options.end() ? std::string() : it->second;
     }
-    std::vector<std::string> from(size_t i) const
-    {
+    std::vector<std::string> from(size_t i) const {
         return std::vector<std::string>(positional.begin() + static_cast<long>(i),
                                         positional.end());
     }
@@ -114,26 +106,25 @@ struct Command {
     Handler run;
 };
 
-int failed(std::ostream &err, const Status &st)
-{
+int failed(std::ostream &err, const Status &st) {
     err << formatFailure(st) << '\n';
     return 1;
 }
 
 // Prints what a request returned, or its failure.
 template <class R, class Print>
-int report(Env &e, const R &r, Print print)
-{
+int report(Env &e, const R &r, Print print) {
     if (!r.ok())
         return failed(e.err, r);
     e.out << print(r);
     return 0;
 }
 
-int reportStatus(Env &e, const Status &st) { return st.ok() ? 0 : failed(e.err, st); }
+int reportStatus(Env &e, const Status &st) {
+    return st.ok() ? 0 : failed(e.err, st);
+}
 
-ObjectPath pathArg(const Env &e, const std::string &text)
-{
+ObjectPath pathArg(const Env &e, const std::string &text) {
     ObjectPath p;
     try {
         p = ObjectPath::parse(text);
@@ -152,32 +143,26 @@ ObjectPath pathArg(const Env &e, const std::string &text)
 const auto printInstances = [](const auto &r) { return formatInstances(r.items); };
 const auto printPaths = [](const auto &r) { return formatPaths(r.items); };
 
-int cmdEnumerate(Env &e, const CommandArgs &a)
-{
+int cmdEnumerate(Env &e, const CommandArgs &a) {
     return report(e, e.host.enumerateInstances(e.inv.nameSpace, a.positional[0], e.inv.props),
                   printInstances);
 }
 
-int cmdEnumerateNames(Env &e, const CommandArgs &a)
-{
-    return report(e, e.host.enumerateInstanceNames(e.inv.nameSpace, a.positional[0]),
-                  printPaths);
+int cmdEnumerateNames(Env &e, const CommandArgs &a) {
+    return report(e, e.host.enumerateInstanceNames(e.inv.nameSpace, a.positional[0]), printPaths);
 }
 
-int cmdGet(Env &e, const CommandArgs &a)
-{
+int cmdGet(Env &e, const CommandArgs &a) {
     return report(e, e.host.getInstance(pathArg(e, a.positional[0]), e.inv.props),
                   [](const InstanceResult &r) { return formatInstance(r.instance); });
 }
 
-int cmdDelete(Env &e, const CommandArgs &a)
-{
+int cmdDelete(Env &e, const CommandArgs &a) {
     return reportStatus(e, e.host.deleteInstance(pathArg(e, a.positional[0])));
 }
 
 // The instance of `ci` and `mi`: keys from the path, then the assignments.
-Instance assignedInstance(Env &e, const CommandArgs &a, std::vector<std::string> &names)
-{
+Instance assignedInstance(Env &e, const CommandArgs &a, std::vector<std::string> &names) {
     Instance inst(pathArg(e, a.positional[0]));
     for (const auto &k : inst.path().keys())
         inst.set(k.name, k.value);
@@ -188,63 +173,55 @@ Instance assignedInstance(Env &e, const CommandArgs &a, std::vector<std::string>
     return inst;
 }
 
-int cmdCreate(Env &e, const CommandArgs &a)
-{
+int cmdCreate(Env &e, const CommandArgs &a) {
     std::vector<std::string> names;
     return report(e, e.host.createInstance(assignedInstance(e, a, names)),
                   [](const PathResult &r) { return r.path.toString() + '\n'; });
 }
 
-int cmdModify(Env &e, const CommandArgs &a)
-{
+int cmdModify(Env &e, const CommandArgs &a) {
     std::vector<std::string> names;
     const Instance inst = assignedInstance(e, a, names);
     return reportStatus(e, e.host.modifyInstance(inst, names));
 }
 
-int cmdAssociators(Env &e, const CommandArgs &a)
-{
-    return report(e,
-                  e.host.associators(pathArg(e, a.positional[0]), a.option("assoc"),
-                                     a.option("result-class"), a.option("role"),
-                                     a.option("result-role"), e.inv.props),
-                  printInstances);
+int cmdAssociators(Env &e, const CommandArgs &a) {
+    return report(
+        e,
+        e.host.associators(pathArg(e, a.positional[0]), a.option("assoc"), a.option("result-class"),
+                           a.option("role"), a.option("result-role"), e.inv.props),
+        printInstances);
 }
 
-int cmdAssociatorNames(Env &e, const CommandArgs &a)
-{
-    return report(e,
-                  e.host.associatorNames(pathArg(e, a.positional[0]), a.option("assoc"),
-                                         a.option("result-class"), a.option("role"),
-                                         a.option("result-role")),
-                  printPaths);
+int cmdAssociatorNames(Env &e, const CommandArgs &a) {
+    return report(
+        e,
+        e.host.associatorNames(pathArg(e, a.positional[0]), a.option("assoc"),
+                               a.option("result-class"), a.option("role"), a.option("result-role")),
+        printPaths);
 }
 
-int cmdReferences(Env &e, const CommandArgs &a)
-{
+int cmdReferences(Env &e, const CommandArgs &a) {
     return report(e,
                   e.host.references(pathArg(e, a.positional[0]), a.option("result-class"),
                                     a.option("role"), e.inv.props),
                   printInstances);
 }
 
-int cmdReferenceNames(Env &e, const CommandArgs &a)
-{
+int cmdReferenceNames(Env &e, const CommandArgs &a) {
     return report(e,
                   e.host.referenceNames(pathArg(e, a.positional[0]), a.option("result-class"),
                                         a.option("role")),
                   printPaths);
 }
 
-int cmdCallMethod(Env &e, const CommandArgs &a)
-{
+int cmdCallMethod(Env &e, const CommandArgs &a) {
     const ObjectPath p = pathArg(e, a.positional[0]);
     const PropertyVector in = parseAssignments(a.from(2));
     return report(e, e.host.invokeMethod(p, a.positional[1], in), formatMethodResult);
 }
 
-int cmdIndications(Env &e, const CommandArgs &a)
-{
+int cmdIndications(Env &e, const CommandArgs &a) {
     double seconds = 10;
     if (a.positional.size() == 2) {
         char *end = nullptr;
@@ -273,27 +250,23 @@ int cmdIndications(Env &e, const CommandArgs &a)
     return reportStatus(e, e.host.unsubscribe(ns, cls));
 }
 
-const ClassCatalog &catalog(const Env &e)
-{
+const ClassCatalog &catalog(const Env &e) {
     static const struct None : ClassCatalog {
         std::vector<std::string> classNames() const override { return {}; }
-        std::optional<std::string> classMof(const std::string &) const override
-        {
+        std::optional<std::string> classMof(const std::string &) const override {
             return std::nullopt;
         }
     } none;
     return e.inv.catalog ? *e.inv.catalog : none;
 }
 
-int cmdClasses(Env &e, const CommandArgs &)
-{
+int cmdClasses(Env &e, const CommandArgs &) {
     for (const auto &name : catalog(e).classNames())
         e.out << name << '\n';
     return 0;
 }
 
-int cmdGetClass(Env &e, const CommandArgs &a)
-{
+int cmdGetClass(Env &e, const CommandArgs &a) {
     const auto mof = catalog(e).classMof(a.positional[0]);
     if (!mof)
         return failed(e.err, Status{CMPI_RC_ERR_INVALID_CLASS, "no class " + a.positional[0]});
@@ -301,8 +274,7 @@ int cmdGetClass(Env &e, const CommandArgs &a)
     return 0;
 }
 
-int cmdHelp(Env &e, const CommandArgs &)
-{
+int cmdHelp(Env &e, const CommandArgs &) {
     e.out << usage();
     return 0;
 }
@@ -314,10 +286,24 @@ const Command kCommands[] = {
     {"ei", "CLASS", "enumerate instances", {}, 1, 1, true, false, cmdEnumerate},
     {"ein", "CLASS", "enumerate instance names", {}, 1, 1, true, false, cmdEnumerateNames},
     {"gi", "PATH", "get an instance", {}, 1, 1, true, false, cmdGet},
-    {"ci", "PATH [PROP=VALUE]...", "create an instance (keys from PATH)", {}, 1, SIZE_MAX, true,
-     false, cmdCreate},
-    {"mi", "PATH [PROP=VALUE]...", "modify the listed properties of an instance", {}, 1,
-     SIZE_MAX, true, false, cmdModify},
+    {"ci",
+     "PATH [PROP=VALUE]...",
+     "create an instance (keys from PATH)",
+     {},
+     1,
+     SIZE_MAX,
+     true,
+     false,
+     cmdCreate},
+    {"mi",
+     "PATH [PROP=VALUE]...",
+     "modify the listed properties of an instance",
+     {},
+     1,
+     SIZE_MAX,
+     true,
+     false,
+     cmdModify},
     {"di", "PATH", "delete an instance", {}, 1, 1, true, false, cmdDelete},
     {"ai", "PATH [--assoc C] [--result-class C] [--role R] [--result-role R]",
      "associated instances", kAssocOptions, 1, 1, true, false, cmdAssociators},
@@ -325,23 +311,49 @@ const Command kCommands[] = {
      false, cmdAssociatorNames},
     {"ri", "PATH [--result-class ASSOC] [--role R]", "referencing association instances",
      kRefOptions, 1, 1, true, false, cmdReferences},
-    {"rin", "PATH [same options as ri]", "referencing association names", kRefOptions, 1, 1,
-     true, false, cmdReferenceNames},
-    {"cm", "PATH METHOD [ARG=VALUE]...",
-     "call a method, print return value and outputs", {}, 2, SIZE_MAX, true,
-     false, cmdCallMethod},
+    {"rin", "PATH [same options as ri]", "referencing association names", kRefOptions, 1, 1, true,
+     false, cmdReferenceNames},
+    {"cm",
+     "PATH METHOD [ARG=VALUE]...",
+     "call a method, print return value and outputs",
+     {},
+     2,
+     SIZE_MAX,
+     true,
+     false,
+     cmdCallMethod},
     {"im", "PATH METHOD [ARG=VALUE]...", "", {}, 2, SIZE_MAX, true, true, cmdCallMethod},
-    {"ind", "CLASS [SECONDS]", "subscribe and print indications (default 10 s)", {}, 1, 2, true,
-     false, cmdIndications},
-    {"gc", "CLASS", "print a class of the module's class schema as MOF", {}, 1, 1, false, false,
+    {"ind",
+     "CLASS [SECONDS]",
+     "subscribe and print indications (default 10 s)",
+     {},
+     1,
+     2,
+     true,
+     false,
+     cmdIndications},
+    {"gc",
+     "CLASS",
+     "print a class of the module's class schema as MOF",
+     {},
+     1,
+     1,
+     false,
+     false,
      cmdGetClass},
-    {"classes", "", "list the classes of the module's class schema", {}, 0, 0, false, false,
+    {"classes",
+     "",
+     "list the classes of the module's class schema",
+     {},
+     0,
+     0,
+     false,
+     false,
      cmdClasses},
     {"help", "", "this text", {}, 0, 0, false, false, cmdHelp},
 };
 
-const Command *findCommand(const std::string &name)
-{
+const Command *findCommand(const std::string &name) {
     for (const auto &c : kCommands)
         if (name == c.name)
             return &c;
@@ -354,16 +366,14 @@ const struct {
     const char *word;
     const char *note;
 } kNotes[] = {
-    {"PATH",
-     "PATH: [//host/][namespace:]Class.Key=\"value\",Key2=5 (namespace defaults to -n)\n"},
+    {"PATH", "PATH: [//host/][namespace:]Class.Key=\"value\",Key2=5 (namespace defaults to -n)\n"},
     {"VALUE",
      "VALUE: \"text\", 5, -1, 2.5, TRUE, NULL, {1, 2}, or typed as uint16:5,\n"
      "       datetime:\"20240101000000.000000+000\", string[]:{\"a\"}; a bare word is a\n"
      "       string; a reference is a quoted PATH\n"},
 };
 
-std::string commandUsage(const Command &c)
-{
+std::string commandUsage(const Command &c) {
     std::string s = std::string("usage: tvrncli [OPTIONS] ") + c.name;
     if (*c.synopsis)
         s += std::string(" ") + c.synopsis;
@@ -374,8 +384,7 @@ std::string commandUsage(const Command &c)
     return s;
 }
 
-CommandArgs splitArgs(const Command &c, const std::vector<std::string> &args)
-{
+CommandArgs splitArgs(const Command &c, const std::vector<std::string> &args) {
     CommandArgs r;
     for (size_t i = 0; i < args.size(); ++i) {
         const std::string &a = args[i];
@@ -395,8 +404,7 @@ CommandArgs splitArgs(const Command &c, const std::vector<std::string> &args)
     return r;
 }
 
-std::vector<std::string> splitList(const std::string &s)
-{
+std::vector<std::string> splitList(const std::string &s) {
     std::vector<std::string> r;
     std::stringstream ss(s);
     std::string item;
@@ -406,8 +414,7 @@ std::vector<std::string> splitList(const std::string &s)
     return r;
 }
 
-std::string readFile(const std::string &path)
-{
+std::string readFile(const std::string &path) {
     std::ifstream f(path);
     if (!f)
         throw ParseError(path + ": cannot open");
@@ -418,8 +425,7 @@ std::string readFile(const std::string &path)
 
 }  // namespace
 
-std::string usage()
-{
+std::string usage() {
     std::string s =
         "usage: tvrncli [OPTIONS] COMMAND ARGS\n"
         "\n"
@@ -453,14 +459,12 @@ std::string usage()
     return s;
 }
 
-bool usesModule(const std::string &command)
-{
+bool usesModule(const std::string &command) {
     const Command *c = findCommand(command);
     return c && c->usesModule;
 }
 
-PropertyVector parseAssignments(const std::vector<std::string> &args)
-{
+PropertyVector parseAssignments(const std::vector<std::string> &args) {
     PropertyVector r;
     for (const auto &a : args) {
         const size_t eq = a.find('=');
@@ -478,8 +482,7 @@ PropertyVector parseAssignments(const std::vector<std::string> &args)
     return r;
 }
 
-Invocation parseInvocation(const std::vector<std::string> &args, const Defaults &d)
-{
+Invocation parseInvocation(const std::vector<std::string> &args, const Defaults &d) {
     Invocation inv;
     inv.module = d.module;
     inv.reg = d.reg;
@@ -520,8 +523,7 @@ Invocation parseInvocation(const std::vector<std::string> &args, const Defaults 
     return inv;
 }
 
-void seedStores(Host &host, const Invocation &inv)
-{
+void seedStores(Host &host, const Invocation &inv) {
     for (const auto &file : inv.seeds) {
         std::vector<Instance> insts;
         try {
@@ -538,8 +540,7 @@ void seedStores(Host &host, const Invocation &inv)
     }
 }
 
-int execute(Host &host, const Invocation &inv, std::ostream &out, std::ostream &err)
-{
+int execute(Host &host, const Invocation &inv, std::ostream &out, std::ostream &err) {
     const Command *c = findCommand(inv.command);
     if (!c) {
         err << "tvrncli: unknown command '" << inv.command << "' (see tvrncli help)\n";
@@ -555,8 +556,7 @@ int execute(Host &host, const Invocation &inv, std::ostream &out, std::ostream &
 }
 
 int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &err,
-        const Defaults &d)
-{
+        const Defaults &d) {
     Invocation inv;
     try {
         inv = parseInvocation(args, d);
@@ -585,8 +585,7 @@ int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &e
     return rc;
 }
 
-int main(int argc, char **argv, const ClassCatalog *catalog)
-{
+int main(int argc, char **argv, const ClassCatalog *catalog) {
     std::string exe = argc > 0 ? argv[0] : "tvrncli";
     char buf[PATH_MAX];
     const ssize_t n = readlink("/proc/self/exe", buf, sizeof buf - 1);

@@ -51,7 +51,7 @@ struct Invocation {
     std::vector<std::string> seeds;  // instance files for the stores
     PropertyList props;              // --props A,B
     std::string command;
-    std::vector<std::string> args;   // the command's own arguments and options
+    std::vector<std::string> args;  // the command's own arguments and options
 };
 
 // Parses the global options and the command (throws ParseError on misuse).

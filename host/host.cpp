@@ -46,16 +46,14 @@ const RcName kRcNames[] = {
 
 }  // namespace
 
-std::string rcName(int rc)
-{
+std::string rcName(int rc) {
     for (const auto &r : kRcNames)
         if (r.rc == rc)
             return r.name;
     return "CMPI_RC_" + std::to_string(rc);
 }
 
-std::string Status::toString() const
-{
+std::string Status::toString() const {
     return msg.empty() ? rcName(rc) : rcName(rc) + ": " + msg;
 }
 
@@ -68,8 +66,7 @@ class StoreImpl : public InstanceStore {
 public:
     explicit StoreImpl(std::string ns) : ns_(std::move(ns)) {}
 
-    bool add(Instance inst) override
-    {
+    bool add(Instance inst) override {
         inst.path().setNameSpace(ns_);
         std::lock_guard<std::mutex> g(m_);
         for (const auto &i : insts_)
@@ -79,8 +76,7 @@ public:
         return true;
     }
 
-    bool remove(const ObjectPath &path) override
-    {
+    bool remove(const ObjectPath &path) override {
         std::lock_guard<std::mutex> g(m_);
         auto it = std::find_if(insts_.begin(), insts_.end(),
                                [&](const Instance &i) { return i.path().identifies(path); });
@@ -90,8 +86,7 @@ public:
         return true;
     }
 
-    std::optional<Instance> find(const ObjectPath &path) const override
-    {
+    std::optional<Instance> find(const ObjectPath &path) const override {
         std::lock_guard<std::mutex> g(m_);
         for (const auto &i : insts_)
             if (i.path().identifies(path))
@@ -99,8 +94,7 @@ public:
         return std::nullopt;
     }
 
-    bool replace(const ObjectPath &path, const Instance &inst)
-    {
+    bool replace(const ObjectPath &path, const Instance &inst) {
         std::lock_guard<std::mutex> g(m_);
         for (auto &i : insts_)
             if (i.path().identifies(path)) {
@@ -110,20 +104,17 @@ public:
         return false;
     }
 
-    std::vector<Instance> all() const override
-    {
+    std::vector<Instance> all() const override {
         std::lock_guard<std::mutex> g(m_);
         return insts_;
     }
 
-    void defineClass(const std::string &cls) override
-    {
+    void defineClass(const std::string &cls) override {
         std::lock_guard<std::mutex> g(m_);
         classes_.insert(toLower(cls));
     }
 
-    bool hasClass(const HostImpl &h, const std::string &cls) const
-    {
+    bool hasClass(const HostImpl &h, const std::string &cls) const {
         std::lock_guard<std::mutex> g(m_);
         for (const auto &c : classes_)
             if (h.isA(c, cls))
@@ -134,8 +125,7 @@ public:
         return false;
     }
 
-    void clear() override
-    {
+    void clear() override {
         std::lock_guard<std::mutex> g(m_);
         insts_.clear();
         classes_.clear();
@@ -152,30 +142,30 @@ namespace {
 
 // An instance restricted to a property list (keys always kept), as a server
 // returns it.
-Instance filtered(const Instance &inst, const PropertyList &props)
-{
+Instance filtered(const Instance &inst, const PropertyList &props) {
     if (!props)
         return inst;
     Instance r(inst.path());
     for (const auto &p : inst.properties()) {
-        const bool wanted =
-            inst.path().key(p.name) ||
-            std::any_of(props->begin(), props->end(),
-                        [&](const std::string &n) { return equalsIgnoreCase(n, p.name); });
+        const bool wanted = inst.path().key(p.name) ||
+                            std::any_of(props->begin(), props->end(), [&](const std::string &n) {
+                                return equalsIgnoreCase(n, p.name);
+                            });
         if (wanted)
             r.set(p.name, p.value);
     }
     return r;
 }
 
-const char *orNull(const std::string &s) { return s.empty() ? nullptr : s.c_str(); }
+const char *orNull(const std::string &s) {
+    return s.empty() ? nullptr : s.c_str();
+}
 
 // A request's own context and memory: installed on the calling thread for
 // the duration of one MI call, freed with everything made in it.
 class Scope {
 public:
-    Scope(HostImpl &h, const HostImpl::Req &r, const std::string &ns)
-    {
+    Scope(HostImpl &h, const HostImpl::Req &r, const std::string &ns) {
         PropertyVector e;
         e.push_back({CMPIPrincipal, Value::string(r.principal)});
         e.push_back({CMPIInvocationFlags, Value::uint32(h.opts.invocationFlags)});
@@ -183,8 +173,7 @@ public:
         ctx_ = make<ContextObj>(arena_, std::move(e));
         threadState().arenas.push_back(&arena_);
     }
-    ~Scope()
-    {
+    ~Scope() {
         auto &a = threadState().arenas;
         auto it = std::find(a.rbegin(), a.rend(), &arena_);
         if (it != a.rend())
@@ -225,8 +214,7 @@ struct MIInfo<CMPIIndicationMI> {
     static CMPIIndicationMI *&slot(Provider &p) { return p.indicationMI; }
 };
 
-bool openModule(Module &m, Status &st)
-{
+bool openModule(Module &m, Status &st) {
     if (m.handle)
         return true;
     dlerror();
@@ -239,15 +227,13 @@ bool openModule(Module &m, Status &st)
     return true;
 }
 
-std::string dirName(const std::string &p)
-{
+std::string dirName(const std::string &p) {
     const size_t s = p.rfind('/');
     return s == std::string::npos ? "." : p.substr(0, s);
 }
 
 // "lib<stem>.so" -> "<stem>"
-std::string libraryStem(const std::string &p)
-{
+std::string libraryStem(const std::string &p) {
     std::string b = p.substr(p.rfind('/') == std::string::npos ? 0 : p.rfind('/') + 1);
     if (b.compare(0, 3, "lib") == 0)
         b = b.substr(3);
@@ -260,22 +246,21 @@ std::string libraryStem(const std::string &p)
 // ---------------------------------------------------------------------------
 // HostImpl
 // ---------------------------------------------------------------------------
-HostImpl::HostImpl(HostOptions o) : opts(std::move(o)) { initBroker(*this); }
+HostImpl::HostImpl(HostOptions o) : opts(std::move(o)) {
+    initBroker(*this);
+}
 
-HostImpl::~HostImpl()
-{
+HostImpl::~HostImpl() {
     if (isLoaded)
         unload();
 }
 
-Arena &HostImpl::currentArena()
-{
+Arena &HostImpl::currentArena() {
     ThreadState &ts = threadState();
     return ts.arenas.empty() ? orphans : *ts.arenas.back();
 }
 
-HostImpl::Req HostImpl::requestFrom(const CMPIContext *ctx) const
-{
+HostImpl::Req HostImpl::requestFrom(const CMPIContext *ctx) const {
     if (auto *c = objectOf<ContextObj>(ctx))
         if (const Value *v = findProperty(c->entries, CMPIPrincipal))
             if (v->type() == Type::String && !v->isNull())
@@ -283,8 +268,7 @@ HostImpl::Req HostImpl::requestFrom(const CMPIContext *ctx) const
     return request();
 }
 
-std::string HostImpl::nameSpaceOf(const ObjectPath &p, const CMPIContext *ctx) const
-{
+std::string HostImpl::nameSpaceOf(const ObjectPath &p, const CMPIContext *ctx) const {
     if (!p.nameSpace().empty())
         return p.nameSpace();
     if (auto *c = objectOf<ContextObj>(ctx))
@@ -294,8 +278,7 @@ std::string HostImpl::nameSpaceOf(const ObjectPath &p, const CMPIContext *ctx) c
     return std::string();
 }
 
-bool HostImpl::isA(const std::string &cls, const std::string &super) const
-{
+bool HostImpl::isA(const std::string &cls, const std::string &super) const {
     std::string c = toLower(cls);
     const std::string target = toLower(super);
     std::lock_guard<std::mutex> g(classMutex);
@@ -310,8 +293,7 @@ bool HostImpl::isA(const std::string &cls, const std::string &super) const
     return false;
 }
 
-std::vector<Instance> HostImpl::storedInstances(const std::string &ns) const
-{
+std::vector<Instance> HostImpl::storedInstances(const std::string &ns) const {
     StoreImpl *s = nullptr;
     {
         std::lock_guard<std::mutex> g(storeMutex);
@@ -322,8 +304,7 @@ std::vector<Instance> HostImpl::storedInstances(const std::string &ns) const
     return s ? s->all() : std::vector<Instance>{};
 }
 
-StoreImpl &HostImpl::store(const std::string &ns)
-{
+StoreImpl &HostImpl::store(const std::string &ns) {
     std::lock_guard<std::mutex> g(storeMutex);
     auto &s = stores[toLower(ns)];
     if (!s)
@@ -331,8 +312,7 @@ StoreImpl &HostImpl::store(const std::string &ns)
     return *s;
 }
 
-void HostImpl::deliver(const std::string &ns, Instance inst)
-{
+void HostImpl::deliver(const std::string &ns, Instance inst) {
     {
         std::lock_guard<std::mutex> g(indMutex);
         inds.push_back(Indication{ns, std::move(inst)});
@@ -340,23 +320,20 @@ void HostImpl::deliver(const std::string &ns, Instance inst)
     indCv.notify_all();
 }
 
-void HostImpl::log(std::string line)
-{
+void HostImpl::log(std::string line) {
     std::lock_guard<std::mutex> g(logMutex);
     logs.push_back(std::move(line));
 }
 
 const ClassEntry *HostImpl::entry(const std::string &ns, const std::string &cls,
-                                  unsigned kind) const
-{
+                                  unsigned kind) const {
     for (const auto &e : classes)
         if ((e.kinds & kind) && equalsIgnoreCase(e.ns, ns) && equalsIgnoreCase(e.className, cls))
             return &e;
     return nullptr;
 }
 
-bool HostImpl::nameSpaceKnown(const std::string &ns) const
-{
+bool HostImpl::nameSpaceKnown(const std::string &ns) const {
     for (const auto &e : classes)
         if (equalsIgnoreCase(e.ns, ns))
             return true;
@@ -364,8 +341,7 @@ bool HostImpl::nameSpaceKnown(const std::string &ns) const
     return stores.count(toLower(ns)) != 0;
 }
 
-bool HostImpl::classKnown(const std::string &ns, const std::string &cls) const
-{
+bool HostImpl::classKnown(const std::string &ns, const std::string &cls) const {
     for (const auto &e : classes)
         if (equalsIgnoreCase(e.ns, ns) && isA(e.className, cls))
             return true;
@@ -387,8 +363,7 @@ bool HostImpl::classKnown(const std::string &ns, const std::string &cls) const
     return s && s->hasClass(*this, cls);
 }
 
-Status HostImpl::checkClass(const std::string &ns, const std::string &cls) const
-{
+Status HostImpl::checkClass(const std::string &ns, const std::string &cls) const {
     if (!nameSpaceKnown(ns))
         return Status{CMPI_RC_ERR_INVALID_NAMESPACE, "namespace " + ns + " is not served"};
     if (!classKnown(ns, cls))
@@ -397,8 +372,7 @@ Status HostImpl::checkClass(const std::string &ns, const std::string &cls) const
 }
 
 template <class MI>
-MI *HostImpl::mi(Provider &p, Status &st)
-{
+MI *HostImpl::mi(Provider &p, Status &st) {
     std::lock_guard<std::recursive_mutex> g(miMutex);
     MI *&slot = MIInfo<MI>::slot(p);
     if (slot)
@@ -427,8 +401,8 @@ MI *HostImpl::mi(Provider &p, Status &st)
         return nullptr;
     }
     if (m->ft->miVersion > m->ft->ftVersion || m->ft->miVersion > CMPICurrentVersion) {
-        st = Status{CMPI_RC_ERR_FAILED, sym + ": MI version " + std::to_string(m->ft->miVersion) +
-                                            " is not supported"};
+        st = Status{CMPI_RC_ERR_FAILED,
+                    sym + ": MI version " + std::to_string(m->ft->miVersion) + " is not supported"};
         return nullptr;
     }
     slot = m;
@@ -439,8 +413,7 @@ MI *HostImpl::mi(Provider &p, Status &st)
 
 template <class MI, class F>
 Status HostImpl::callMI(Provider &p, const Req &r, const std::string &ns, std::vector<Value> *items,
-                        F &&f)
-{
+                        F &&f) {
     Status st;
     MI *m = mi<MI>(p, st);
     if (!m)
@@ -466,8 +439,7 @@ Status HostImpl::callMI(Provider &p, const Req &r, const std::string &ns, std::v
 // ---- instance operations ------------------------------------------------
 
 Status HostImpl::enumInstances(const Req &r, const std::string &ns, const std::string &cls,
-                               const PropertyList &props, std::vector<Instance> &out)
-{
+                               const PropertyList &props, std::vector<Instance> &out) {
     Status st = checkClass(ns, cls);
     if (!st.ok())
         return st;
@@ -475,14 +447,13 @@ Status HostImpl::enumInstances(const Req &r, const std::string &ns, const std::s
         if (!(e.kinds & kInstanceMI) || !equalsIgnoreCase(e.ns, ns) || !isA(e.className, cls))
             continue;
         std::vector<Value> items;
-        st = callMI<CMPIInstanceMI>(*e.provider, r, ns, &items,
-                                    [&](CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                        const CMPIResult *res, Arena &a) {
-                                        auto *op = make<PathObj>(a, ObjectPath(ns, e.className));
-                                        CPropertyList pl(props);
-                                        return mi->ft->enumerateInstances(mi, ctx, res, &op->c,
-                                                                          pl.get());
-                                    });
+        st = callMI<CMPIInstanceMI>(
+            *e.provider, r, ns, &items,
+            [&](CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+                auto *op = make<PathObj>(a, ObjectPath(ns, e.className));
+                CPropertyList pl(props);
+                return mi->ft->enumerateInstances(mi, ctx, res, &op->c, pl.get());
+            });
         if (!st.ok())
             return st;
         for (const auto &v : items)
@@ -496,8 +467,7 @@ Status HostImpl::enumInstances(const Req &r, const std::string &ns, const std::s
 }
 
 Status HostImpl::enumNames(const Req &r, const std::string &ns, const std::string &cls,
-                           std::vector<ObjectPath> &out)
-{
+                           std::vector<ObjectPath> &out) {
     Status st = checkClass(ns, cls);
     if (!st.ok())
         return st;
@@ -505,12 +475,12 @@ Status HostImpl::enumNames(const Req &r, const std::string &ns, const std::strin
         if (!(e.kinds & kInstanceMI) || !equalsIgnoreCase(e.ns, ns) || !isA(e.className, cls))
             continue;
         std::vector<Value> items;
-        st = callMI<CMPIInstanceMI>(*e.provider, r, ns, &items,
-                                    [&](CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                        const CMPIResult *res, Arena &a) {
-                                        auto *op = make<PathObj>(a, ObjectPath(ns, e.className));
-                                        return mi->ft->enumerateInstanceNames(mi, ctx, res, &op->c);
-                                    });
+        st = callMI<CMPIInstanceMI>(
+            *e.provider, r, ns, &items,
+            [&](CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+                auto *op = make<PathObj>(a, ObjectPath(ns, e.className));
+                return mi->ft->enumerateInstanceNames(mi, ctx, res, &op->c);
+            });
         if (!st.ok())
             return st;
         for (const auto &v : items)
@@ -524,19 +494,17 @@ Status HostImpl::enumNames(const Req &r, const std::string &ns, const std::strin
 }
 
 Status HostImpl::getInstance(const Req &r, const ObjectPath &p, const PropertyList &props,
-                             Instance &out)
-{
+                             Instance &out) {
     const std::string &ns = p.nameSpace();
     if (const ClassEntry *e = entry(ns, p.className(), kInstanceMI)) {
         std::vector<Value> items;
-        Status st = callMI<CMPIInstanceMI>(*e->provider, r, ns, &items,
-                                           [&](CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                               const CMPIResult *res, Arena &a) {
-                                               auto *op = make<PathObj>(a, p);
-                                               CPropertyList pl(props);
-                                               return mi->ft->getInstance(mi, ctx, res, &op->c,
-                                                                          pl.get());
-                                           });
+        Status st = callMI<CMPIInstanceMI>(
+            *e->provider, r, ns, &items,
+            [&](CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+                auto *op = make<PathObj>(a, p);
+                CPropertyList pl(props);
+                return mi->ft->getInstance(mi, ctx, res, &op->c, pl.get());
+            });
         if (!st.ok())
             return st;
         for (const auto &v : items)
@@ -557,8 +525,7 @@ Status HostImpl::getInstance(const Req &r, const ObjectPath &p, const PropertyLi
 }
 
 Status HostImpl::createInstance(const Req &r, const ObjectPath &p, const Instance &inst,
-                                ObjectPath &out)
-{
+                                ObjectPath &out) {
     const std::string &ns = p.nameSpace();
     Instance full = inst;
     full.setPath(p.keys().empty() && !inst.path().keys().empty()
@@ -566,14 +533,13 @@ Status HostImpl::createInstance(const Req &r, const ObjectPath &p, const Instanc
                      : p);
     if (const ClassEntry *e = entry(ns, p.className(), kInstanceMI)) {
         std::vector<Value> items;
-        Status st = callMI<CMPIInstanceMI>(*e->provider, r, ns, &items,
-                                           [&](CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                               const CMPIResult *res, Arena &a) {
-                                               auto *op = make<PathObj>(a, full.path());
-                                               auto *io = make<InstanceObj>(a, full);
-                                               return mi->ft->createInstance(mi, ctx, res, &op->c,
-                                                                             &io->c);
-                                           });
+        Status st = callMI<CMPIInstanceMI>(
+            *e->provider, r, ns, &items,
+            [&](CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+                auto *op = make<PathObj>(a, full.path());
+                auto *io = make<InstanceObj>(a, full);
+                return mi->ft->createInstance(mi, ctx, res, &op->c, &io->c);
+            });
         if (!st.ok())
             return st;
         out = full.path();
@@ -594,21 +560,19 @@ Status HostImpl::createInstance(const Req &r, const ObjectPath &p, const Instanc
 }
 
 Status HostImpl::modifyInstance(const Req &r, const ObjectPath &p, const Instance &inst,
-                                const PropertyList &props)
-{
+                                const PropertyList &props) {
     const std::string &ns = p.nameSpace();
     if (const ClassEntry *e = entry(ns, p.className(), kInstanceMI)) {
-        return callMI<CMPIInstanceMI>(*e->provider, r, ns, nullptr,
-                                      [&](CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                          const CMPIResult *res, Arena &a) {
-                                          auto *op = make<PathObj>(a, p);
-                                          Instance withPath = inst;
-                                          withPath.setPath(p);
-                                          auto *io = make<InstanceObj>(a, std::move(withPath));
-                                          CPropertyList pl(props);
-                                          return mi->ft->modifyInstance(mi, ctx, res, &op->c,
-                                                                        &io->c, pl.get());
-                                      });
+        return callMI<CMPIInstanceMI>(
+            *e->provider, r, ns, nullptr,
+            [&](CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+                auto *op = make<PathObj>(a, p);
+                Instance withPath = inst;
+                withPath.setPath(p);
+                auto *io = make<InstanceObj>(a, std::move(withPath));
+                CPropertyList pl(props);
+                return mi->ft->modifyInstance(mi, ctx, res, &op->c, &io->c, pl.get());
+            });
     }
     Status st = checkClass(ns, p.className());
     if (!st.ok())
@@ -629,16 +593,15 @@ Status HostImpl::modifyInstance(const Req &r, const ObjectPath &p, const Instanc
     return Status{};
 }
 
-Status HostImpl::deleteInstance(const Req &r, const ObjectPath &p)
-{
+Status HostImpl::deleteInstance(const Req &r, const ObjectPath &p) {
     const std::string &ns = p.nameSpace();
     if (const ClassEntry *e = entry(ns, p.className(), kInstanceMI)) {
-        return callMI<CMPIInstanceMI>(*e->provider, r, ns, nullptr,
-                                      [&](CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                          const CMPIResult *res, Arena &a) {
-                                          auto *op = make<PathObj>(a, p);
-                                          return mi->ft->deleteInstance(mi, ctx, res, &op->c);
-                                      });
+        return callMI<CMPIInstanceMI>(
+            *e->provider, r, ns, nullptr,
+            [&](CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+                auto *op = make<PathObj>(a, p);
+                return mi->ft->deleteInstance(mi, ctx, res, &op->c);
+            });
     }
     Status st = checkClass(ns, p.className());
     if (!st.ok())
@@ -650,8 +613,7 @@ Status HostImpl::deleteInstance(const Req &r, const ObjectPath &p)
 
 // ---- associations ---------------------------------------------------------
 
-Status HostImpl::associations(const Req &r, const AssocQuery &q, std::vector<Value> &out)
-{
+Status HostImpl::associations(const Req &r, const AssocQuery &q, std::vector<Value> &out) {
     const std::string &ns = q.source.nameSpace();
     if (!nameSpaceKnown(ns))
         return Status{CMPI_RC_ERR_INVALID_NAMESPACE, "namespace " + ns + " is not served"};
@@ -677,14 +639,14 @@ Status HostImpl::associations(const Req &r, const AssocQuery &q, std::vector<Val
                 const char *ac = orNull(q.assocClass), *rc = orNull(q.resultClass),
                            *role = orNull(q.role), *rr = orNull(q.resultRole);
                 switch (q.op) {
-                case AssocOp::Associators:
-                    return mi->ft->associators(mi, ctx, res, &op->c, ac, rc, role, rr, pl.get());
-                case AssocOp::AssociatorNames:
-                    return mi->ft->associatorNames(mi, ctx, res, &op->c, ac, rc, role, rr);
-                case AssocOp::References:
-                    return mi->ft->references(mi, ctx, res, &op->c, ac, role, pl.get());
-                default:
-                    return mi->ft->referenceNames(mi, ctx, res, &op->c, ac, role);
+                    case AssocOp::Associators:
+                        return mi->ft->associators(mi, ctx, res, &op->c, ac, rc, role, rr,
+                                                   pl.get());
+                    case AssocOp::AssociatorNames:
+                        return mi->ft->associatorNames(mi, ctx, res, &op->c, ac, rc, role, rr);
+                    case AssocOp::References:
+                        return mi->ft->references(mi, ctx, res, &op->c, ac, role, pl.get());
+                    default: return mi->ft->referenceNames(mi, ctx, res, &op->c, ac, role);
                 }
             });
         if (!st.ok())
@@ -698,8 +660,7 @@ Status HostImpl::associations(const Req &r, const AssocQuery &q, std::vector<Val
 // Association instances kept in the store: any instance with two or more
 // reference properties, one of which names the source.
 Status HostImpl::storeAssociations(const Req &r, const std::string &ns, const AssocQuery &q,
-                                   std::vector<Value> &out)
-{
+                                   std::vector<Value> &out) {
     for (const auto &a : storedInstances(ns)) {
         if (!q.assocClass.empty() && !isA(a.className(), q.assocClass))
             continue;
@@ -747,8 +708,7 @@ Status HostImpl::storeAssociations(const Req &r, const std::string &ns, const As
 // ---- methods --------------------------------------------------------------
 
 Status HostImpl::invokeMethod(const Req &r, const ObjectPath &p, const std::string &method,
-                              const PropertyVector &in, Value &ret, PropertyVector &out)
-{
+                              const PropertyVector &in, Value &ret, PropertyVector &out) {
     const std::string &ns = p.nameSpace();
     const ClassEntry *e = entry(ns, p.className(), kMethodMI);
     if (!e) {
@@ -758,25 +718,24 @@ Status HostImpl::invokeMethod(const Req &r, const ObjectPath &p, const std::stri
         return Status{CMPI_RC_ERR_NOT_SUPPORTED, "no method provider for " + p.className()};
     }
     std::vector<Value> items;
-    Status st = callMI<CMPIMethodMI>(*e->provider, r, ns, &items,
-                                     [&](CMPIMethodMI *mi, const CMPIContext *ctx,
-                                         const CMPIResult *res, Arena &a) {
-                                         auto *op = make<PathObj>(a, p);
-                                         auto *ai = make<ArgsObj>(a, in);
-                                         auto *ao = make<ArgsObj>(a);
-                                         CMPIStatus cs = mi->ft->invokeMethod(
-                                             mi, ctx, res, &op->c, method.c_str(), &ai->c, &ao->c);
-                                         out = ao->args;
-                                         return cs;
-                                     });
+    Status st = callMI<CMPIMethodMI>(
+        *e->provider, r, ns, &items,
+        [&](CMPIMethodMI *mi, const CMPIContext *ctx, const CMPIResult *res, Arena &a) {
+            auto *op = make<PathObj>(a, p);
+            auto *ai = make<ArgsObj>(a, in);
+            auto *ao = make<ArgsObj>(a);
+            CMPIStatus cs =
+                mi->ft->invokeMethod(mi, ctx, res, &op->c, method.c_str(), &ai->c, &ao->c);
+            out = ao->args;
+            return cs;
+        });
     ret = items.empty() ? Value() : items.front();
     return st;
 }
 
 // ---- indications ----------------------------------------------------------
 
-Status HostImpl::subscribe(const std::string &ns, const std::string &cls)
-{
+Status HostImpl::subscribe(const std::string &ns, const std::string &cls) {
     const ClassEntry *e = entry(ns, cls, kIndicationMI);
     if (!e) {
         Status st = checkClass(ns, cls);
@@ -810,8 +769,7 @@ Status HostImpl::subscribe(const std::string &ns, const std::string &cls)
     return st;
 }
 
-Status HostImpl::unsubscribe(const std::string &ns, const std::string &cls)
-{
+Status HostImpl::unsubscribe(const std::string &ns, const std::string &cls) {
     std::lock_guard<std::mutex> g(subMutex);
     auto it = std::find_if(subs.begin(), subs.end(), [&](const Subscription &s) {
         return equalsIgnoreCase(s.ns, ns) && equalsIgnoreCase(s.className, cls);
@@ -845,8 +803,7 @@ Status HostImpl::unsubscribe(const std::string &ns, const std::string &cls)
 namespace {
 
 template <class MI>
-void cleanupOne(HostImpl &h, Provider &p, bool terminating, std::vector<CleanupReport> &out)
-{
+void cleanupOne(HostImpl &h, Provider &p, bool terminating, std::vector<CleanupReport> &out) {
     MI *&slot = MIInfo<MI>::slot(p);
     if (!slot)
         return;
@@ -865,8 +822,7 @@ void cleanupOne(HostImpl &h, Provider &p, bool terminating, std::vector<CleanupR
 
 }  // namespace
 
-std::vector<CleanupReport> HostImpl::cleanup(bool terminating)
-{
+std::vector<CleanupReport> HostImpl::cleanup(bool terminating) {
     std::lock_guard<std::recursive_mutex> g(miMutex);
     std::vector<Provider *> order;
     for (auto &p : providers)
@@ -886,8 +842,7 @@ std::vector<CleanupReport> HostImpl::cleanup(bool terminating)
     return out;
 }
 
-Status HostImpl::load(const std::string &modulePath, const std::string &regFile)
-{
+Status HostImpl::load(const std::string &modulePath, const std::string &regFile) {
     std::vector<Registration> newRegs;
     try {
         newRegs = readRegistrationFile(regFile);
@@ -923,10 +878,9 @@ Status HostImpl::load(const std::string &modulePath, const std::string &regFile)
             for (const auto &e : classes)
                 if (equalsIgnoreCase(e.ns, ns) && equalsIgnoreCase(e.className, reg.className) &&
                     (e.kinds & reg.kinds))
-                    return Status{CMPI_RC_ERR_FAILED, regFile + ": line " +
-                                                          std::to_string(reg.line) + ": " +
-                                                          reg.className + " registered twice in " +
-                                                          ns};
+                    return Status{CMPI_RC_ERR_FAILED,
+                                  regFile + ": line " + std::to_string(reg.line) + ": " +
+                                      reg.className + " registered twice in " + ns};
             classes.push_back(ClassEntry{reg.className, ns, reg.kinds, prov});
         }
         regs.push_back(reg);
@@ -938,8 +892,7 @@ Status HostImpl::load(const std::string &modulePath, const std::string &regFile)
     return st;
 }
 
-Status HostImpl::unload()
-{
+Status HostImpl::unload() {
     if (!isLoaded)
         return Status{};
     std::vector<Subscription> active;
@@ -976,24 +929,23 @@ using detail::AssocOp;
 using detail::AssocQuery;
 
 Host::Host() : Host(HostOptions{}) {}
-Host::Host(HostOptions options)
-    : impl_(std::make_unique<detail::HostImpl>(std::move(options)))
-{
-}
+Host::Host(HostOptions options) : impl_(std::make_unique<detail::HostImpl>(std::move(options))) {}
 Host::~Host() = default;
 
-Status Host::load(const std::string &modulePath, const std::string &registrationFile)
-{
+Status Host::load(const std::string &modulePath, const std::string &registrationFile) {
     return impl_->load(modulePath, registrationFile);
 }
 
-bool Host::loaded() const { return impl_->isLoaded; }
+bool Host::loaded() const {
+    return impl_->isLoaded;
+}
 
-std::vector<Registration> Host::registrations() const { return impl_->regs; }
+std::vector<Registration> Host::registrations() const {
+    return impl_->regs;
+}
 
 Result<Instance> Host::enumerateInstances(const std::string &ns, const std::string &className,
-                                          const PropertyList &props)
-{
+                                          const PropertyList &props) {
     Result<Instance> r;
     static_cast<Status &>(r) =
         impl_->enumInstances(impl_->request(), ns, className, props, r.items);
@@ -1001,43 +953,36 @@ Result<Instance> Host::enumerateInstances(const std::string &ns, const std::stri
 }
 
 Result<ObjectPath> Host::enumerateInstanceNames(const std::string &ns,
-                                                const std::string &className)
-{
+                                                const std::string &className) {
     Result<ObjectPath> r;
     static_cast<Status &>(r) = impl_->enumNames(impl_->request(), ns, className, r.items);
     return r;
 }
 
-InstanceResult Host::getInstance(const ObjectPath &path, const PropertyList &props)
-{
+InstanceResult Host::getInstance(const ObjectPath &path, const PropertyList &props) {
     InstanceResult r;
     static_cast<Status &>(r) = impl_->getInstance(impl_->request(), path, props, r.instance);
     return r;
 }
 
-PathResult Host::createInstance(const Instance &inst)
-{
+PathResult Host::createInstance(const Instance &inst) {
     PathResult r;
-    static_cast<Status &>(r) =
-        impl_->createInstance(impl_->request(), inst.path(), inst, r.path);
+    static_cast<Status &>(r) = impl_->createInstance(impl_->request(), inst.path(), inst, r.path);
     return r;
 }
 
-Status Host::modifyInstance(const Instance &inst, const PropertyList &props)
-{
+Status Host::modifyInstance(const Instance &inst, const PropertyList &props) {
     return impl_->modifyInstance(impl_->request(), inst.path(), inst, props);
 }
 
-Status Host::deleteInstance(const ObjectPath &path)
-{
+Status Host::deleteInstance(const ObjectPath &path) {
     return impl_->deleteInstance(impl_->request(), path);
 }
 
 namespace {
 
 template <class T>
-Result<T> assocResult(detail::HostImpl &h, const AssocQuery &q)
-{
+Result<T> assocResult(detail::HostImpl &h, const AssocQuery &q) {
     Result<T> r;
     std::vector<Value> items;
     static_cast<Status &>(r) = h.associations(h.request(), q, items);
@@ -1057,93 +1002,89 @@ Result<T> assocResult(detail::HostImpl &h, const AssocQuery &q)
 
 Result<Instance> Host::associators(const ObjectPath &path, const std::string &assocClass,
                                    const std::string &resultClass, const std::string &role,
-                                   const std::string &resultRole, const PropertyList &props)
-{
-    return assocResult<Instance>(
-        *impl_, AssocQuery{AssocOp::Associators, path, assocClass, resultClass, role, resultRole,
-                           props});
+                                   const std::string &resultRole, const PropertyList &props) {
+    return assocResult<Instance>(*impl_, AssocQuery{AssocOp::Associators, path, assocClass,
+                                                    resultClass, role, resultRole, props});
 }
 
 Result<ObjectPath> Host::associatorNames(const ObjectPath &path, const std::string &assocClass,
-                                         const std::string &resultClass,
-                                         const std::string &role, const std::string &resultRole)
-{
+                                         const std::string &resultClass, const std::string &role,
+                                         const std::string &resultRole) {
     return assocResult<ObjectPath>(*impl_, AssocQuery{AssocOp::AssociatorNames, path, assocClass,
-                                                      resultClass, role, resultRole,
-                                                      std::nullopt});
+                                                      resultClass, role, resultRole, std::nullopt});
 }
 
 Result<Instance> Host::references(const ObjectPath &path, const std::string &resultClass,
-                                  const std::string &role, const PropertyList &props)
-{
+                                  const std::string &role, const PropertyList &props) {
     return assocResult<Instance>(
         *impl_, AssocQuery{AssocOp::References, path, resultClass, "", role, "", props});
 }
 
 Result<ObjectPath> Host::referenceNames(const ObjectPath &path, const std::string &resultClass,
-                                        const std::string &role)
-{
+                                        const std::string &role) {
     return assocResult<ObjectPath>(
         *impl_, AssocQuery{AssocOp::ReferenceNames, path, resultClass, "", role, "", std::nullopt});
 }
 
 MethodResult Host::invokeMethod(const ObjectPath &path, const std::string &method,
-                                const PropertyVector &in)
-{
+                                const PropertyVector &in) {
     MethodResult r;
     static_cast<Status &>(r) =
         impl_->invokeMethod(impl_->request(), path, method, in, r.returnValue, r.out);
     return r;
 }
 
-Status Host::subscribe(const std::string &ns, const std::string &className)
-{
+Status Host::subscribe(const std::string &ns, const std::string &className) {
     return impl_->subscribe(ns, className);
 }
 
-Status Host::unsubscribe(const std::string &ns, const std::string &className)
-{
+Status Host::unsubscribe(const std::string &ns, const std::string &className) {
     return impl_->unsubscribe(ns, className);
 }
 
-std::vector<Indication> Host::indications() const
-{
+std::vector<Indication> Host::indications() const {
     std::lock_guard<std::mutex> g(impl_->indMutex);
     return impl_->inds;
 }
 
-void Host::clearIndications()
-{
+void Host::clearIndications() {
     std::lock_guard<std::mutex> g(impl_->indMutex);
     impl_->inds.clear();
 }
 
-bool Host::waitForIndications(std::size_t count, std::chrono::milliseconds timeout) const
-{
+bool Host::waitForIndications(std::size_t count, std::chrono::milliseconds timeout) const {
     std::unique_lock<std::mutex> lk(impl_->indMutex);
     return impl_->indCv.wait_for(lk, timeout, [&] { return impl_->inds.size() >= count; });
 }
 
-InstanceStore &Host::store(const std::string &ns) { return impl_->store(ns); }
+InstanceStore &Host::store(const std::string &ns) {
+    return impl_->store(ns);
+}
 
-void Host::addSubclass(const std::string &sub, const std::string &super)
-{
+void Host::addSubclass(const std::string &sub, const std::string &super) {
     std::lock_guard<std::mutex> g(impl_->classMutex);
     impl_->superOf[toLower(sub)] = toLower(super);
 }
 
-std::vector<CleanupReport> Host::cleanup(bool terminating) { return impl_->cleanup(terminating); }
+std::vector<CleanupReport> Host::cleanup(bool terminating) {
+    return impl_->cleanup(terminating);
+}
 
-Status Host::unload() { return impl_->unload(); }
+Status Host::unload() {
+    return impl_->unload();
+}
 
-std::vector<std::string> Host::logMessages() const
-{
+std::vector<std::string> Host::logMessages() const {
     std::lock_guard<std::mutex> g(impl_->logMutex);
     return impl_->logs;
 }
 
-const _CMPIBroker *Host::broker() const { return &impl_->broker; }
+const _CMPIBroker *Host::broker() const {
+    return &impl_->broker;
+}
 
-std::size_t Host::liveObjects() { return detail::Encap::live.load(); }
+std::size_t Host::liveObjects() {
+    return detail::Encap::live.load();
+}
 
 }  // namespace tvrnhost

@@ -117,8 +117,7 @@ public:
 
     Result<Instance> enumerateInstances(const std::string &ns, const std::string &className,
                                         const PropertyList &props = std::nullopt);
-    Result<ObjectPath> enumerateInstanceNames(const std::string &ns,
-                                              const std::string &className);
+    Result<ObjectPath> enumerateInstanceNames(const std::string &ns, const std::string &className);
     InstanceResult getInstance(const ObjectPath &path, const PropertyList &props = std::nullopt);
     // The class, namespace and keys come from inst.path().
     PathResult createInstance(const Instance &inst);
@@ -126,8 +125,7 @@ public:
     Status deleteInstance(const ObjectPath &path);
 
     Result<Instance> associators(const ObjectPath &path, const std::string &assocClass = "",
-                                 const std::string &resultClass = "",
-                                 const std::string &role = "",
+                                 const std::string &resultClass = "", const std::string &role = "",
                                  const std::string &resultRole = "",
                                  const PropertyList &props = std::nullopt);
     Result<ObjectPath> associatorNames(const ObjectPath &path, const std::string &assocClass = "",

@@ -78,8 +78,7 @@ constexpr std::uint32_t kMagic = 0x484e5654;  // "TVNH"
 
 struct Encap : Node {
     explicit Encap(Kind k) : kind(k) { ++live; }
-    ~Encap() override
-    {
+    ~Encap() override {
         magic = 0;
         --live;
     }
@@ -93,8 +92,7 @@ template <class CT, class FT, Kind K>
 struct Obj : Encap {
     using CType = CT;
     static constexpr Kind kKind = K;
-    explicit Obj(FT *ft) : Encap(K)
-    {
+    explicit Obj(FT *ft) : Encap(K) {
         c.hdl = static_cast<Encap *>(this);
         c.ft = ft;
     }
@@ -127,8 +125,7 @@ struct ArrayObj : Obj<CMPIArray, CMPIArrayFT, Kind::Array> {
 
 struct InstanceObj : Obj<CMPIInstance, CMPIInstanceFT, Kind::Instance> {
     explicit InstanceObj(Instance i) : Obj(&gInstanceFT), inst(std::move(i)) {}
-    InstanceObj *clone() const
-    {
+    InstanceObj *clone() const {
         auto *o = new InstanceObj(inst);
         o->filter = filter;
         return o;
@@ -153,8 +150,7 @@ struct ArgsObj : Obj<CMPIArgs, CMPIArgsFT, Kind::Args> {
 
 struct EnumObj : Obj<CMPIEnumeration, CMPIEnumerationFT, Kind::Enumeration> {
     explicit EnumObj(std::vector<Value> v) : Obj(&gEnumerationFT), items(std::move(v)) {}
-    EnumObj *clone() const
-    {
+    EnumObj *clone() const {
         auto *o = new EnumObj(items);
         o->pos = pos;
         return o;
@@ -184,8 +180,8 @@ struct ResultObj : Obj<CMPIResult, CMPIResultFT, Kind::Result> {
 };
 
 struct SelectExpObj : Obj<CMPISelectExp, CMPISelectExpFT, Kind::SelectExp> {
-    SelectExpObj(std::string q, std::string l) : Obj(&gSelectExpFT), query(std::move(q)),
-                                                 lang(std::move(l)) {}
+    SelectExpObj(std::string q, std::string l)
+        : Obj(&gSelectExpFT), query(std::move(q)), lang(std::move(l)) {}
     SelectExpObj *clone() const { return new SelectExpObj(query, lang); }
     std::string query, lang;
 };
@@ -193,8 +189,7 @@ struct SelectExpObj : Obj<CMPISelectExp, CMPISelectExpFT, Kind::SelectExp> {
 // The object behind a handle, or null when the handle is not one of ours of
 // that kind (or was released).
 template <class O>
-O *objectOf(const typename O::CType *c)
-{
+O *objectOf(const typename O::CType *c) {
     if (!c || !c->hdl || c->ft == nullptr)
         return nullptr;
     auto *e = static_cast<Encap *>(c->hdl);
@@ -204,8 +199,7 @@ O *objectOf(const typename O::CType *c)
 }
 
 template <class O, class... A>
-O *make(Arena &a, A &&...args)
-{
+O *make(Arena &a, A &&...args) {
     auto *o = new O(std::forward<A>(args)...);
     a.adopt(o);
     return o;
@@ -238,14 +232,15 @@ private:
 };
 PropertyList propertyList(const char **props);
 
-inline void setRc(CMPIStatus *rc, CMPIrc code)
-{
+inline void setRc(CMPIStatus *rc, CMPIrc code) {
     if (rc) {
         rc->rc = code;
         rc->msg = nullptr;
     }
 }
-inline CMPIStatus status(CMPIrc code) { return CMPIStatus{code, nullptr}; }
+inline CMPIStatus status(CMPIrc code) {
+    return CMPIStatus{code, nullptr};
+}
 
 // ---------------------------------------------------------------------------
 // Per-thread state: the arenas of the requests (and attached threads) in
@@ -321,10 +316,8 @@ public:
                          const PropertyList &props, std::vector<Instance> &out);
     Status enumNames(const Req &r, const std::string &ns, const std::string &cls,
                      std::vector<ObjectPath> &out);
-    Status getInstance(const Req &r, const ObjectPath &p, const PropertyList &props,
-                       Instance &out);
-    Status createInstance(const Req &r, const ObjectPath &p, const Instance &inst,
-                          ObjectPath &out);
+    Status getInstance(const Req &r, const ObjectPath &p, const PropertyList &props, Instance &out);
+    Status createInstance(const Req &r, const ObjectPath &p, const Instance &inst, ObjectPath &out);
     Status modifyInstance(const Req &r, const ObjectPath &p, const Instance &inst,
                           const PropertyList &props);
     Status deleteInstance(const Req &r, const ObjectPath &p);

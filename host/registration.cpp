@@ -10,8 +10,7 @@ namespace tvrnhost {
 
 namespace {
 
-std::string_view trim(std::string_view s)
-{
+std::string_view trim(std::string_view s) {
     while (!s.empty() && std::isspace(static_cast<unsigned char>(s.front())))
         s.remove_prefix(1);
     while (!s.empty() && std::isspace(static_cast<unsigned char>(s.back())))
@@ -19,8 +18,7 @@ std::string_view trim(std::string_view s)
     return s;
 }
 
-std::vector<std::string> words(std::string_view s)
-{
+std::vector<std::string> words(std::string_view s) {
     std::vector<std::string> r;
     std::string cur;
     for (char c : s) {
@@ -50,8 +48,7 @@ const KindName kKindNames[] = {
 
 }  // namespace
 
-std::vector<Registration> parseRegistrations(std::string_view text)
-{
+std::vector<Registration> parseRegistrations(std::string_view text) {
     std::vector<Registration> regs;
     int lineNo = 0;
     auto fail = [&](const std::string &what) -> void {
@@ -131,8 +128,7 @@ std::vector<Registration> parseRegistrations(std::string_view text)
     return regs;
 }
 
-std::vector<Registration> readRegistrationFile(const std::string &path)
-{
+std::vector<Registration> readRegistrationFile(const std::string &path) {
     std::ifstream f(path);
     if (!f)
         throw ParseError(path + ": cannot open");

@@ -31,7 +31,7 @@ struct Registration {
     std::string location;  // library name without "lib" and ".so"
     unsigned kinds = 0;    // MIKind bits
     std::vector<std::string> namespaces;
-    int line = 0;          // of the [Class] header
+    int line = 0;  // of the [Class] header
 };
 
 // Throws ParseError (value.h) naming the line.

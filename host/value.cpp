@@ -1,5 +1,6 @@
 #include "host/value.h"
 
+#include <sys/time.h>
 #include <algorithm>
 #include <cctype>
 #include <charconv>
@@ -9,7 +10,6 @@
 #include <ctime>
 #include <limits>
 #include <ostream>
-#include <sys/time.h>
 
 namespace tvrnhost {
 
@@ -21,50 +21,56 @@ namespace {
 struct TypeInfo {
     Type type;
     const char *name;
-    int bits;         // width of integer types, 0 otherwise
+    int bits;  // width of integer types, 0 otherwise
     bool isSigned;
 };
 
 const TypeInfo kTypes[] = {
-    {Type::Boolean, "boolean", 0, false},  {Type::Uint8, "uint8", 8, false},
-    {Type::Sint8, "sint8", 8, true},       {Type::Uint16, "uint16", 16, false},
-    {Type::Sint16, "sint16", 16, true},    {Type::Uint32, "uint32", 32, false},
-    {Type::Sint32, "sint32", 32, true},    {Type::Uint64, "uint64", 64, false},
-    {Type::Sint64, "sint64", 64, true},    {Type::Real32, "real32", 0, false},
-    {Type::Real64, "real64", 0, false},    {Type::Char16, "char16", 0, false},
-    {Type::String, "string", 0, false},    {Type::DateTime, "datetime", 0, false},
-    {Type::Reference, "ref", 0, false},    {Type::Instance, "instance", 0, false},
+    {Type::Boolean, "boolean", 0, false}, {Type::Uint8, "uint8", 8, false},
+    {Type::Sint8, "sint8", 8, true},      {Type::Uint16, "uint16", 16, false},
+    {Type::Sint16, "sint16", 16, true},   {Type::Uint32, "uint32", 32, false},
+    {Type::Sint32, "sint32", 32, true},   {Type::Uint64, "uint64", 64, false},
+    {Type::Sint64, "sint64", 64, true},   {Type::Real32, "real32", 0, false},
+    {Type::Real64, "real64", 0, false},   {Type::Char16, "char16", 0, false},
+    {Type::String, "string", 0, false},   {Type::DateTime, "datetime", 0, false},
+    {Type::Reference, "ref", 0, false},   {Type::Instance, "instance", 0, false},
 };
 
-const TypeInfo &info(Type t) { return kTypes[static_cast<int>(t)]; }
+const TypeInfo &info(Type t) {
+    return kTypes[static_cast<int>(t)];
+}
 
 }  // namespace
 
-const char *typeName(Type t) { return info(t).name; }
+const char *typeName(Type t) {
+    return info(t).name;
+}
 
-std::optional<Type> typeFromName(std::string_view name)
-{
+std::optional<Type> typeFromName(std::string_view name) {
     for (const auto &ti : kTypes)
         if (equalsIgnoreCase(name, ti.name))
             return ti.type;
     return std::nullopt;
 }
 
-bool isSignedInteger(Type t) { return info(t).bits && info(t).isSigned; }
-bool isUnsignedInteger(Type t) { return info(t).bits && !info(t).isSigned; }
-bool isInteger(Type t) { return info(t).bits != 0; }
+bool isSignedInteger(Type t) {
+    return info(t).bits && info(t).isSigned;
+}
+bool isUnsignedInteger(Type t) {
+    return info(t).bits && !info(t).isSigned;
+}
+bool isInteger(Type t) {
+    return info(t).bits != 0;
+}
 
-bool equalsIgnoreCase(std::string_view a, std::string_view b)
-{
-    return a.size() == b.size() &&
-           std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) {
+bool equalsIgnoreCase(std::string_view a, std::string_view b) {
+    return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) {
                return std::tolower(static_cast<unsigned char>(x)) ==
                       std::tolower(static_cast<unsigned char>(y));
            });
 }
 
-std::string toLower(std::string_view s)
-{
+std::string toLower(std::string_view s) {
     std::string r(s);
     for (auto &c : r)
         c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
@@ -76,8 +82,7 @@ std::string toLower(std::string_view s)
 // ---------------------------------------------------------------------------
 namespace {
 
-bool digitsAt(std::string_view s, size_t pos, size_t n, std::uint64_t &out)
-{
+bool digitsAt(std::string_view s, size_t pos, size_t n, std::uint64_t &out) {
     out = 0;
     for (size_t i = pos; i < pos + n; ++i) {
         if (!std::isdigit(static_cast<unsigned char>(s[i])))
@@ -93,8 +98,7 @@ constexpr std::uint64_t kUsecPerSec = 1000000;
 
 DateTime::DateTime() : text_("00000000000000.000000:000") {}
 
-std::optional<DateTime> DateTime::parse(std::string_view s)
-{
+std::optional<DateTime> DateTime::parse(std::string_view s) {
     if (s.size() != 25 || s[14] != '.')
         return std::nullopt;
     const char sep = s[21];
@@ -121,29 +125,27 @@ std::optional<DateTime> DateTime::parse(std::string_view s)
     return DateTime(std::string(s));
 }
 
-DateTime DateTime::fromBinary(std::uint64_t usec, bool interval)
-{
+DateTime DateTime::fromBinary(std::uint64_t usec, bool interval) {
     char buf[64];
     const unsigned long micro = static_cast<unsigned long>(usec % kUsecPerSec);
     std::uint64_t secs = usec / kUsecPerSec;
     if (interval) {
         const unsigned long s = secs % 60, m = (secs / 60) % 60, h = (secs / 3600) % 24;
         const unsigned long long d = secs / 86400;
-        std::snprintf(buf, sizeof buf, "%08llu%02lu%02lu%02lu.%06lu:000", d % 100000000ULL, h, m,
-                      s, micro);
+        std::snprintf(buf, sizeof buf, "%08llu%02lu%02lu%02lu.%06lu:000", d % 100000000ULL, h, m, s,
+                      micro);
     } else {
         std::time_t t = static_cast<std::time_t>(secs);
         std::tm tm{};
         gmtime_r(&t, &tm);
         std::snprintf(buf, sizeof buf, "%04d%02d%02d%02d%02d%02d.%06lu+000",
-                      (tm.tm_year + 1900) % 10000, tm.tm_mon + 1, tm.tm_mday, tm.tm_hour,
-                      tm.tm_min, tm.tm_sec, micro);
+                      (tm.tm_year + 1900) % 10000, tm.tm_mon + 1, tm.tm_mday, tm.tm_hour, tm.tm_min,
+                      tm.tm_sec, micro);
     }
     return DateTime(buf);
 }
 
-DateTime DateTime::now()
-{
+DateTime DateTime::now() {
     timeval tv{};
     gettimeofday(&tv, nullptr);
     return fromBinary(static_cast<std::uint64_t>(tv.tv_sec) * kUsecPerSec +
@@ -151,8 +153,7 @@ DateTime DateTime::now()
                       false);
 }
 
-std::uint64_t DateTime::toBinary() const
-{
+std::uint64_t DateTime::toBinary() const {
     std::uint64_t micro, a, h, m, s, off;
     digitsAt(text_, 15, 6, micro);
     digitsAt(text_, 8, 2, h);
@@ -185,8 +186,7 @@ std::uint64_t DateTime::toBinary() const
 // ---------------------------------------------------------------------------
 // Value
 // ---------------------------------------------------------------------------
-Value Value::null(Type t, bool array)
-{
+Value Value::null(Type t, bool array) {
     Value v;
     v.type_ = t;
     v.array_ = array;
@@ -194,16 +194,14 @@ Value Value::null(Type t, bool array)
     return v;
 }
 
-Value Value::boolean(bool b)
-{
+Value Value::boolean(bool b) {
     Value v = null(Type::Boolean);
     v.null_ = false;
     v.bits_ = b ? 1 : 0;
     return v;
 }
 
-Value Value::integer(Type t, std::uint64_t bits)
-{
+Value Value::integer(Type t, std::uint64_t bits) {
     const TypeInfo &ti = info(t);
     if (!ti.bits)
         throw std::invalid_argument("not an integer type");
@@ -219,64 +217,56 @@ Value Value::integer(Type t, std::uint64_t bits)
     return v;
 }
 
-Value Value::real32(float f)
-{
+Value Value::real32(float f) {
     Value v = null(Type::Real32);
     v.null_ = false;
     v.real_ = f;
     return v;
 }
 
-Value Value::real64(double d)
-{
+Value Value::real64(double d) {
     Value v = null(Type::Real64);
     v.null_ = false;
     v.real_ = d;
     return v;
 }
 
-Value Value::char16(std::uint16_t c)
-{
+Value Value::char16(std::uint16_t c) {
     Value v = null(Type::Char16);
     v.null_ = false;
     v.bits_ = c;
     return v;
 }
 
-Value Value::string(std::string s)
-{
+Value Value::string(std::string s) {
     Value v = null(Type::String);
     v.null_ = false;
     v.str_ = std::move(s);
     return v;
 }
 
-Value Value::dateTime(DateTime d)
-{
+Value Value::dateTime(DateTime d) {
     Value v = null(Type::DateTime);
     v.null_ = false;
     v.dt_ = std::move(d);
     return v;
 }
 
-Value Value::reference(ObjectPath p)
-{
+Value Value::reference(ObjectPath p) {
     Value v = null(Type::Reference);
     v.null_ = false;
     v.ref_ = std::make_shared<const ObjectPath>(std::move(p));
     return v;
 }
 
-Value Value::instance(Instance i)
-{
+Value Value::instance(Instance i) {
     Value v = null(Type::Instance);
     v.null_ = false;
     v.inst_ = std::make_shared<const Instance>(std::move(i));
     return v;
 }
 
-Value Value::array(Type element, std::vector<Value> elements)
-{
+Value Value::array(Type element, std::vector<Value> elements) {
     for (const auto &e : elements)
         if (e.type_ != element || e.array_)
             throw std::invalid_argument("array element of another type");
@@ -286,20 +276,17 @@ Value Value::array(Type element, std::vector<Value> elements)
     return v;
 }
 
-const ObjectPath &Value::asReference() const
-{
+const ObjectPath &Value::asReference() const {
     static const ObjectPath empty;
     return ref_ ? *ref_ : empty;
 }
 
-const Instance &Value::asInstance() const
-{
+const Instance &Value::asInstance() const {
     static const Instance empty;
     return inst_ ? *inst_ : empty;
 }
 
-bool Value::operator==(const Value &o) const
-{
+bool Value::operator==(const Value &o) const {
     if (type_ != o.type_ || array_ != o.array_ || null_ != o.null_)
         return false;
     if (null_)
@@ -307,38 +294,28 @@ bool Value::operator==(const Value &o) const
     if (array_)
         return elems_ == o.elems_;
     switch (type_) {
-    case Type::Real32:
-        return static_cast<float>(real_) == static_cast<float>(o.real_);
-    case Type::Real64:
-        return real_ == o.real_;
-    case Type::String:
-        return str_ == o.str_;
-    case Type::DateTime:
-        return dt_ == o.dt_;
-    case Type::Reference:
-        return asReference() == o.asReference();
-    case Type::Instance:
-        return asInstance() == o.asInstance();
-    default:
-        return bits_ == o.bits_;
+        case Type::Real32: return static_cast<float>(real_) == static_cast<float>(o.real_);
+        case Type::Real64: return real_ == o.real_;
+        case Type::String: return str_ == o.str_;
+        case Type::DateTime: return dt_ == o.dt_;
+        case Type::Reference: return asReference() == o.asReference();
+        case Type::Instance: return asInstance() == o.asInstance();
+        default: return bits_ == o.bits_;
     }
 }
 
-bool Property::operator==(const Property &o) const
-{
+bool Property::operator==(const Property &o) const {
     return equalsIgnoreCase(name, o.name) && value == o.value;
 }
 
-const Value *findProperty(const PropertyVector &v, std::string_view name)
-{
+const Value *findProperty(const PropertyVector &v, std::string_view name) {
     for (const auto &p : v)
         if (equalsIgnoreCase(p.name, name))
             return &p.value;
     return nullptr;
 }
 
-void setProperty(PropertyVector &v, std::string name, Value value)
-{
+void setProperty(PropertyVector &v, std::string name, Value value) {
     for (auto &p : v)
         if (equalsIgnoreCase(p.name, name)) {
             p.value = std::move(value);
@@ -350,8 +327,7 @@ void setProperty(PropertyVector &v, std::string name, Value value)
 namespace {
 
 // Property sets are equal regardless of order.
-bool sameProperties(const PropertyVector &a, const PropertyVector &b)
-{
+bool sameProperties(const PropertyVector &a, const PropertyVector &b) {
     if (a.size() != b.size())
         return false;
     for (const auto &p : a) {
@@ -362,8 +338,7 @@ bool sameProperties(const PropertyVector &a, const PropertyVector &b)
     return true;
 }
 
-std::vector<const Property *> sortedByName(const PropertyVector &v)
-{
+std::vector<const Property *> sortedByName(const PropertyVector &v) {
     std::vector<const Property *> r;
     for (const auto &p : v)
         r.push_back(&p);
@@ -380,32 +355,30 @@ std::vector<const Property *> sortedByName(const PropertyVector &v)
 // ---------------------------------------------------------------------------
 namespace {
 
-void appendQuoted(std::string &out, std::string_view s)
-{
+void appendQuoted(std::string &out, std::string_view s) {
     out += '"';
     for (char c : s) {
         switch (c) {
-        case '"': out += "\\\""; break;
-        case '\\': out += "\\\\"; break;
-        case '\n': out += "\\n"; break;
-        case '\t': out += "\\t"; break;
-        case '\r': out += "\\r"; break;
-        default:
-            if (static_cast<unsigned char>(c) < 0x20) {
-                char buf[8];
-                std::snprintf(buf, sizeof buf, "\\x%02x", static_cast<unsigned char>(c));
-                out += buf;
-            } else {
-                out += c;
-            }
+            case '"': out += "\\\""; break;
+            case '\\': out += "\\\\"; break;
+            case '\n': out += "\\n"; break;
+            case '\t': out += "\\t"; break;
+            case '\r': out += "\\r"; break;
+            default:
+                if (static_cast<unsigned char>(c) < 0x20) {
+                    char buf[8];
+                    std::snprintf(buf, sizeof buf, "\\x%02x", static_cast<unsigned char>(c));
+                    out += buf;
+                } else {
+                    out += c;
+                }
         }
     }
     out += '"';
 }
 
 template <class F>
-void appendReal(std::string &out, F f)
-{
+void appendReal(std::string &out, F f) {
     if (std::isnan(f)) {
         out += "NaN";
         return;
@@ -424,39 +397,38 @@ void appendReal(std::string &out, F f)
 
 void appendInstanceBody(std::string &out, const Instance &inst, int indent);
 
-void appendScalar(std::string &out, const Value &v, int indent)
-{
+void appendScalar(std::string &out, const Value &v, int indent) {
     switch (v.type()) {
-    case Type::Boolean: out += v.asBool() ? "TRUE" : "FALSE"; break;
-    case Type::Real32: appendReal(out, static_cast<float>(v.asReal())); break;
-    case Type::Real64: appendReal(out, v.asReal()); break;
-    case Type::Char16: {
-        const std::uint16_t c = v.asChar16();
-        if (c >= 0x20 && c < 0x7f && c != '\'' && c != '\\') {
-            out += '\'';
-            out += static_cast<char>(c);
-            out += '\'';
-        } else {
-            char buf[16];
-            std::snprintf(buf, sizeof buf, "'\\u%04x'", c);
-            out += buf;
+        case Type::Boolean: out += v.asBool() ? "TRUE" : "FALSE"; break;
+        case Type::Real32: appendReal(out, static_cast<float>(v.asReal())); break;
+        case Type::Real64: appendReal(out, v.asReal()); break;
+        case Type::Char16: {
+            const std::uint16_t c = v.asChar16();
+            if (c >= 0x20 && c < 0x7f && c != '\'' && c != '\\') {
+                out += '\'';
+                out += static_cast<char>(c);
+                out += '\'';
+            } else {
+                char buf[16];
+                std::snprintf(buf, sizeof buf, "'\\u%04x'", c);
+                out += buf;
+            }
+            break;
         }
-        break;
-    }
-    case Type::String: appendQuoted(out, v.asString()); break;
-    case Type::DateTime: appendQuoted(out, v.asDateTime().text()); break;
-    case Type::Reference: appendQuoted(out, v.asReference().toString()); break;
-    case Type::Instance:
-        out += "instance ";
-        appendInstanceBody(out, v.asInstance(), indent);
-        break;
-    default:
-        out += isSignedInteger(v.type()) ? std::to_string(v.asSint()) : std::to_string(v.asUint());
+        case Type::String: appendQuoted(out, v.asString()); break;
+        case Type::DateTime: appendQuoted(out, v.asDateTime().text()); break;
+        case Type::Reference: appendQuoted(out, v.asReference().toString()); break;
+        case Type::Instance:
+            out += "instance ";
+            appendInstanceBody(out, v.asInstance(), indent);
+            break;
+        default:
+            out +=
+                isSignedInteger(v.type()) ? std::to_string(v.asSint()) : std::to_string(v.asUint());
     }
 }
 
-void appendValue(std::string &out, const Value &v, int indent)
-{
+void appendValue(std::string &out, const Value &v, int indent) {
     if (v.isNull()) {
         out += "NULL";
         return;
@@ -476,8 +448,7 @@ void appendValue(std::string &out, const Value &v, int indent)
     out += '}';
 }
 
-void appendDeclarations(std::string &out, const PropertyVector &props, int indent)
-{
+void appendDeclarations(std::string &out, const PropertyVector &props, int indent) {
     const std::string pad(static_cast<size_t>(indent), ' ');
     for (const Property *p : sortedByName(props)) {
         out += pad;
@@ -493,8 +464,7 @@ void appendDeclarations(std::string &out, const PropertyVector &props, int inden
 }
 
 // "<path> {\n<declarations>}" with the closing brace at `indent - 4`.
-void appendInstanceBody(std::string &out, const Instance &inst, int indent)
-{
+void appendInstanceBody(std::string &out, const Instance &inst, int indent) {
     out += inst.path().toString();
     out += " {\n";
     appendDeclarations(out, inst.properties(), indent + 4);
@@ -504,8 +474,7 @@ void appendInstanceBody(std::string &out, const Instance &inst, int indent)
 
 }  // namespace
 
-std::string Value::toString() const
-{
+std::string Value::toString() const {
     std::string s;
     appendValue(s, *this, 0);
     return s;
@@ -514,14 +483,12 @@ std::string Value::toString() const
 // ---------------------------------------------------------------------------
 // ObjectPath
 // ---------------------------------------------------------------------------
-ObjectPath &ObjectPath::addKey(std::string name, Value v)
-{
+ObjectPath &ObjectPath::addKey(std::string name, Value v) {
     setProperty(keys_, std::move(name), std::move(v));
     return *this;
 }
 
-std::string ObjectPath::toString() const
-{
+std::string ObjectPath::toString() const {
     std::string s;
     if (!host_.empty()) {
         s += "//";
@@ -544,16 +511,14 @@ std::string ObjectPath::toString() const
     return s;
 }
 
-bool ObjectPath::operator==(const ObjectPath &o) const
-{
+bool ObjectPath::operator==(const ObjectPath &o) const {
     return equalsIgnoreCase(host_, o.host_) && equalsIgnoreCase(ns_, o.ns_) &&
            equalsIgnoreCase(class_, o.class_) && sameProperties(keys_, o.keys_);
 }
 
 namespace {
 
-bool sameKeyValue(const Value &a, const Value &b)
-{
+bool sameKeyValue(const Value &a, const Value &b) {
     if (a.isNull() || b.isNull() || a.isArray() || b.isArray())
         return a == b;
     if (isInteger(a.type()) && isInteger(b.type())) {
@@ -568,8 +533,7 @@ bool sameKeyValue(const Value &a, const Value &b)
 
 }  // namespace
 
-bool ObjectPath::identifies(const ObjectPath &o) const
-{
+bool ObjectPath::identifies(const ObjectPath &o) const {
     if (!equalsIgnoreCase(class_, o.class_))
         return false;
     if (!ns_.empty() && !o.ns_.empty() && !equalsIgnoreCase(ns_, o.ns_))
@@ -587,20 +551,17 @@ bool ObjectPath::identifies(const ObjectPath &o) const
 // ---------------------------------------------------------------------------
 // Instance
 // ---------------------------------------------------------------------------
-Instance &Instance::set(std::string name, Value v)
-{
+Instance &Instance::set(std::string name, Value v) {
     setProperty(props_, std::move(name), std::move(v));
     return *this;
 }
 
-Instance &Instance::setKey(std::string name, Value v)
-{
+Instance &Instance::setKey(std::string name, Value v) {
     path_.addKey(name, v);
     return set(std::move(name), std::move(v));
 }
 
-bool Instance::remove(std::string_view name)
-{
+bool Instance::remove(std::string_view name) {
     auto it = std::find_if(props_.begin(), props_.end(),
                            [&](const Property &p) { return equalsIgnoreCase(p.name, name); });
     if (it == props_.end())
@@ -609,44 +570,50 @@ bool Instance::remove(std::string_view name)
     return true;
 }
 
-std::string Instance::toString() const
-{
+std::string Instance::toString() const {
     std::string s = "instance ";
     appendInstanceBody(s, *this, 0);
     s += '\n';
     return s;
 }
 
-bool Instance::operator==(const Instance &o) const
-{
+bool Instance::operator==(const Instance &o) const {
     return path_ == o.path_ && sameProperties(props_, o.props_);
 }
 
-std::string declarations(const PropertyVector &props, int indent)
-{
+std::string declarations(const PropertyVector &props, int indent) {
     std::string s;
     appendDeclarations(s, props, indent);
     return s;
 }
 
-std::ostream &operator<<(std::ostream &os, const Value &v) { return os << v.toString(); }
-std::ostream &operator<<(std::ostream &os, const ObjectPath &p) { return os << p.toString(); }
-std::ostream &operator<<(std::ostream &os, const Instance &i) { return os << i.toString(); }
+std::ostream &operator<<(std::ostream &os, const Value &v) {
+    return os << v.toString();
+}
+std::ostream &operator<<(std::ostream &os, const ObjectPath &p) {
+    return os << p.toString();
+}
+std::ostream &operator<<(std::ostream &os, const Instance &i) {
+    return os << i.toString();
+}
 
 // ---------------------------------------------------------------------------
 // Parsing
 // ---------------------------------------------------------------------------
 namespace {
 
-bool isIdentStart(char c) { return std::isalpha(static_cast<unsigned char>(c)) || c == '_'; }
-bool isIdentChar(char c) { return std::isalnum(static_cast<unsigned char>(c)) || c == '_'; }
+bool isIdentStart(char c) {
+    return std::isalpha(static_cast<unsigned char>(c)) || c == '_';
+}
+bool isIdentChar(char c) {
+    return std::isalnum(static_cast<unsigned char>(c)) || c == '_';
+}
 
 class Parser {
 public:
     explicit Parser(std::string_view s) : s_(s) {}
 
-    [[noreturn]] void fail(const std::string &what) const
-    {
+    [[noreturn]] void fail(const std::string &what) const {
         size_t line = 1;
         for (size_t i = 0; i < pos_ && i < s_.size(); ++i)
             line += s_[i] == '\n';
@@ -656,8 +623,7 @@ public:
     bool atEnd() const { return pos_ >= s_.size(); }
     char peek() const { return atEnd() ? '\0' : s_[pos_]; }
 
-    void skipSpace(bool comments = false)
-    {
+    void skipSpace(bool comments = false) {
         for (;;) {
             while (!atEnd() && std::isspace(static_cast<unsigned char>(s_[pos_])))
                 ++pos_;
@@ -670,16 +636,14 @@ public:
         }
     }
 
-    void expect(char c)
-    {
+    void expect(char c) {
         skipSpace();
         if (peek() != c)
             fail(std::string("expected '") + c + "'");
         ++pos_;
     }
 
-    bool accept(char c)
-    {
+    bool accept(char c) {
         skipSpace();
         if (peek() != c)
             return false;
@@ -687,8 +651,7 @@ public:
         return true;
     }
 
-    std::string identifier()
-    {
+    std::string identifier() {
         skipSpace();
         if (!isIdentStart(peek()))
             fail("expected a name");
@@ -699,8 +662,7 @@ public:
     }
 
     // True and consumed when the next word is `w` (case-insensitive).
-    bool acceptWord(std::string_view w)
-    {
+    bool acceptWord(std::string_view w) {
         skipSpace();
         if (s_.size() - pos_ < w.size() || !equalsIgnoreCase(s_.substr(pos_, w.size()), w))
             return false;
@@ -710,8 +672,7 @@ public:
         return true;
     }
 
-    std::string quoted(char q = '"')
-    {
+    std::string quoted(char q = '"') {
         skipSpace();
         if (peek() != q)
             fail(std::string("expected ") + q);
@@ -731,40 +692,39 @@ public:
                 fail("unterminated escape");
             c = s_[pos_++];
             switch (c) {
-            case 'n': r += '\n'; break;
-            case 't': r += '\t'; break;
-            case 'r': r += '\r'; break;
-            case 'x':
-            case 'u': {
-                const size_t n = c == 'x' ? 2 : 4;
-                if (s_.size() - pos_ < n)
-                    fail("bad escape");
-                unsigned v = 0;
-                auto res = std::from_chars(s_.data() + pos_, s_.data() + pos_ + n, v, 16);
-                if (res.ptr != s_.data() + pos_ + n)
-                    fail("bad escape");
-                pos_ += n;
-                if (c == 'x' || v < 0x80) {
-                    r += static_cast<char>(v);
-                } else {  // UTF-8
-                    if (v < 0x800) {
-                        r += static_cast<char>(0xC0 | (v >> 6));
-                    } else {
-                        r += static_cast<char>(0xE0 | (v >> 12));
-                        r += static_cast<char>(0x80 | ((v >> 6) & 0x3F));
+                case 'n': r += '\n'; break;
+                case 't': r += '\t'; break;
+                case 'r': r += '\r'; break;
+                case 'x':
+                case 'u': {
+                    const size_t n = c == 'x' ? 2 : 4;
+                    if (s_.size() - pos_ < n)
+                        fail("bad escape");
+                    unsigned v = 0;
+                    auto res = std::from_chars(s_.data() + pos_, s_.data() + pos_ + n, v, 16);
+                    if (res.ptr != s_.data() + pos_ + n)
+                        fail("bad escape");
+                    pos_ += n;
+                    if (c == 'x' || v < 0x80) {
+                        r += static_cast<char>(v);
+                    } else {  // UTF-8
+                        if (v < 0x800) {
+                            r += static_cast<char>(0xC0 | (v >> 6));
+                        } else {
+                            r += static_cast<char>(0xE0 | (v >> 12));
+                            r += static_cast<char>(0x80 | ((v >> 6) & 0x3F));
+                        }
+                        r += static_cast<char>(0x80 | (v & 0x3F));
                     }
-                    r += static_cast<char>(0x80 | (v & 0x3F));
+                    break;
                 }
-                break;
-            }
-            default: r += c;
+                default: r += c;
             }
         }
     }
 
     // A run of characters that can make up a number or a bare word.
-    std::string token(std::string_view stops)
-    {
+    std::string token(std::string_view stops) {
         skipSpace();
         const size_t b = pos_;
         while (!atEnd() && stops.find(s_[pos_]) == std::string_view::npos &&
@@ -776,8 +736,7 @@ public:
     }
 
     // Raw text up to (not including) `stop` outside double quotes.
-    std::string rawUntil(char stop)
-    {
+    std::string rawUntil(char stop) {
         skipSpace();
         const size_t b = pos_;
         bool inQuote = false;
@@ -801,8 +760,7 @@ public:
         return r;
     }
 
-    std::string rest()
-    {
+    std::string rest() {
         skipSpace();
         std::string r(s_.substr(pos_));
         pos_ = s_.size();
@@ -829,8 +787,7 @@ private:
 
 const char kValueStops[] = ",;}{";
 
-bool parseUnsigned(std::string_view tok, std::uint64_t &out)
-{
+bool parseUnsigned(std::string_view tok, std::uint64_t &out) {
     int base = 10;
     if (tok.size() > 2 && tok[0] == '0' && (tok[1] == 'x' || tok[1] == 'X')) {
         base = 16;
@@ -842,16 +799,14 @@ bool parseUnsigned(std::string_view tok, std::uint64_t &out)
     return r.ec == std::errc() && r.ptr == tok.data() + tok.size();
 }
 
-bool looksInteger(std::string_view tok)
-{
+bool looksInteger(std::string_view tok) {
     if (!tok.empty() && (tok[0] == '-' || tok[0] == '+'))
         tok.remove_prefix(1);
     std::uint64_t v;
     return parseUnsigned(tok, v);
 }
 
-bool looksReal(std::string_view tok)
-{
+bool looksReal(std::string_view tok) {
     if (tok == "NaN" || tok == "INF" || tok == "-INF")
         return true;
     if (tok.find_first_of(".eE") == std::string_view::npos)
@@ -862,8 +817,7 @@ bool looksReal(std::string_view tok)
     return end && *end == '\0' && !t.empty();
 }
 
-Value Parser::integerFrom(const std::string &tok, Type t)
-{
+Value Parser::integerFrom(const std::string &tok, Type t) {
     std::string_view v = tok;
     bool neg = false;
     if (!v.empty() && (v[0] == '-' || v[0] == '+')) {
@@ -875,8 +829,8 @@ Value Parser::integerFrom(const std::string &tok, Type t)
         fail("not an integer: " + tok);
     const TypeInfo &ti = info(t);
     if (ti.isSigned) {
-        const std::uint64_t max = ti.bits == 64 ? std::uint64_t(INT64_MAX)
-                                                : (std::uint64_t(1) << (ti.bits - 1)) - 1;
+        const std::uint64_t max =
+            ti.bits == 64 ? std::uint64_t(INT64_MAX) : (std::uint64_t(1) << (ti.bits - 1)) - 1;
         if (mag > max + (neg ? 1 : 0))
             fail("out of range for " + std::string(ti.name) + ": " + tok);
         return Value::integer(t, neg ? (~mag + 1) : mag);
@@ -887,8 +841,7 @@ Value Parser::integerFrom(const std::string &tok, Type t)
     return Value::integer(t, mag);
 }
 
-Value Parser::realFrom(const std::string &tok, Type t)
-{
+Value Parser::realFrom(const std::string &tok, Type t) {
     double d;
     if (tok == "NaN")
         d = std::numeric_limits<double>::quiet_NaN();
@@ -905,62 +858,58 @@ Value Parser::realFrom(const std::string &tok, Type t)
     return t == Type::Real32 ? Value::real32(static_cast<float>(d)) : Value::real64(d);
 }
 
-Value Parser::typedScalar(Type t)
-{
+Value Parser::typedScalar(Type t) {
     skipSpace();
     if (acceptWord("NULL"))
         return Value::null(t);
     switch (t) {
-    case Type::Boolean:
-        if (acceptWord("TRUE"))
-            return Value::boolean(true);
-        if (acceptWord("FALSE"))
-            return Value::boolean(false);
-        fail("expected TRUE or FALSE");
-    case Type::Real32:
-    case Type::Real64:
-        return realFrom(token(kValueStops), t);
-    case Type::Char16: {
-        const std::string s = quoted('\'');
-        // Decode one UTF-8 character.
-        const auto *u = reinterpret_cast<const unsigned char *>(s.data());
-        if (s.size() == 1 && u[0] < 0x80)
-            return Value::char16(u[0]);
-        if (s.size() == 2 && (u[0] & 0xE0) == 0xC0)
-            return Value::char16(static_cast<std::uint16_t>(((u[0] & 0x1F) << 6) | (u[1] & 0x3F)));
-        if (s.size() == 3 && (u[0] & 0xF0) == 0xE0)
-            return Value::char16(static_cast<std::uint16_t>(((u[0] & 0x0F) << 12) |
-                                                            ((u[1] & 0x3F) << 6) | (u[2] & 0x3F)));
-        fail("expected one character");
-    }
-    case Type::String:
-        return Value::string(quoted());
-    case Type::DateTime: {
-        const std::string s = quoted();
-        auto dt = DateTime::parse(s);
-        if (!dt)
-            fail("not a date-time: " + s);
-        return Value::dateTime(*dt);
-    }
-    case Type::Reference: {
-        const std::string s = quoted();
-        try {
-            return Value::reference(ObjectPath::parse(s));
-        } catch (const ParseError &e) {
-            fail(std::string("bad reference: ") + e.what());
+        case Type::Boolean:
+            if (acceptWord("TRUE"))
+                return Value::boolean(true);
+            if (acceptWord("FALSE"))
+                return Value::boolean(false);
+            fail("expected TRUE or FALSE");
+        case Type::Real32:
+        case Type::Real64: return realFrom(token(kValueStops), t);
+        case Type::Char16: {
+            const std::string s = quoted('\'');
+            // Decode one UTF-8 character.
+            const auto *u = reinterpret_cast<const unsigned char *>(s.data());
+            if (s.size() == 1 && u[0] < 0x80)
+                return Value::char16(u[0]);
+            if (s.size() == 2 && (u[0] & 0xE0) == 0xC0)
+                return Value::char16(
+                    static_cast<std::uint16_t>(((u[0] & 0x1F) << 6) | (u[1] & 0x3F)));
+            if (s.size() == 3 && (u[0] & 0xF0) == 0xE0)
+                return Value::char16(static_cast<std::uint16_t>(
+                    ((u[0] & 0x0F) << 12) | ((u[1] & 0x3F) << 6) | (u[2] & 0x3F)));
+            fail("expected one character");
         }
-    }
-    case Type::Instance:
-        if (!acceptWord("instance"))
-            fail("expected an embedded instance");
-        return Value::instance(instanceBody());
-    default:
-        return integerFrom(token(kValueStops), t);
+        case Type::String: return Value::string(quoted());
+        case Type::DateTime: {
+            const std::string s = quoted();
+            auto dt = DateTime::parse(s);
+            if (!dt)
+                fail("not a date-time: " + s);
+            return Value::dateTime(*dt);
+        }
+        case Type::Reference: {
+            const std::string s = quoted();
+            try {
+                return Value::reference(ObjectPath::parse(s));
+            } catch (const ParseError &e) {
+                fail(std::string("bad reference: ") + e.what());
+            }
+        }
+        case Type::Instance:
+            if (!acceptWord("instance"))
+                fail("expected an embedded instance");
+            return Value::instance(instanceBody());
+        default: return integerFrom(token(kValueStops), t);
     }
 }
 
-Value Parser::typedValue(Type t, bool array)
-{
+Value Parser::typedValue(Type t, bool array) {
     if (!array)
         return typedScalar(t);
     if (acceptWord("NULL"))
@@ -976,8 +925,7 @@ Value Parser::typedValue(Type t, bool array)
     return Value::array(t, std::move(elems));
 }
 
-Value Parser::guessedValue(bool topLevel)
-{
+Value Parser::guessedValue(bool topLevel) {
     skipSpace();
     // Explicit "type:" or "type[]:" prefix.
     {
@@ -1050,8 +998,7 @@ Value Parser::guessedValue(bool topLevel)
     return Value::string(tok);
 }
 
-Instance Parser::instanceBody()
-{
+Instance Parser::instanceBody() {
     const std::string pathText = rawUntil('{');
     Instance inst;
     try {
@@ -1086,8 +1033,7 @@ Instance Parser::instanceBody()
 
 }  // namespace
 
-ObjectPath ObjectPath::parse(std::string_view text)
-{
+ObjectPath ObjectPath::parse(std::string_view text) {
     while (!text.empty() && std::isspace(static_cast<unsigned char>(text.front())))
         text.remove_prefix(1);
     while (!text.empty() && std::isspace(static_cast<unsigned char>(text.back())))
@@ -1150,8 +1096,7 @@ ObjectPath ObjectPath::parse(std::string_view text)
     return p;
 }
 
-std::vector<Instance> parseInstances(std::string_view text)
-{
+std::vector<Instance> parseInstances(std::string_view text) {
     Parser ps(text);
     std::vector<Instance> r;
     for (;;) {
@@ -1165,8 +1110,7 @@ std::vector<Instance> parseInstances(std::string_view text)
     }
 }
 
-Value parseValue(std::string_view text, std::optional<Type> type, bool array)
-{
+Value parseValue(std::string_view text, std::optional<Type> type, bool array) {
     Parser ps(text);
     Value v = type ? ps.typedValue(*type, array) : ps.guessedValue(true);
     ps.skipSpace();

@@ -163,18 +163,25 @@ class ObjectPath {
 public:
     ObjectPath() = default;
     ObjectPath(std::string nameSpace, std::string className)
-        : ns_(std::move(nameSpace)), class_(std::move(className))
-    {
-    }
+        : ns_(std::move(nameSpace)), class_(std::move(className)) {}
     // Throws ParseError.
     static ObjectPath parse(std::string_view text);
 
     const std::string &host() const { return host_; }
     const std::string &nameSpace() const { return ns_; }
     const std::string &className() const { return class_; }
-    ObjectPath &setHost(std::string h) { host_ = std::move(h); return *this; }
-    ObjectPath &setNameSpace(std::string n) { ns_ = std::move(n); return *this; }
-    ObjectPath &setClassName(std::string c) { class_ = std::move(c); return *this; }
+    ObjectPath &setHost(std::string h) {
+        host_ = std::move(h);
+        return *this;
+    }
+    ObjectPath &setNameSpace(std::string n) {
+        ns_ = std::move(n);
+        return *this;
+    }
+    ObjectPath &setClassName(std::string c) {
+        class_ = std::move(c);
+        return *this;
+    }
 
     ObjectPath &addKey(std::string name, Value v);  // replaces a key of that name
     const Value *key(std::string_view name) const { return findProperty(keys_, name); }
@@ -202,9 +209,7 @@ public:
     Instance() = default;
     explicit Instance(ObjectPath path) : path_(std::move(path)) {}
     Instance(std::string nameSpace, std::string className)
-        : path_(std::move(nameSpace), std::move(className))
-    {
-    }
+        : path_(std::move(nameSpace), std::move(className)) {}
 
     const std::string &className() const { return path_.className(); }
     const ObjectPath &path() const { return path_; }

@@ -18,12 +18,16 @@ const char kVendorCode[] = "TVRN";
 const uint32 kInService = 11;
 const uint32 kStopped = 10;
 
-const char* productText(const _adapterData& a) { return a.isCNA ? "Tavrin CNA" : "Tavrin FC HBA"; }
+const char* productText(const _adapterData& a) {
+    return a.isCNA ? "Tavrin CNA" : "Tavrin FC HBA";
+}
 const char* adapterKind(const _adapterData& a) {
     return a.isCNA ? "Ethernet Adapter" : "Fiber Channel Adapter";
 }
 // The adapter's colon-free address: its MAC for a CNA, else its WWN.
-const String& adapterAddress(const _adapterData& a) { return a.isCNA ? a.adapterMac : a.adapterWwn; }
+const String& adapterAddress(const _adapterData& a) {
+    return a.isCNA ? a.adapterMac : a.adapterWwn;
+}
 
 // "TVRN <kind>", then " <serial>" when there is one.
 String adapterTitle(const _adapterData& a) {
@@ -45,7 +49,8 @@ void fillCommonFields(AdapterHelper* helper, const Json::Value& hba, const Json:
     record.serialNumber = jsonString(hba, "serialNumber");
     helper->fillVPDInfo(hba, &record);
     record.vendorCode = kVendorCode;
-    record.firmwareVersion = trimmedText(jsonString(firmware, "version"), _adapterData::VERSION_WIDTH);
+    record.firmwareVersion =
+        trimmedText(jsonString(firmware, "version"), _adapterData::VERSION_WIDTH);
     record.model = jsonString(hba, "model");
 }
 
@@ -142,38 +147,32 @@ void AdapterHelper::walk(classId_t classId, InstanceList& out) {
         }
 
         switch (classId) {
-        case CID_PORT_CONTROLLER:
-            record.adapterStatus = jsonBool(hba, "hbaStatus") ? kInService : kStopped;
-            out.add(getPortControllerInstance(record));
-            break;
-        case CID_PHYSICAL_PACKAGE:
-            out.add(getPhysicalPackageInstance(record));
-            break;
-        case CID_PRODUCT:
-            out.add(getProductInstance(record));
-            break;
-        case CID_ADAPTER_SOFTWARE_IDENTITY: {
-            if (!networkDriverReported && record.networkDriverName.size() > 0) {
-                out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, true));
-                networkDriverReported = true;
+            case CID_PORT_CONTROLLER:
+                record.adapterStatus = jsonBool(hba, "hbaStatus") ? kInService : kStopped;
+                out.add(getPortControllerInstance(record));
+                break;
+            case CID_PHYSICAL_PACKAGE: out.add(getPhysicalPackageInstance(record)); break;
+            case CID_PRODUCT: out.add(getProductInstance(record)); break;
+            case CID_ADAPTER_SOFTWARE_IDENTITY: {
+                if (!networkDriverReported && record.networkDriverName.size() > 0) {
+                    out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, true));
+                    networkDriverReported = true;
+                }
+                if (!storageDriverReported && record.storageDriverName.size() > 0) {
+                    out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, false));
+                    storageDriverReported = true;
+                }
+                record.biosVersion =
+                    trimmedText(jsonString(firmware, "biosVersion"), _adapterData::VERSION_WIDTH);
+                if (!ProviderUtil::valid_UTF_string(record.biosVersion.c_str()))
+                    record.biosVersion.clear();
+                Json::Value flash = libGetFlashInfo(keyRequest("indexStr", key));
+                if (ProviderUtil::isValidJsonResponse(flash) && jsonBool(flash, "flashStatus"))
+                    out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_BIOS, false));
+                out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_FIRMWARE, false));
+                break;
             }
-            if (!storageDriverReported && record.storageDriverName.size() > 0) {
-                out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, false));
-                storageDriverReported = true;
-            }
-            record.biosVersion = trimmedText(jsonString(firmware, "biosVersion"),
-                                             _adapterData::VERSION_WIDTH);
-            if (!ProviderUtil::valid_UTF_string(record.biosVersion.c_str()))
-                record.biosVersion.clear();
-            Json::Value flash = libGetFlashInfo(keyRequest("indexStr", key));
-            if (ProviderUtil::isValidJsonResponse(flash) && jsonBool(flash, "flashStatus"))
-                out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_BIOS, false));
-            out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_FIRMWARE, false));
-            break;
-        }
-        default:
-            TVRN_LOG(LL_INFO, "Default case . Other classes ");
-            break;
+            default: TVRN_LOG(LL_INFO, "Default case . Other classes "); break;
         }
     });
     TVRN_LOG(LL_INFO, "Number of instances: %d", int(out.size()));
@@ -218,8 +217,8 @@ Instance* AdapterHelper::getPortControllerInstance(const _adapterData& a) {
     pc->Name.set(a.serialNumber);
     pc->ElementName.set(a.serialNumber);
     pc->OperationalStatus.set(arrayOf<uint16>({uint16(a.adapterStatus)}));
-    pc->StatusDescriptions.set(stringsOf(
-        {stopped ? "The adapter is disabled" : "The adapter is in service"}));
+    pc->StatusDescriptions.set(
+        stringsOf({stopped ? "The adapter is disabled" : "The adapter is in service"}));
     pc->EnabledState.set(stopped ? 3 : 2);
     pc->Caption.set(String(productText(a)));
     pc->Description.set(String(productText(a)));

@@ -40,8 +40,9 @@ Array<Instance*> CommonHelper::getComputerSystemInstances(classId_t classId) {
         cs->IdentifyingDescriptions.set(
             stringsOf({address ? "Ipv4 Address" : "Fully Qualified Domain Name"}));
         if (kind == kHostIsLocalhost)
-            TVRN_LOG(LL_WARN, "No host IP / Name  retrived in the function, So function fills "
-                              "localhost for host info.");
+            TVRN_LOG(LL_WARN,
+                     "No host IP / Name  retrived in the function, So function fills "
+                     "localhost for host info.");
         cs->CreationClassName.set(ProviderUtil::getClassName(classId));
         const String text("The host with Tavrin's adapters installed.");
         cs->ElementName.set(text);

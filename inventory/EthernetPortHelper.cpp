@@ -28,13 +28,13 @@ const TransceiverType kTransceiverTypes[] = {
 // CIM HealthState of a port's CIM operational status.
 uint16 healthStateOf(uint32 portState) {
     switch (portState) {
-    case 8:
-    case 11: return 5;
-    case 9:
-    case 10:
-    case 13: return 10;
-    case 6: return 15;
-    default: return 0;
+        case 8:
+        case 11: return 5;
+        case 9:
+        case 10:
+        case 13: return 10;
+        case 6: return 15;
+        default: return 0;
     }
 }
 
@@ -90,7 +90,8 @@ void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId
     Json::Value ports;
     guardedCall(LibCall("libGetEthPhyPortIndicesByAdapter", adapterKey),
                 libGetEthPhyPortIndicesByAdapter, keyRequest("indexStr", adapterKey), ports);
-    if (!ProviderUtil::isValidJsonResponse(ports) || !jsonHas(ports, "indexStrings", Json::arrayValue)) {
+    if (!ProviderUtil::isValidJsonResponse(ports) ||
+        !jsonHas(ports, "indexStrings", Json::arrayValue)) {
         TVRN_LOG(LL_ERR, "libGetEthPhyPortIndicesByAdapter returns NULL.");
         return;
     }
@@ -113,24 +114,20 @@ void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId
         record.mtu = jsonUInt(eth, "mtu");
 
         switch (classId) {
-        case CID_ETHERNET_PORT: {
-            Json::Value sfp;
-            guardedCall(LibCall("libGetOpticsSFP", portKey), libGetOpticsSFP,
-                        keyRequest("indexStr", portKey), sfp);
-            if (!ProviderUtil::isValidJsonResponse(sfp) ||
-                !jsonHas(sfp, "transceiver", Json::stringValue))
-                TVRN_LOG(LL_ERR, "Unable to get SFP info for %s", portKey.c_str());
-            else
-                record.portType = getPortType(jsonString(sfp, "transceiver").c_str());
-            out.add(getEthernetPortInstance(record));
-            break;
-        }
-        case CID_LAN_ENDPOINT:
-            out.add(getLANEndpointInstance(record));
-            break;
-        default:
-            TVRN_LOG(LL_INFO, "Unhandled class support");
-            break;
+            case CID_ETHERNET_PORT: {
+                Json::Value sfp;
+                guardedCall(LibCall("libGetOpticsSFP", portKey), libGetOpticsSFP,
+                            keyRequest("indexStr", portKey), sfp);
+                if (!ProviderUtil::isValidJsonResponse(sfp) ||
+                    !jsonHas(sfp, "transceiver", Json::stringValue))
+                    TVRN_LOG(LL_ERR, "Unable to get SFP info for %s", portKey.c_str());
+                else
+                    record.portType = getPortType(jsonString(sfp, "transceiver").c_str());
+                out.add(getEthernetPortInstance(record));
+                break;
+            }
+            case CID_LAN_ENDPOINT: out.add(getLANEndpointInstance(record)); break;
+            default: TVRN_LOG(LL_INFO, "Unhandled class support"); break;
         }
     }
 }

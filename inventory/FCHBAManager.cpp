@@ -39,8 +39,8 @@ const InventoryRoute kFCHBARoutes[] = {
     {CID_FC_PORT, CID_FC_PORT_STATISTICS, true, ports},
     {CID_PHYSICAL_PACKAGE, CID_ADAPTER_SOFTWARE_IDENTITY, true, adapters},
     {CID_REMOTE_SERVICE_ACCESS_POINT, CID_REMOTE_SERVICE_ACCESS_POINT, false, nullptr},
-    {CID_HBA_SOFTWARE_INSTALLATION_SERVICE, CID_HBA_SOFTWARE_INSTALLATION_SERVICE_CAPABILITIES, true,
-     nullptr},
+    {CID_HBA_SOFTWARE_INSTALLATION_SERVICE, CID_HBA_SOFTWARE_INSTALLATION_SERVICE_CAPABILITIES,
+     true, nullptr},
     {CID_ETHERNET_PORT, CID_ETHERNET_PORT, true, ethernetPorts},
     {CID_MEMORY_DIAGNOSTIC_TEST, CID_DIAGNOSTIC_COMPLETION_RECORD, true, nullptr},
     {CID_LOGICAL_PORT_GROUP, CID_LOGICAL_PORT_GROUP, true, ports},
@@ -76,8 +76,9 @@ Array<Instance*> dispatch(const InventoryRoute* begin, const InventoryRoute* end
         if (route == nullptr) {
             TVRN_LOG(LL_INFO, "Requested class is NOT supported.");
         } else if (route->needsDriver && !driverUsable) {
-            TVRN_LOG(LL_ERR, "Driver is not installed or there is a tfal mismatch hence no "
-                             "instances returned");
+            TVRN_LOG(LL_ERR,
+                     "Driver is not installed or there is a tfal mismatch hence no "
+                     "instances returned");
         } else {
             Array<Instance*> built = route->build(classId);
             out.take(built);

@@ -24,7 +24,9 @@ thread_local ThreadHost tHost;
 
 }  // namespace
 
-HostIdentityScope::HostIdentityScope() noexcept { tHost.depth++; }
+HostIdentityScope::HostIdentityScope() noexcept {
+    tHost.depth++;
+}
 
 HostIdentityScope::~HostIdentityScope() {
     if (--tHost.depth == 0) {
@@ -33,7 +35,9 @@ HostIdentityScope::~HostIdentityScope() {
     }
 }
 
-bool HostIdentityScope::active() { return tHost.depth > 0; }
+bool HostIdentityScope::active() {
+    return tHost.depth > 0;
+}
 
 int HostIdentityScope::hostInfo(char* hostString, size_t length) {
     if (tHost.depth == 0)

@@ -42,7 +42,8 @@ Array<Instance*> InstanceList::release() {
     return out;
 }
 
-void logWalkException(const char* operation, const HbaAgentError* user, const std::exception* stdError) {
+void logWalkException(const char* operation, const HbaAgentError* user,
+                      const std::exception* stdError) {
     if (user != nullptr)
         TVRN_LOG(LL_ERR, "%s ended by User exception %d: %s", operation, user->code,
                  user->message.c_str());
@@ -82,12 +83,12 @@ String decimal(long long value) {
 
 uint16 enabledStateOf(long long portState) {
     switch (portState) {
-    case 8: return 9;
-    case 9: return 4;
-    case 10: return 3;
-    case 11: return 2;
-    case 13: return 6;
-    default: return 1;
+        case 8: return 9;
+        case 9: return 4;
+        case 10: return 3;
+        case 11: return 2;
+        case 13: return 6;
+        default: return 1;
     }
 }
 

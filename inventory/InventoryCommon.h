@@ -50,7 +50,8 @@ private:
 // add instances to a list and returns them. Library calls that are not
 // guarded may throw; the exception ends the walk here: it is logged with the
 // operation's name, whatever was built is destroyed and the result is empty.
-void logWalkException(const char* operation, const HbaAgentError* user, const std::exception* stdError);
+void logWalkException(const char* operation, const HbaAgentError* user,
+                      const std::exception* stdError);
 
 template <class Fill>
 Array<Instance*> runWalk(const char* operation, Fill&& fill) noexcept {
@@ -76,8 +77,12 @@ Array<Instance*> runWalk(const char* operation, Fill&& fill) noexcept {
 String trimmedText(const String& text, size_t width);
 // The first `width` characters.
 String firstChars(const String& text, size_t width);
-inline String colonFree(const String& key) { return ProviderUtil::eraseColonsFromIndex(key); }
-inline String colonForm(const String& key) { return ProviderUtil::getIndexInColonFormat(key); }
+inline String colonFree(const String& key) {
+    return ProviderUtil::eraseColonsFromIndex(key);
+}
+inline String colonForm(const String& key) {
+    return ProviderUtil::getIndexInColonFormat(key);
+}
 // A JSON string holding the text.
 Json::Value jsonText(const String& text);
 // A request with one member.

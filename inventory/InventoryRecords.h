@@ -17,14 +17,14 @@ namespace CPTA {
 
 // One adapter.
 struct _adapterData {
-    String adapterWwn;  // "hbaData"."wwn" without colons (storage driver present)
-    String adapterMac;  // "hbaData"."hbaMAC" without colons (CNAs)
+    String adapterWwn;         // "hbaData"."wwn" without colons (storage driver present)
+    String adapterMac;         // "hbaData"."hbaMAC" without colons (CNAs)
     uint32 adapterStatus = 0;  // 11 in service, 10 stopped (port controllers only)
     String hostName;
     String model;
     String serialNumber;  // the OEM serial number when the VPD has one
     String vendorCode;
-    String fruNumber;     // empty for HP and DELL adapters
+    String fruNumber;  // empty for HP and DELL adapters
     String partNumber;
     String storageDriverName;
     String storageDriverVersion;  // trimmed
@@ -46,11 +46,11 @@ struct _hbaPortInfo {
     String symbolicName;
     sint32 portState = 0;  // CIM operational status
     String hostName;
-    sint32 portType = 0;   // CIM FC port type
+    sint32 portType = 0;  // CIM FC port type
     sint64 maxFrameSize = 0;
-    sint64 speed = 0;      // bits per second
-    sint64 maxSpeed = 0;   // bits per second
-    sint32 portNumber = 0; // position in the adapter's FC port list
+    sint64 speed = 0;       // bits per second
+    sint64 maxSpeed = 0;    // bits per second
+    sint32 portNumber = 0;  // position in the adapter's FC port list
 };
 
 // The counters of one FC or FCoE port. Filled from the library's statistics
@@ -87,14 +87,14 @@ struct prov_pport_stats_s {
 
 // One Ethernet function of a CNA.
 struct _ethPortInfo {
-    String macId;         // index string (the MAC) without colons
-    String deviceName;    // the host's interface name
-    uint32 portState = 0; // CIM operational status
+    String macId;          // index string (the MAC) without colons
+    String deviceName;     // the host's interface name
+    uint32 portState = 0;  // CIM operational status
     String hostName;
     String permanentMac;  // copy of macId
     sint32 portType = 0;  // CIM Ethernet port type from the transceiver
     sint32 portNumber = 0;
-    uint32 mtu = 0;       // 0 when unknown
+    uint32 mtu = 0;  // 0 when unknown
 };
 
 // The optic of one FC port.
@@ -116,9 +116,9 @@ struct _sfpInfo {
 // One LUN of one remote target.
 struct _hbaLunInfo {
     uint32 lunNumber = 0;
-    String remotePortWwn;  // colon-free
-    String vendor;         // first VENDOR_WIDTH characters
-    String productId;      // first PRODUCT_ID_WIDTH characters
+    String remotePortWwn;        // colon-free
+    String vendor;               // first VENDOR_WIDTH characters
+    String productId;            // first PRODUCT_ID_WIDTH characters
     String productSerialNumber;  // first SERIAL_WIDTH characters
     String lunDescription;       // first DESCRIPTION_WIDTH characters
     uint32 lunDescIdType = 0;    // what kind of identifier lunDescription is

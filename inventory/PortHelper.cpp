@@ -115,9 +115,8 @@ PortHelper* PortHelper::getPortHelperObject() {
 
 Array<Instance*> PortHelper::getInstancesByClass(classId_t classId) {
     return runWalk("PortHelper::getInstancesByClass", [&](InstanceList& out) {
-        forEachAdapter("No adapters in the system. ", false, [&](int, const String& key) {
-            walkAdapter(key, classId, BY_NUMBER, out);
-        });
+        forEachAdapter("No adapters in the system. ", false,
+                       [&](int, const String& key) { walkAdapter(key, classId, BY_NUMBER, out); });
     });
 }
 
@@ -193,40 +192,32 @@ void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkFo
 void PortHelper::addPortInstances(const Json::Value& port, const String& portKey,
                                   _hbaPortInfo& record, classId_t classId, InstanceList& out) {
     switch (classId) {
-    case CID_FC_PORT:
-        out.add(getFCPortInstance(record));
-        break;
-    case CID_SCSI_PROTOCOL_ENDPOINT:
-        out.add(getSCSIProtocolEndpointInstance(record, true));
-        addEndpoints(record, out);
-        break;
-    case CID_FC_PORT_STATISTICS:
-        addStatistics(port, portKey, record, out);
-        break;
-    case CID_STORAGE_EXTENT:
-    case CID_TAPE_DRIVE:
-    case CID_LOGICAL_DISK: {
-        Array<Instance*> targets = _targetHelper->getTargetInstances(record, classId);
-        out.take(targets);
-        break;
-    }
-    case CID_LOGICAL_PORT_GROUP:
-        out.add(getLogicalPortGroupInstance(record));
-        break;
-    case CID_ALARM_DEVICE:
-        if (jsonHas(port, "isMezz", Json::booleanValue) &&
-            jsonHas(port, "beaconState", Json::booleanValue)) {
-            // Mezzanine adapters have no beacon.
-            if (!jsonBool(port, "isMezz"))
-                out.add(getAlarmDeviceInstance(record, jsonBool(port, "beaconState")));
-        } else {
-            TVRN_LOG(LL_INFO, "beaconState is NOT available failed for %s.",
-                     jsonString(port, "wwn").c_str());
+        case CID_FC_PORT: out.add(getFCPortInstance(record)); break;
+        case CID_SCSI_PROTOCOL_ENDPOINT:
+            out.add(getSCSIProtocolEndpointInstance(record, true));
+            addEndpoints(record, out);
+            break;
+        case CID_FC_PORT_STATISTICS: addStatistics(port, portKey, record, out); break;
+        case CID_STORAGE_EXTENT:
+        case CID_TAPE_DRIVE:
+        case CID_LOGICAL_DISK: {
+            Array<Instance*> targets = _targetHelper->getTargetInstances(record, classId);
+            out.take(targets);
+            break;
         }
-        break;
-    default:
-        TVRN_LOG(LL_INFO, "Unhandled class support");
-        break;
+        case CID_LOGICAL_PORT_GROUP: out.add(getLogicalPortGroupInstance(record)); break;
+        case CID_ALARM_DEVICE:
+            if (jsonHas(port, "isMezz", Json::booleanValue) &&
+                jsonHas(port, "beaconState", Json::booleanValue)) {
+                // Mezzanine adapters have no beacon.
+                if (!jsonBool(port, "isMezz"))
+                    out.add(getAlarmDeviceInstance(record, jsonBool(port, "beaconState")));
+            } else {
+                TVRN_LOG(LL_INFO, "beaconState is NOT available failed for %s.",
+                         jsonString(port, "wwn").c_str());
+            }
+            break;
+        default: TVRN_LOG(LL_INFO, "Unhandled class support"); break;
     }
 }
 
@@ -310,7 +301,8 @@ int PortHelper::getNumberOfPorts(const String& adapterKey, Json::Value& ports) {
         logWalkException("PortHelper::getNumberOfPorts", nullptr, nullptr);
         return -1;
     }
-    if (ProviderUtil::isValidJsonResponse(ports) && jsonHas(ports, "indexStrings", Json::arrayValue)) {
+    if (ProviderUtil::isValidJsonResponse(ports) &&
+        jsonHas(ports, "indexStrings", Json::arrayValue)) {
         int count = int(jsonArray(ports, "indexStrings").size());
         TVRN_LOG(LL_INFO, "Number of Adapters: %d", count);
         return count;
@@ -320,7 +312,8 @@ int PortHelper::getNumberOfPorts(const String& adapterKey, Json::Value& ports) {
 }
 
 int PortHelper::getPortDetails(const String& portKey, Json::Value& port) {
-    const Json::Value request = keyRequest(portKey.size() == 12 ? "mac" : "wwn", colonForm(portKey));
+    const Json::Value request =
+        keyRequest(portKey.size() == 12 ? "mac" : "wwn", colonForm(portKey));
     if (!guardedCall(LibCall("libGetPortByWwn", portKey, LibCall::KEY_AFTER_DEFAULT),
                      libGetPortByWwn, request, port))
         return -1;

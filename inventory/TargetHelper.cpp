@@ -22,16 +22,13 @@ struct LunNaming {
     uint16 nameNamespace;
 };
 
-const uint32 kIdTypeSerial = 0;     // no description; named by vendor, product and serial
-const uint32 kIdTypeNone = 10;      // neither description nor serial
+const uint32 kIdTypeSerial = 0;  // no description; named by vendor, product and serial
+const uint32 kIdTypeNone = 10;   // neither description nor serial
 
 const LunNaming kLunNamings[] = {
-    {kIdTypeSerial, LunNaming::COMPOSED, 7, 7},
-    {1, LunNaming::DESCRIPTION, 11, 4},
-    {2, LunNaming::DESCRIPTION, 10, 3},
-    {3, LunNaming::DESCRIPTION, 9, 2},
-    {8, LunNaming::DESCRIPTION, 1, 1},
-    {kIdTypeNone, LunNaming::UNKNOWN, 0, 0},
+    {kIdTypeSerial, LunNaming::COMPOSED, 7, 7}, {1, LunNaming::DESCRIPTION, 11, 4},
+    {2, LunNaming::DESCRIPTION, 10, 3},         {3, LunNaming::DESCRIPTION, 9, 2},
+    {8, LunNaming::DESCRIPTION, 1, 1},          {kIdTypeNone, LunNaming::UNKNOWN, 0, 0},
 };
 
 const LunNaming* namingOf(uint32 idType) {
@@ -46,18 +43,16 @@ String lunName(const _hbaLunInfo& lun, const LunNaming* naming) {
     if (naming == nullptr)
         return String();
     switch (naming->source) {
-    case LunNaming::COMPOSED: {
-        String name = trimmedText(lun.vendor, _hbaLunInfo::VENDOR_WIDTH + 1);
-        name.append('+');
-        name.append(trimmedText(lun.productId, _hbaLunInfo::PRODUCT_ID_WIDTH + 1));
-        name.append('+');
-        name.append(trimmedText(lun.productSerialNumber, _hbaLunInfo::SERIAL_WIDTH + 1));
-        return name;
-    }
-    case LunNaming::DESCRIPTION:
-        return lun.lunDescription;
-    case LunNaming::UNKNOWN:
-        break;
+        case LunNaming::COMPOSED: {
+            String name = trimmedText(lun.vendor, _hbaLunInfo::VENDOR_WIDTH + 1);
+            name.append('+');
+            name.append(trimmedText(lun.productId, _hbaLunInfo::PRODUCT_ID_WIDTH + 1));
+            name.append('+');
+            name.append(trimmedText(lun.productSerialNumber, _hbaLunInfo::SERIAL_WIDTH + 1));
+            return name;
+        }
+        case LunNaming::DESCRIPTION: return lun.lunDescription;
+        case LunNaming::UNKNOWN: break;
     }
     return String("Unable To Fetch");
 }
@@ -108,11 +103,11 @@ bool TargetHelper::readLun(const Json::Value& u, const String& remotePortWwn, _h
     lun.productId = firstChars(jsonString(u, "productID"), _hbaLunInfo::PRODUCT_ID_WIDTH);
     lun.lunDescIdType = jsonUInt(u, "lunDescIdType");
     if (jsonHas(u, "lunDescription", Json::stringValue)) {
-        lun.lunDescription = firstChars(jsonString(u, "lunDescription"),
-                                        _hbaLunInfo::DESCRIPTION_WIDTH);
+        lun.lunDescription =
+            firstChars(jsonString(u, "lunDescription"), _hbaLunInfo::DESCRIPTION_WIDTH);
     } else if (jsonHas(u, "productSerialNumber", Json::stringValue)) {
-        lun.productSerialNumber = firstChars(jsonString(u, "productSerialNumber"),
-                                             _hbaLunInfo::SERIAL_WIDTH);
+        lun.productSerialNumber =
+            firstChars(jsonString(u, "productSerialNumber"), _hbaLunInfo::SERIAL_WIDTH);
         lun.lunDescIdType = kIdTypeSerial;
     } else {
         lun.lunDescIdType = kIdTypeNone;

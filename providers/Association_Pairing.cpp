@@ -239,8 +239,7 @@ Fetched& Pairing_Run::fetch_element_set(uint8 set, const Instance* walked) {
             items = EthernetPortHelper::getEthernetPortHelperObject()->getInstancesByAdapterId(
                 atoi(adapter.c_str()), CID_ETHERNET_PORT);
             break;
-        default:
-            break;
+        default: break;
     }
     slot.reset(new Fetched());
     slot->take(items, 0, expected);

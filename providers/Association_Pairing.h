@@ -111,18 +111,22 @@ struct Key {
     Key_Function derive;
 };
 
-constexpr Key key(const char* property) { return Key{property, nullptr}; }
-constexpr Key key(Key_Function derive) { return Key{nullptr, derive}; }
+constexpr Key key(const char* property) {
+    return Key{property, nullptr};
+}
+constexpr Key key(Key_Function derive) {
+    return Key{nullptr, derive};
+}
 
 // Where a set comes from.
 enum class Source : uint8 {
     NONE,
-    INVENTORY,                       // FCHBAManager::getInstances of its class ids
-    HOST_DISCOVERED,                 // HDRManager::getInstances of its class ids
+    INVENTORY,        // FCHBAManager::getInstances of its class ids
+    HOST_DISCOVERED,  // HDRManager::getInstances of its class ids
     // Per element, selected by a key of the walked instance:
-    FC_PORTS_OF_ADAPTER,             // FCHBAManager::getFCPortInstancesByAdapter(key)
-    ETHERNET_PORTS_OF_ADAPTER,       // FCHBAManager::getEthernetPortInstancesByAdapter(key)
-    ETHERNET_PORTS_OF_ADAPTER_NUMBER // EthernetPortHelper::getInstancesByAdapterId(key, 20)
+    FC_PORTS_OF_ADAPTER,              // FCHBAManager::getFCPortInstancesByAdapter(key)
+    ETHERNET_PORTS_OF_ADAPTER,        // FCHBAManager::getEthernetPortInstancesByAdapter(key)
+    ETHERNET_PORTS_OF_ADAPTER_NUMBER  // EthernetPortHelper::getInstancesByAdapterId(key, 20)
 };
 
 constexpr bool is_per_element(Source s) {
@@ -312,8 +316,8 @@ private:
         p.sets[p.num_sets++] = set;
         return p;
     }
-    constexpr Pairing with_check(Count_Rule rule, uint8 other, Log_Level level,
-                                 const char* message, Enum_Instances_Status result) const {
+    constexpr Pairing with_check(Count_Rule rule, uint8 other, Log_Level level, const char* message,
+                                 Enum_Instances_Status result) const {
         Pairing p = *this;
         p.checks[p.num_checks++] =
             Count_Check{uint8(num_sets - 1), rule, other, level, message, result};

@@ -113,8 +113,9 @@ public:
     // The model (the properties asked for) is not looked at, nor whether the
     // handler wants more: every instance is delivered whole.
     Enum_Instances_Status enum_instances(const C*, Enum_Instances_Handler<C>* handler) {
-        return enumerate_inventory(SOURCE, &C::static_meta_class,
-                                   [handler](Instance* instance) { handler->handle(static_cast<C*>(instance)); });
+        return enumerate_inventory(SOURCE, &C::static_meta_class, [handler](Instance* instance) {
+            handler->handle(static_cast<C*>(instance));
+        });
     }
 };
 

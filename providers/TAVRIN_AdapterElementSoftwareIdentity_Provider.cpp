@@ -45,9 +45,9 @@ void identity_keys(Key_Sink& keys, const Instance* instance) {
     }
     // The network driver is known by its name "tna", or, whatever it is
     // called, by being the one the inventory describes as the network driver.
-    const bool network = (end - begin == 3 && id.equali(begin, "tna", 3)) ||
-                         (!identity->ElementName.null &&
-                          identity->ElementName.value.equal("Network driver"));
+    const bool network =
+        (end - begin == 3 && id.equali(begin, "tna", 3)) ||
+        (!identity->ElementName.null && identity->ElementName.value.equal("Network driver"));
     keys.add(network ? kNetworkDriver : kAnyDriver);
 }
 
@@ -60,12 +60,14 @@ void controller_keys(Key_Sink& keys, const Instance* instance) {
         keys.add(kNetworkDriver);
 }
 
-constexpr Pairing kSoftware = TVRN_PAIRING
-    .fetch(CID_ADAPTER_SOFTWARE_IDENTITY)  // 0
-    .fetch(CID_PORT_CONTROLLER)            // 1
-    .announce(LL_DBG, "Building and returning association instances.")
-    .for_each(1).as("Dependent")
-    .with_all(0, "Antecedent", key(controller_keys), key(identity_keys));
+constexpr Pairing kSoftware =
+    TVRN_PAIRING
+        .fetch(CID_ADAPTER_SOFTWARE_IDENTITY)  // 0
+        .fetch(CID_PORT_CONTROLLER)            // 1
+        .announce(LL_DBG, "Building and returning association instances.")
+        .for_each(1)
+        .as("Dependent")
+        .with_all(0, "Antecedent", key(controller_keys), key(identity_keys));
 
 }  // namespace
 

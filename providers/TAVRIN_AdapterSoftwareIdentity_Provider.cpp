@@ -4,9 +4,13 @@
 
 namespace CPTA {
 
-const Inventory_Source TAVRIN_AdapterSoftwareIdentity_Source = {
-    CID_ADAPTER_SOFTWARE_IDENTITY, fromFCHBAManager, "No Adapter Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+const Inventory_Source TAVRIN_AdapterSoftwareIdentity_Source = {CID_ADAPTER_SOFTWARE_IDENTITY,
+                                                                fromFCHBAManager,
+                                                                "No Adapter Found!",
+                                                                LL_ERR,
+                                                                ANNOUNCED,
+                                                                TVRN_SOURCE_FILE,
+                                                                __LINE__};
 
 class TAVRIN_AdapterSoftwareIdentity_Provider
     : public Inventory_Provider<TAVRIN_AdapterSoftwareIdentity,

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_AffectedJobElement_Provider
-    : public Association_Provider<TAVRIN_AffectedJobElement>,
-      public TAVRIN_AffectedJobElement_Methods {};
+class TAVRIN_AffectedJobElement_Provider : public Association_Provider<TAVRIN_AffectedJobElement>,
+                                           public TAVRIN_AffectedJobElement_Methods {};
 
 }  // namespace CPTA
 

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_AgentService_Provider
-    : public Instance_Provider<TAVRIN_AgentService>,
-      public TAVRIN_AgentService_Methods {};
+class TAVRIN_AgentService_Provider : public Instance_Provider<TAVRIN_AgentService>,
+                                     public TAVRIN_AgentService_Methods {};
 
 }  // namespace CPTA
 

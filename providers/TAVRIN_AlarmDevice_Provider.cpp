@@ -27,15 +27,9 @@ public:
             PortHelper* ports = FCHBAManager::getFCHBAManager()->getPortHelper();
             const String deviceId = self->DeviceID.null ? String() : self->DeviceID.value;
             switch (ports->setAlarmState(deviceId, State.value)) {
-                case PortHelper::ALARM_DONE:
-                    outcome = 0;
-                    break;
-                case PortHelper::ALARM_NOT_SUPPORTED:
-                    outcome = 1;
-                    break;
-                default:
-                    outcome = 2;
-                    break;
+                case PortHelper::ALARM_DONE: outcome = 0; break;
+                case PortHelper::ALARM_NOT_SUPPORTED: outcome = 1; break;
+                default: outcome = 2; break;
             }
             TVRN_LOG(LL_DBG, "return value = %d\n", int(outcome));
         } else {

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_AlertIndication_Provider
-    : public Indication_Provider<TAVRIN_AlertIndication>,
-      public TAVRIN_AlertIndication_Methods {};
+class TAVRIN_AlertIndication_Provider : public Indication_Provider<TAVRIN_AlertIndication>,
+                                        public TAVRIN_AlertIndication_Methods {};
 
 }  // namespace CPTA
 

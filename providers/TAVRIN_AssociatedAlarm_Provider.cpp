@@ -6,17 +6,18 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kAlarms = TVRN_PAIRING
-    .fetch(CID_FC_PORT).when_empty(LL_WARN, "No FC Ports Found!")              // 0
-    .fetch(CID_ALARM_DEVICE).when_empty(LL_WARN, "Invalid number of Instances!")  // 1
-    .for_each(0).as("Dependent")
-    .with_all(1, "Antecedent", key("DeviceID"), key("DeviceID"));
+constexpr Pairing kAlarms = TVRN_PAIRING.fetch(CID_FC_PORT)
+                                .when_empty(LL_WARN, "No FC Ports Found!")  // 0
+                                .fetch(CID_ALARM_DEVICE)
+                                .when_empty(LL_WARN, "Invalid number of Instances!")  // 1
+                                .for_each(0)
+                                .as("Dependent")
+                                .with_all(1, "Antecedent", key("DeviceID"), key("DeviceID"));
 
 }  // namespace
 
-class TAVRIN_AssociatedAlarm_Provider
-    : public Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms>,
-      public TAVRIN_AssociatedAlarm_Methods {};
+class TAVRIN_AssociatedAlarm_Provider : public Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms>,
+                                        public TAVRIN_AssociatedAlarm_Methods {};
 
 }  // namespace CPTA
 

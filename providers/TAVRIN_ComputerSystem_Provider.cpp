@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_ComputerSystem_Source = {
     CID_COMPUTER_SYSTEM, fromFCHBAManager, "Error: Invalid mapping information", LL_ERR, SINGLE,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,    __LINE__};
 
 class TAVRIN_ComputerSystem_Provider
     : public Inventory_Provider<TAVRIN_ComputerSystem, TAVRIN_ComputerSystem_Source>,

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_ConcreteJob_Provider
-    : public Instance_Provider<TAVRIN_ConcreteJob>,
-      public TAVRIN_ConcreteJob_Methods {};
+class TAVRIN_ConcreteJob_Provider : public Instance_Provider<TAVRIN_ConcreteJob>,
+                                    public TAVRIN_ConcreteJob_Methods {};
 
 }  // namespace CPTA
 

@@ -11,9 +11,8 @@ constexpr Pairing kPorts = TVRN_PAIRING.controller_with_every(Source::FC_PORTS_O
 
 }  // namespace
 
-class TAVRIN_ControlledBy_Provider
-    : public Pairing_Provider<TAVRIN_ControlledBy, kPorts>,
-      public TAVRIN_ControlledBy_Methods {};
+class TAVRIN_ControlledBy_Provider : public Pairing_Provider<TAVRIN_ControlledBy, kPorts>,
+                                     public TAVRIN_ControlledBy_Methods {};
 
 }  // namespace CPTA
 

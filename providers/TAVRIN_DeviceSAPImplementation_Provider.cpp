@@ -7,12 +7,15 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kEndpoints = TVRN_PAIRING
-    .fetch(CID_SCSI_PROTOCOL_ENDPOINT)  // 0
-    .when_empty(LL_ERR, "Error: Invalid number of instances returned")
-    .fetch(CID_FC_PORT).when_empty(LL_ERR, "Error: No FCPort found!")  // 1
-    .for_each(1).as("Antecedent")
-    .with_first(0, "Dependent", key("DeviceID"), key("Name"));
+constexpr Pairing kEndpoints =
+    TVRN_PAIRING
+        .fetch(CID_SCSI_PROTOCOL_ENDPOINT)  // 0
+        .when_empty(LL_ERR, "Error: Invalid number of instances returned")
+        .fetch(CID_FC_PORT)
+        .when_empty(LL_ERR, "Error: No FCPort found!")  // 1
+        .for_each(1)
+        .as("Antecedent")
+        .with_first(0, "Dependent", key("DeviceID"), key("Name"));
 
 }  // namespace
 

@@ -7,12 +7,14 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kStatistics = TVRN_PAIRING
-    .fetch(CID_FC_PORT).when_empty(LL_WARN, "No FC Ports Found")  // 0
-    .fetch(CID_FC_PORT_STATISTICS)                                 // 1
-    .when_empty(LL_WARN, "Invalid number of Port Statistice Instances!")
-    .for_each(0).as("ManagedElement")
-    .with_all(1, "Stats", key("DeviceID"), key("InstanceID"));
+constexpr Pairing kStatistics =
+    TVRN_PAIRING.fetch(CID_FC_PORT)
+        .when_empty(LL_WARN, "No FC Ports Found")  // 0
+        .fetch(CID_FC_PORT_STATISTICS)             // 1
+        .when_empty(LL_WARN, "Invalid number of Port Statistice Instances!")
+        .for_each(0)
+        .as("ManagedElement")
+        .with_all(1, "Stats", key("DeviceID"), key("InstanceID"));
 
 }  // namespace
 

@@ -7,7 +7,8 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kEthernetPorts = TVRN_PAIRING.controller_with_every(Source::ETHERNET_PORTS_OF_ADAPTER);
+constexpr Pairing kEthernetPorts =
+    TVRN_PAIRING.controller_with_every(Source::ETHERNET_PORTS_OF_ADAPTER);
 
 }  // namespace
 

@@ -8,12 +8,14 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kConnectors = TVRN_PAIRING
-    .fetch(CID_PHYSICAL_CONNECTOR).when_empty(LL_WARN, "No Connector Found")  // 0
-    .fetch_for_each(Source::ETHERNET_PORTS_OF_ADAPTER_NUMBER,                 // 1
-                    key(connector_adapter_number))
-    .for_each(0).as("Antecedent")
-    .with_first(1, "Dependent", key(connector_port_position), key("PortNumber"));
+constexpr Pairing kConnectors =
+    TVRN_PAIRING.fetch(CID_PHYSICAL_CONNECTOR)
+        .when_empty(LL_WARN, "No Connector Found")                 // 0
+        .fetch_for_each(Source::ETHERNET_PORTS_OF_ADAPTER_NUMBER,  // 1
+                        key(connector_adapter_number))
+        .for_each(0)
+        .as("Antecedent")
+        .with_first(1, "Dependent", key(connector_port_position), key("PortNumber"));
 
 }  // namespace
 

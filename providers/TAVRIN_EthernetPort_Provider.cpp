@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_EthernetPort_Source = {
     CID_ETHERNET_PORT, fromFCHBAManager, "Error: Invalid mapping information", LL_ERR, QUIET,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,  __LINE__};
 
 class TAVRIN_EthernetPort_Provider
     : public Inventory_Provider<TAVRIN_EthernetPort, TAVRIN_EthernetPort_Source>,

@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_FCPortStatistics_Source = {
     CID_FC_PORT_STATISTICS, fromFCHBAManager, "No FC Ports Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,       __LINE__};
 
 class TAVRIN_FCPortStatistics_Provider
     : public Inventory_Provider<TAVRIN_FCPortStatistics, TAVRIN_FCPortStatistics_Source>,

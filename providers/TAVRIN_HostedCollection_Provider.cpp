@@ -7,17 +7,15 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kHosted =
-    TVRN_PAIRING
-        .host_with_every(CID_LOGICAL_PORT_GROUP, "Antecedent", "Dependent",
-                         "Error: Invalid mapping information")
-        .when_empty(LL_WARN, "No Logical Port Groups found!");
+constexpr Pairing kHosted = TVRN_PAIRING
+                                .host_with_every(CID_LOGICAL_PORT_GROUP, "Antecedent", "Dependent",
+                                                 "Error: Invalid mapping information")
+                                .when_empty(LL_WARN, "No Logical Port Groups found!");
 
 }  // namespace
 
-class TAVRIN_HostedCollection_Provider
-    : public Pairing_Provider<TAVRIN_HostedCollection, kHosted>,
-      public TAVRIN_HostedCollection_Methods {};
+class TAVRIN_HostedCollection_Provider : public Pairing_Provider<TAVRIN_HostedCollection, kHosted>,
+                                         public TAVRIN_HostedCollection_Methods {};
 
 }  // namespace CPTA
 

@@ -15,15 +15,16 @@ bool is_cna(const Instance* instance) {
     return controller->ControllerType.null || controller->ControllerType.value != kFcHba;
 }
 
-constexpr Pairing kPortPairs = TVRN_PAIRING
-    .fetch(CID_PORT_CONTROLLER)                                    // 0
-    .fetch_for_each(Source::FC_PORTS_OF_ADAPTER, key("DeviceID"))  // 1
-    .when_empty(LL_INFO, "There are no FCPORT instances returned")
-    .fetch_for_each(Source::ETHERNET_PORTS_OF_ADAPTER, key("DeviceID"))  // 2
-    .when_empty(LL_INFO, "There are no ETHPORT instances returned")
-    .for_each(0, is_cna)
-    .pair(1, "Dependent")
-    .with_first(2, "Antecedent", key("PortNumber"), key("PortNumber"));
+constexpr Pairing kPortPairs =
+    TVRN_PAIRING
+        .fetch(CID_PORT_CONTROLLER)                                    // 0
+        .fetch_for_each(Source::FC_PORTS_OF_ADAPTER, key("DeviceID"))  // 1
+        .when_empty(LL_INFO, "There are no FCPORT instances returned")
+        .fetch_for_each(Source::ETHERNET_PORTS_OF_ADAPTER, key("DeviceID"))  // 2
+        .when_empty(LL_INFO, "There are no ETHPORT instances returned")
+        .for_each(0, is_cna)
+        .pair(1, "Dependent")
+        .with_first(2, "Antecedent", key("PortNumber"), key("PortNumber"));
 
 }  // namespace
 

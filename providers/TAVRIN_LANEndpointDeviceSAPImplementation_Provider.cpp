@@ -7,13 +7,14 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kEndpoints = TVRN_PAIRING
-    .fetch(CID_ETHERNET_PORT).when_empty(LL_WARN, "No Ethernet Port Found")  // 0
-    .fetch(CID_LAN_ENDPOINT)                                                  // 1
-    .when_empty(LL_WARN, "Invalid number of EndPoint instances ")
-    .when_differs(0, LL_ERR, "Error: Invalid mapping information!")
-    .for_each(0).as("Antecedent")
-    .with_first(1, "Dependent", key("DeviceID"), key("MACAddress"));
+constexpr Pairing kEndpoints = TVRN_PAIRING.fetch(CID_ETHERNET_PORT)
+                                   .when_empty(LL_WARN, "No Ethernet Port Found")  // 0
+                                   .fetch(CID_LAN_ENDPOINT)                        // 1
+                                   .when_empty(LL_WARN, "Invalid number of EndPoint instances ")
+                                   .when_differs(0, LL_ERR, "Error: Invalid mapping information!")
+                                   .for_each(0)
+                                   .as("Antecedent")
+                                   .with_first(1, "Dependent", key("DeviceID"), key("MACAddress"));
 
 }  // namespace
 

@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_LogicalPortGroup_Source = {
     CID_LOGICAL_PORT_GROUP, fromFCHBAManager, "No Logical Port Groups found!", LL_WARN, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,       __LINE__};
 
 class TAVRIN_LogicalPortGroup_Provider
     : public Inventory_Provider<TAVRIN_LogicalPortGroup, TAVRIN_LogicalPortGroup_Source>,

@@ -7,12 +7,14 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kGroups = TVRN_PAIRING
-    .fetch(CID_FC_PORT).when_empty(LL_WARN, "No FC Ports Found!")  // 0
-    .fetch(CID_LOGICAL_PORT_GROUP)                                  // 1
-    .when_empty(LL_ERR, "Error: Invalid number of instances returned!\n", ENUM_INSTANCES_FAILED)
-    .for_each(0).as("Member")
-    .with_first(1, "Collection", key("DeviceID"), key("Name"));
+constexpr Pairing kGroups =
+    TVRN_PAIRING.fetch(CID_FC_PORT)
+        .when_empty(LL_WARN, "No FC Ports Found!")  // 0
+        .fetch(CID_LOGICAL_PORT_GROUP)              // 1
+        .when_empty(LL_ERR, "Error: Invalid number of instances returned!\n", ENUM_INSTANCES_FAILED)
+        .for_each(0)
+        .as("Member")
+        .with_first(1, "Collection", key("DeviceID"), key("Name"));
 
 }  // namespace
 

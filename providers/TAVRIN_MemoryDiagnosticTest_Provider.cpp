@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_MemoryDiagnosticTest_Provider
-    : public Instance_Provider<TAVRIN_MemoryDiagnosticTest>,
-      public TAVRIN_MemoryDiagnosticTest_Methods {};
+class TAVRIN_MemoryDiagnosticTest_Provider : public Instance_Provider<TAVRIN_MemoryDiagnosticTest>,
+                                             public TAVRIN_MemoryDiagnosticTest_Methods {};
 
 }  // namespace CPTA
 

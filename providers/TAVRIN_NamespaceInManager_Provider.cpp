@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_NamespaceInManager_Provider
-    : public Association_Provider<TAVRIN_NamespaceInManager>,
-      public TAVRIN_NamespaceInManager_Methods {};
+class TAVRIN_NamespaceInManager_Provider : public Association_Provider<TAVRIN_NamespaceInManager>,
+                                           public TAVRIN_NamespaceInManager_Methods {};
 
 }  // namespace CPTA
 

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_Namespace_Provider
-    : public Instance_Provider<TAVRIN_Namespace>,
-      public TAVRIN_Namespace_Methods {};
+class TAVRIN_Namespace_Provider : public Instance_Provider<TAVRIN_Namespace>,
+                                  public TAVRIN_Namespace_Methods {};
 
 }  // namespace CPTA
 

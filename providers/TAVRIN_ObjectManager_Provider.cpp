@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_ObjectManager_Provider
-    : public Instance_Provider<TAVRIN_ObjectManager>,
-      public TAVRIN_ObjectManager_Methods {};
+class TAVRIN_ObjectManager_Provider : public Instance_Provider<TAVRIN_ObjectManager>,
+                                      public TAVRIN_ObjectManager_Methods {};
 
 }  // namespace CPTA
 

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_OwningJobElement_Provider
-    : public Association_Provider<TAVRIN_OwningJobElement>,
-      public TAVRIN_OwningJobElement_Methods {};
+class TAVRIN_OwningJobElement_Provider : public Association_Provider<TAVRIN_OwningJobElement>,
+                                         public TAVRIN_OwningJobElement_Methods {};
 
 }  // namespace CPTA
 

@@ -18,11 +18,15 @@ void adapter_serial_number(Key_Sink& keys, const Instance* connector) {
         keys.add(serial);
 }
 
-constexpr Pairing kPackages = TVRN_PAIRING
-    .fetch(CID_PHYSICAL_CONNECTOR).when_empty(LL_WARN, "No Connectors retrieved\n")  // 0
-    .fetch(CID_PHYSICAL_PACKAGE).when_empty(LL_WARN, "No PhysicalPackage retrieved\n")  // 1
-    .for_each(0).as("PartComponent")
-    .with_all(1, "GroupComponent", key(adapter_serial_number), key("SerialNumber")).exact();
+constexpr Pairing kPackages =
+    TVRN_PAIRING.fetch(CID_PHYSICAL_CONNECTOR)
+        .when_empty(LL_WARN, "No Connectors retrieved\n")  // 0
+        .fetch(CID_PHYSICAL_PACKAGE)
+        .when_empty(LL_WARN, "No PhysicalPackage retrieved\n")  // 1
+        .for_each(0)
+        .as("PartComponent")
+        .with_all(1, "GroupComponent", key(adapter_serial_number), key("SerialNumber"))
+        .exact();
 
 }  // namespace
 

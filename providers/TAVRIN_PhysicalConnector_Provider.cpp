@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_PhysicalConnector_Source = {
     CID_PHYSICAL_CONNECTOR, fromFCHBAManager, "No Connector Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,       __LINE__};
 
 class TAVRIN_PhysicalConnector_Provider
     : public Inventory_Provider<TAVRIN_PhysicalConnector, TAVRIN_PhysicalConnector_Source>,

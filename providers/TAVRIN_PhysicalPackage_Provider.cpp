@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_PhysicalPackage_Source = {
     CID_PHYSICAL_PACKAGE, fromFCHBAManager, "No Adapter Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,     __LINE__};
 
 class TAVRIN_PhysicalPackage_Provider
     : public Inventory_Provider<TAVRIN_PhysicalPackage, TAVRIN_PhysicalPackage_Source>,

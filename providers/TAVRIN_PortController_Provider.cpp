@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_PortController_Source = {
     CID_PORT_CONTROLLER, fromFCHBAManager, "No Adapter Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,    __LINE__};
 
 class TAVRIN_PortController_Provider
     : public Inventory_Provider<TAVRIN_PortController, TAVRIN_PortController_Source>,

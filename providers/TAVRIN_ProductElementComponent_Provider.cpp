@@ -7,11 +7,14 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kProducts = TVRN_PAIRING
-    .fetch(CID_PORT_CONTROLLER)                                                 // 0
-    .fetch(CID_PRODUCT).when_differs(0, LL_ERR, "Invalid mapping information.")  // 1
-    .for_each(0).as("PartComponent")
-    .with_first(1, "GroupComponent", key("Name"), key("IdentifyingNumber"));
+constexpr Pairing kProducts =
+    TVRN_PAIRING
+        .fetch(CID_PORT_CONTROLLER)  // 0
+        .fetch(CID_PRODUCT)
+        .when_differs(0, LL_ERR, "Invalid mapping information.")  // 1
+        .for_each(0)
+        .as("PartComponent")
+        .with_first(1, "GroupComponent", key("Name"), key("IdentifyingNumber"));
 
 }  // namespace
 

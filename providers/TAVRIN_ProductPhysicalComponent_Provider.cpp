@@ -7,12 +7,14 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kProducts = TVRN_PAIRING
-    .fetch(CID_PHYSICAL_PACKAGE)  // 0
-    .fetch(CID_PRODUCT)           // 1
-    .when_differs(0, LL_ERR, "Error: Improper Product Information!\n")
-    .for_each(0).as("PartComponent")
-    .with_first(1, "GroupComponent", key("SerialNumber"), key("IdentifyingNumber"));
+constexpr Pairing kProducts =
+    TVRN_PAIRING
+        .fetch(CID_PHYSICAL_PACKAGE)  // 0
+        .fetch(CID_PRODUCT)           // 1
+        .when_differs(0, LL_ERR, "Error: Improper Product Information!\n")
+        .for_each(0)
+        .as("PartComponent")
+        .with_first(1, "GroupComponent", key("SerialNumber"), key("IdentifyingNumber"));
 
 }  // namespace
 

@@ -4,13 +4,12 @@
 
 namespace CPTA {
 
-const Inventory_Source TAVRIN_Product_Source = {
-    CID_PRODUCT, fromFCHBAManager, "No Adapter Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+const Inventory_Source TAVRIN_Product_Source = {CID_PRODUCT, fromFCHBAManager, "No Adapter Found!",
+                                                LL_ERR,      ANNOUNCED,        TVRN_SOURCE_FILE,
+                                                __LINE__};
 
-class TAVRIN_Product_Provider
-    : public Inventory_Provider<TAVRIN_Product, TAVRIN_Product_Source>,
-      public TAVRIN_Product_Methods {};
+class TAVRIN_Product_Provider : public Inventory_Provider<TAVRIN_Product, TAVRIN_Product_Source>,
+                                public TAVRIN_Product_Methods {};
 
 }  // namespace CPTA
 

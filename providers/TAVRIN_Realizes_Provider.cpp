@@ -9,18 +9,19 @@ namespace CPTA {
 
 namespace {
 
-constexpr Pairing kPackages = TVRN_PAIRING
-    .fetch(CID_PORT_CONTROLLER)   // 0
-    .fetch(CID_PHYSICAL_PACKAGE)  // 1
-    .when_differs(0, LL_ERR, "Error: Invalid number of instances returned!\n")
-    .for_each(0).as("Dependent")
-    .at_same_position(1, "Antecedent", key("ElementName"), key("SerialNumber"));
+constexpr Pairing kPackages =
+    TVRN_PAIRING
+        .fetch(CID_PORT_CONTROLLER)   // 0
+        .fetch(CID_PHYSICAL_PACKAGE)  // 1
+        .when_differs(0, LL_ERR, "Error: Invalid number of instances returned!\n")
+        .for_each(0)
+        .as("Dependent")
+        .at_same_position(1, "Antecedent", key("ElementName"), key("SerialNumber"));
 
 }  // namespace
 
-class TAVRIN_Realizes_Provider
-    : public Pairing_Provider<TAVRIN_Realizes, kPackages>,
-      public TAVRIN_Realizes_Methods {};
+class TAVRIN_Realizes_Provider : public Pairing_Provider<TAVRIN_Realizes, kPackages>,
+                                 public TAVRIN_Realizes_Methods {};
 
 }  // namespace CPTA
 

@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_RegisteredProfile_Provider
-    : public Instance_Provider<TAVRIN_RegisteredProfile>,
-      public TAVRIN_RegisteredProfile_Methods {};
+class TAVRIN_RegisteredProfile_Provider : public Instance_Provider<TAVRIN_RegisteredProfile>,
+                                          public TAVRIN_RegisteredProfile_Methods {};
 
 }  // namespace CPTA
 

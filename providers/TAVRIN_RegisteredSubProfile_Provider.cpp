@@ -4,9 +4,8 @@
 
 namespace CPTA {
 
-class TAVRIN_RegisteredSubProfile_Provider
-    : public Instance_Provider<TAVRIN_RegisteredSubProfile>,
-      public TAVRIN_RegisteredSubProfile_Methods {};
+class TAVRIN_RegisteredSubProfile_Provider : public Instance_Provider<TAVRIN_RegisteredSubProfile>,
+                                             public TAVRIN_RegisteredSubProfile_Methods {};
 
 }  // namespace CPTA
 

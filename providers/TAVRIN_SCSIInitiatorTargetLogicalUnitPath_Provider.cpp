@@ -24,7 +24,9 @@ bool is_initiator(const Instance* instance) {
     return !endpoint->Role.null && endpoint->Role.value == kInitiator;
 }
 
-bool is_target(const Instance* instance) { return !is_initiator(instance); }
+bool is_target(const Instance* instance) {
+    return !is_initiator(instance);
+}
 
 // The text of a property up to its first "_" (`fields` 1) or its second
 // (`fields` 2), or (`fields` 0) the whole text when it has a "_"; nothing
@@ -74,13 +76,17 @@ void report_counts(const Pairing_Sets& sets) {
              int(initiators), int(targets), int(sets.size(0, 0)), int(sets.size(0, 1)));
 }
 
-constexpr Pairing kPaths = TVRN_PAIRING
-    .fetch_discovered(CID_STORAGE_EXTENT, CID_TAPE_DRIVE).when_empty(LL_ERR, kNoInstances)  // 0
-    .fetch(CID_SCSI_PROTOCOL_ENDPOINT).when_empty(LL_ERR, kNoInstances)                     // 1
-    .report(report_counts)
-    .for_each(1, is_initiator).as("Initiator")
-    .with_all(1, "Target", key("ElementName"), key(local_port_of_target)).only(is_target)
-    .with_all(0, "LogicalUnit", key(ports_of_target), key(ports_of_unit));
+constexpr Pairing kPaths =
+    TVRN_PAIRING.fetch_discovered(CID_STORAGE_EXTENT, CID_TAPE_DRIVE)
+        .when_empty(LL_ERR, kNoInstances)  // 0
+        .fetch(CID_SCSI_PROTOCOL_ENDPOINT)
+        .when_empty(LL_ERR, kNoInstances)  // 1
+        .report(report_counts)
+        .for_each(1, is_initiator)
+        .as("Initiator")
+        .with_all(1, "Target", key("ElementName"), key(local_port_of_target))
+        .only(is_target)
+        .with_all(0, "LogicalUnit", key(ports_of_target), key(ports_of_unit));
 
 }  // namespace
 

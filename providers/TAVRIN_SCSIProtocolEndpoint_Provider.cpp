@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_SCSIProtocolEndpoint_Source = {
     CID_SCSI_PROTOCOL_ENDPOINT, fromFCHBAManager, "No FC Ports Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,           __LINE__};
 
 class TAVRIN_SCSIProtocolEndpoint_Provider
     : public Inventory_Provider<TAVRIN_SCSIProtocolEndpoint, TAVRIN_SCSIProtocolEndpoint_Source>,

@@ -6,7 +6,7 @@ namespace CPTA {
 
 const Inventory_Source TAVRIN_StorageExtent_Source = {
     CID_STORAGE_EXTENT, fromHDRManager, "No StorageExtents Found!", LL_ERR, ANNOUNCED,
-    TVRN_SOURCE_FILE, __LINE__};
+    TVRN_SOURCE_FILE,   __LINE__};
 
 class TAVRIN_StorageExtent_Provider
     : public Inventory_Provider<TAVRIN_StorageExtent, TAVRIN_StorageExtent_Source>,

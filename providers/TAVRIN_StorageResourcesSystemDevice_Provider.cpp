@@ -9,10 +9,11 @@ namespace CPTA {
 namespace {
 
 constexpr Pairing kHosted = TVRN_PAIRING
-    .fetch(CID_COMPUTER_SYSTEM)                             // 0
-    .fetch_discovered(CID_STORAGE_EXTENT, CID_TAPE_DRIVE)  // 1
-    .for_each(0).as("GroupComponent")
-    .with_every(1, "PartComponent");
+                                .fetch(CID_COMPUTER_SYSTEM)                            // 0
+                                .fetch_discovered(CID_STORAGE_EXTENT, CID_TAPE_DRIVE)  // 1
+                                .for_each(0)
+                                .as("GroupComponent")
+                                .with_every(1, "PartComponent");
 
 }  // namespace
 

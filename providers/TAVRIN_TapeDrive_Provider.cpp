@@ -5,7 +5,7 @@
 namespace CPTA {
 
 const Inventory_Source TAVRIN_TapeDrive_Source = {
-    CID_TAPE_DRIVE, fromHDRManager, "No TapeDrives Found!", LL_ERR, ANNOUNCED,
+    CID_TAPE_DRIVE,   fromHDRManager, "No TapeDrives Found!", LL_ERR, ANNOUNCED,
     TVRN_SOURCE_FILE, __LINE__};
 
 class TAVRIN_TapeDrive_Provider

@@ -11,9 +11,11 @@ const EntryInfo kEntries[EP_COUNT] = {
 };
 
 int entryIdByName(const char* name) {
-    if (!name) return -1;
+    if (!name)
+        return -1;
     for (int i = 0; i < EP_COUNT; ++i)
-        if (std::strcmp(kEntries[i].name, name) == 0) return i;
+        if (std::strcmp(kEntries[i].name, name) == 0)
+            return i;
     return -1;
 }
 

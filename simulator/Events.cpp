@@ -14,8 +14,10 @@ void EventHub::setCallback(EventCallback cb) {
 
 bool EventHub::subscribe(bool dropOldEvents, const std::vector<std::string>& initial) {
     std::unique_lock<std::mutex> lock(mu_);
-    if (shutdown_) return false;
-    if (dropOldEvents) queue_.clear();
+    if (shutdown_)
+        return false;
+    if (dropOldEvents)
+        queue_.clear();
     // A thread told to stop from inside a callback may still be finishing.
     if (thread_.joinable() && threadGeneration_ != generation_) {
         if (std::this_thread::get_id() == thread_.get_id())
@@ -47,7 +49,8 @@ bool EventHub::subscribed() {
 
 bool EventHub::emit(const std::string& text) {
     std::lock_guard<std::mutex> lock(mu_);
-    if (!registered_) return false;
+    if (!registered_)
+        return false;
     queue_.push_back(text);
     cv_.notify_all();
     return true;
@@ -83,7 +86,8 @@ void EventHub::shutdown() {
 void EventHub::stopThread(std::unique_lock<std::mutex>& lock) {
     ++generation_;
     cv_.notify_all();
-    if (!thread_.joinable() || std::this_thread::get_id() == thread_.get_id()) return;
+    if (!thread_.joinable() || std::this_thread::get_id() == thread_.get_id())
+        return;
     std::thread t = std::move(thread_);
     lock.unlock();
     t.join();
@@ -93,8 +97,11 @@ void EventHub::stopThread(std::unique_lock<std::mutex>& lock) {
 void EventHub::run(std::uint64_t generation) {
     std::unique_lock<std::mutex> lock(mu_);
     for (;;) {
-        cv_.wait(lock, [&] { return generation_ != generation || (registered_ && cb_ && !queue_.empty()); });
-        if (generation_ != generation) break;
+        cv_.wait(lock, [&] {
+            return generation_ != generation || (registered_ && cb_ && !queue_.empty());
+        });
+        if (generation_ != generation)
+            break;
         std::string text = std::move(queue_.front());
         queue_.pop_front();
         EventCallback cb = cb_;

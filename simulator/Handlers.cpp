@@ -4,9 +4,9 @@
 #include <array>
 #include <cctype>
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 #include <ctime>
-#include <cstdio>
 #include <fstream>
 #include <memory>
 #include <sstream>
@@ -26,25 +26,34 @@ namespace {
 // ---------------------------------------------------------------------------
 // Request members
 
-[[noreturn]] void fail(int code, const std::string& message) { throw RequestError{code, message}; }
-
-std::string quoted(const char* name) { return std::string("\"") + name + "\""; }
-
-void requireObject(const Json::Value& req) {
-    if (!req.isObject()) fail(kBadRequest, "the request must be a JSON object");
+[[noreturn]] void fail(int code, const std::string& message) {
+    throw RequestError{code, message};
 }
 
-bool has(const Json::Value& req, const char* name) { return req.isObject() && req.isMember(name); }
+std::string quoted(const char* name) {
+    return std::string("\"") + name + "\"";
+}
+
+void requireObject(const Json::Value& req) {
+    if (!req.isObject())
+        fail(kBadRequest, "the request must be a JSON object");
+}
+
+bool has(const Json::Value& req, const char* name) {
+    return req.isObject() && req.isMember(name);
+}
 
 const Json::Value& member(const Json::Value& req, const char* name) {
     requireObject(req);
-    if (!req.isMember(name)) fail(kBadRequest, "the request has no member " + quoted(name));
+    if (!req.isMember(name))
+        fail(kBadRequest, "the request has no member " + quoted(name));
     return req[name];
 }
 
 std::string text(const Json::Value& req, const char* name) {
     const Json::Value& v = member(req, name);
-    if (!v.isString()) fail(kBadRequest, quoted(name) + " must be a string");
+    if (!v.isString())
+        fail(kBadRequest, quoted(name) + " must be a string");
     return v.asString();
 }
 
@@ -54,7 +63,9 @@ std::string key(const Json::Value& req, const char* name, Form form) {
     std::string s = text(req, name);
     bool ok = form == Form::Wwn ? isWwn(s) : form == Form::Mac ? isMac(s) : (isWwn(s) || isMac(s));
     if (!ok) {
-        const char* what = form == Form::Wwn ? "a WWN" : form == Form::Mac ? "a MAC address" : "a WWN or MAC address";
+        const char* what = form == Form::Wwn   ? "a WWN"
+                           : form == Form::Mac ? "a MAC address"
+                                               : "a WWN or MAC address";
         fail(kBadKey, quoted(name) + " is not " + what + " in colon format: " + s);
     }
     return s;
@@ -62,60 +73,73 @@ std::string key(const Json::Value& req, const char* name, Form form) {
 
 // The key of a request that names its object by "wwn" or by "mac".
 std::string wwnOrMacKey(const Json::Value& req) {
-    if (has(req, "wwn")) return key(req, "wwn", Form::Wwn);
-    if (!has(req, "mac")) fail(kBadRequest, "the request needs \"wwn\" or \"mac\"");
+    if (has(req, "wwn"))
+        return key(req, "wwn", Form::Wwn);
+    if (!has(req, "mac"))
+        fail(kBadRequest, "the request needs \"wwn\" or \"mac\"");
     return key(req, "mac", Form::Mac);
 }
 
 bool flag(const Json::Value& req, const char* name) {
     const Json::Value& v = member(req, name);
-    if (!v.isBool()) fail(kBadRequest, quoted(name) + " must be a boolean");
+    if (!v.isBool())
+        fail(kBadRequest, quoted(name) + " must be a boolean");
     return v.asBool();
 }
 
 // An integer, given as a JSON number or as decimal or 0x-prefixed text.
 long long number(const Json::Value& req, const char* name) {
     const Json::Value& v = member(req, name);
-    if (v.isIntegral()) return v.asLargestInt();
+    if (v.isIntegral())
+        return v.asLargestInt();
     if (v.isString()) {
         const std::string s = v.asString();
         char* end = nullptr;
         errno = 0;
         long long n = std::strtoll(s.c_str(), &end, 0);
-        if (!s.empty() && end && *end == '\0' && errno == 0) return n;
+        if (!s.empty() && end && *end == '\0' && errno == 0)
+            return n;
     }
     fail(kBadRequest, quoted(name) + " must be an integer");
 }
 
 const Json::Value& array(const Json::Value& req, const char* name) {
     const Json::Value& v = member(req, name);
-    if (!v.isArray()) fail(kBadRequest, quoted(name) + " must be a JSON array");
+    if (!v.isArray())
+        fail(kBadRequest, quoted(name) + " must be a JSON array");
     return v;
 }
 
 const Json::Value& object(const Json::Value& req, const char* name) {
     const Json::Value& v = member(req, name);
-    if (!v.isObject()) fail(kBadRequest, quoted(name) + " must be a JSON object");
+    if (!v.isObject())
+        fail(kBadRequest, quoted(name) + " must be a JSON object");
     return v;
 }
 
 // A diagnostic request id: text, or a number given as such.
 std::string requestId(const Json::Value& req) {
     const Json::Value& v = member(req, "requestID");
-    if (v.isString() && !v.asString().empty()) return v.asString();
-    if (v.isIntegral()) return std::to_string(v.asLargestInt());
+    if (v.isString() && !v.asString().empty())
+        return v.asString();
+    if (v.isIntegral())
+        return std::to_string(v.asLargestInt());
     fail(kBadRequest, "\"requestID\" must be a request id");
 }
 
 // Null or an object: the entry points that take no key.
 void noKeyRequest(const Json::Value& req) {
-    if (!req.isNull() && !req.isObject()) fail(kBadRequest, "the request must be null or a JSON object");
+    if (!req.isNull() && !req.isObject())
+        fail(kBadRequest, "the request must be null or a JSON object");
 }
 
-bool sameKey(const std::string& a, const std::string& b) { return lowerCase(a) == lowerCase(b); }
+bool sameKey(const std::string& a, const std::string& b) {
+    return lowerCase(a) == lowerCase(b);
+}
 
 bool sameType(const Json::Value& a, const Json::Value& b) {
-    if (a.isNumeric() && !a.isBool() && b.isNumeric() && !b.isBool()) return true;
+    if (a.isNumeric() && !a.isBool() && b.isNumeric() && !b.isBool())
+        return true;
     return a.type() == b.type();
 }
 
@@ -139,26 +163,31 @@ Json::Value ok() {
 
 int adapterExact(Call& c, const std::string& k) {
     int a = c.st.model.findAdapter(k);
-    if (a < 0) fail(kNotFound, "no adapter " + k);
+    if (a < 0)
+        fail(kNotFound, "no adapter " + k);
     return a;
 }
 
 int adapterOwning(Call& c, const std::string& k) {
     int a = c.st.model.findOwner(k);
-    if (a < 0) fail(kNotFound, "no adapter or port " + k);
+    if (a < 0)
+        fail(kNotFound, "no adapter or port " + k);
     return a;
 }
 
 Json::Value& fcPortWrapper(Call& c, const std::string& k, FcPortRef* ref = nullptr) {
     FcPortRef r;
-    if (!c.st.model.findFcPort(k, r)) fail(kNotFound, "no FC port " + k);
-    if (ref) *ref = r;
+    if (!c.st.model.findFcPort(k, r))
+        fail(kNotFound, "no FC port " + k);
+    if (ref)
+        *ref = r;
     return c.st.model.fcPort(r.a, r.p);
 }
 
 Json::Value& ethPortWrapper(Call& c, const std::string& k) {
     EthPortRef r;
-    if (!c.st.model.findEthPort(k, r)) fail(kNotFound, "no Ethernet port " + k);
+    if (!c.st.model.findEthPort(k, r))
+        fail(kNotFound, "no Ethernet port " + k);
     return c.st.model.ethPort(r.a, r.e);
 }
 
@@ -166,25 +195,31 @@ Json::Value& ethPortWrapper(Call& c, const std::string& k) {
 Json::Value& anyPortWrapper(Call& c, const std::string& k, bool* isEth = nullptr) {
     FcPortRef f;
     if (c.st.model.findFcPort(k, f)) {
-        if (isEth) *isEth = false;
+        if (isEth)
+            *isEth = false;
         return c.st.model.fcPort(f.a, f.p);
     }
     EthPortRef e;
     if (c.st.model.findEthPort(k, e)) {
-        if (isEth) *isEth = true;
+        if (isEth)
+            *isEth = true;
         return c.st.model.ethPort(e.a, e.e);
     }
     fail(kNotFound, "no port " + k);
 }
 
 // The logical port `l` of physical port `p`: the port itself or one of its virtual ports.
-Json::Value& logicalPort(Call& c, const std::string& p, const std::string& l, FcPortRef* base = nullptr) {
+Json::Value& logicalPort(Call& c, const std::string& p, const std::string& l,
+                         FcPortRef* base = nullptr) {
     FcPortRef r;
     Json::Value& port = fcPortWrapper(c, p, &r);
-    if (base) *base = r;
-    if (sameKey(port["port"]["wwn"].asString(), l)) return port;
+    if (base)
+        *base = r;
+    if (sameKey(port["port"]["wwn"].asString(), l))
+        return port;
     VPortRef v;
-    if (c.st.model.findVPort(l, v) && v.a == r.a && v.p == r.p) return c.st.model.vport(v);
+    if (c.st.model.findVPort(l, v) && v.a == r.a && v.p == r.p)
+        return c.st.model.vport(v);
     fail(kNotFound, "no logical port " + l + " on port " + p);
 }
 
@@ -192,26 +227,32 @@ Json::Value& remotePort(Call& c, const std::string& p, const std::string& l, con
     FcPortRef base;
     logicalPort(c, p, l, &base);
     for (Json::Value& rp : c.st.model.fcPort(base.a, base.p)["remotePorts"])
-        if (sameKey(rp["remotePortWwn"].asString(), r)) return rp;
+        if (sameKey(rp["remotePortWwn"].asString(), r))
+            return rp;
     fail(kNotFound, "no remote port " + r + " on port " + p);
 }
 
 // An object member of a wrapper, created with the given defaults on first use.
 Json::Value& materialize(Json::Value& holder, const char* name, const Json::Value& defaults) {
-    if (!holder[name].isObject()) holder[name] = defaults;
+    if (!holder[name].isObject())
+        holder[name] = defaults;
     return holder[name];
 }
 
 // Copies the listed members of `given` into `target`, keeping member types.
-void copyListed(Json::Value& target, const Json::Value& given, const Json::Value& names, const char* givenName) {
+void copyListed(Json::Value& target, const Json::Value& given, const Json::Value& names,
+                const char* givenName) {
     for (const Json::Value& n : names) {
-        if (!n.isString()) fail(kBadRequest, "member names must be strings");
+        if (!n.isString())
+            fail(kBadRequest, "member names must be strings");
         const std::string name = n.asString();
-        if (!given.isMember(name)) fail(kBadRequest, quoted(givenName) + " has no member " + quoted(name.c_str()));
+        if (!given.isMember(name))
+            fail(kBadRequest, quoted(givenName) + " has no member " + quoted(name.c_str()));
         if (target.isMember(name) && !sameType(target[name], given[name]))
             fail(kInvalidValue, quoted(name.c_str()) + " has the wrong JSON type");
     }
-    for (const Json::Value& n : names) target[n.asString()] = given[n.asString()];
+    for (const Json::Value& n : names)
+        target[n.asString()] = given[n.asString()];
 }
 
 // ---------------------------------------------------------------------------
@@ -220,26 +261,31 @@ void copyListed(Json::Value& target, const Json::Value& given, const Json::Value
 // Counter ids of each statistics group when the fixture lists none.
 std::vector<int> defaultIds(const std::string& group, bool fcoe) {
     if (group == "port") {
-        if (fcoe) return {1615, 1616, 1624, 1625, 1626, 1627, 1628};
+        if (fcoe)
+            return {1615, 1616, 1624, 1625, 1626, 1627, 1628};
         return {1402, 1403, 1409, 1410, 1411, 1412, 1416, 1421, 1422, 1423, 1424, 1425, 1426, 1428};
     }
-    static const char* const groups[] = {"rport", "vport", "lport", "auth", "trunking", "vhba", "vnic",
-                                         "lldp", "advIo", "iocEthernet", "qos", "fcoe", "fcpimMod",
-                                         "ethernetPort", "fcpimIop", "fcpim", "fabric", "ioc", "firmware"};
+    static const char* const groups[] = {
+        "rport",    "vport", "lport",       "auth", "trunking", "vhba",     "vnic",
+        "lldp",     "advIo", "iocEthernet", "qos",  "fcoe",     "fcpimMod", "ethernetPort",
+        "fcpimIop", "fcpim", "fabric",      "ioc",  "firmware"};
     int base = 1700;
     for (const char* g : groups) {
-        if (group == g) break;
+        if (group == g)
+            break;
         base += 100;
     }
     std::vector<int> ids;
-    for (int i = 1; i <= 6; ++i) ids.push_back(base + i);
+    for (int i = 1; i <= 6; ++i)
+        ids.push_back(base + i);
     return ids;
 }
 
 unsigned long counterValue(const std::string& seed, const std::string& group, int id) {
     unsigned long h = 2166136261ul;
     auto mix = [&h](const std::string& s) {
-        for (unsigned char ch : s) h = (h ^ ch) * 16777619ul & 0xfffffffful;
+        for (unsigned char ch : s)
+            h = (h ^ ch) * 16777619ul & 0xfffffffful;
     };
     mix(lowerCase(seed));
     mix(group);
@@ -247,9 +293,11 @@ unsigned long counterValue(const std::string& seed, const std::string& group, in
     return h % 100000;
 }
 
-Json::Value& statsGroup(Json::Value& holder, const std::string& group, const std::string& seed, bool fcoe) {
+Json::Value& statsGroup(Json::Value& holder, const std::string& group, const std::string& seed,
+                        bool fcoe) {
     Json::Value& stats = holder["statistics"];
-    if (!stats.isObject()) stats = Json::Value(Json::objectValue);
+    if (!stats.isObject())
+        stats = Json::Value(Json::objectValue);
     if (!stats.isMember(group)) {
         Json::Value list(Json::arrayValue);
         for (int id : defaultIds(group, fcoe)) {
@@ -276,7 +324,11 @@ struct StatRow {
 const StatRow kStatRows[] = {
     {EP_getPortStatistics, Scope::FcPort, {"indexStr"}, "port", false},
     {EP_getDynamicPortStatistics, Scope::FcPort, {"indexStr"}, "port", false},
-    {EP_getDynamicRPortStatistics, Scope::RPort, {"pPortWwn", "lPortWwn", "rPortWwn"}, "rport", false},
+    {EP_getDynamicRPortStatistics,
+     Scope::RPort,
+     {"pPortWwn", "lPortWwn", "rPortWwn"},
+     "rport",
+     false},
     {EP_getDynamicVPortStatistics, Scope::VPort, {"pPortWwn", "lPortWwn"}, "vport", false},
     {EP_getDynamicLogicalPortStatistics, Scope::LPort, {"pPortWwn", "lPortWwn"}, "lport", false},
     {EP_getDynamicPortAuthStatistics, Scope::FcPort, {"pPortWwn"}, "auth", false},
@@ -287,22 +339,42 @@ const StatRow kStatRows[] = {
     {EP_getDynamicLldpStatistics, Scope::EthPort, {"mac"}, "lldp", false},
     {EP_getDynamicAdvancedIoDataAtPPort, Scope::FcPort, {"pPortWwn"}, "advIo", false},
     {EP_getDynamicAdvancedIoDataAtLPort, Scope::LPort, {"pPortWwn", "lPortWwn"}, "advIo", false},
-    {EP_getDynamicAdvancedIoDataAtRPort, Scope::RPort, {"pPortWwn", "lPortWwn", "rPortWwn"}, "advIo", false},
-    {EP_getDynamicAdvancedIoDataAtLun, Scope::Lun, {"pPortWwn", "lPortWwn", "rPortWwn", "lunId"}, "advIo", false},
+    {EP_getDynamicAdvancedIoDataAtRPort,
+     Scope::RPort,
+     {"pPortWwn", "lPortWwn", "rPortWwn"},
+     "advIo",
+     false},
+    {EP_getDynamicAdvancedIoDataAtLun,
+     Scope::Lun,
+     {"pPortWwn", "lPortWwn", "rPortWwn", "lunId"},
+     "advIo",
+     false},
     {EP_getDynamicIOCEthernetStatistics, Scope::EthPort, {"mac"}, "iocEthernet", false},
     {EP_getDynamicQosStatistics, Scope::FcPort, {"pPortWwn"}, "qos", false},
     {EP_getDynamicFcoeStatistics, Scope::FcPort, {"indexStr"}, "fcoe", false},
     {EP_getDynamicFcpimModStatistics, Scope::FcPort, {"indexStr"}, "fcpimMod", false},
     {EP_getDynamicEthernetPortStatistics, Scope::EthPort, {"mac"}, "ethernetPort", false},
-    {EP_getDynamicFcpimIopStatistics, Scope::RPort, {"pPortWwn", "lPortWwn", "rPortWwn"}, "fcpimIop", false},
-    {EP_getDynamicFcpimStatistics, Scope::RPort, {"pPortWwn", "lPortWwn", "rPortWwn"}, "fcpim", false},
+    {EP_getDynamicFcpimIopStatistics,
+     Scope::RPort,
+     {"pPortWwn", "lPortWwn", "rPortWwn"},
+     "fcpimIop",
+     false},
+    {EP_getDynamicFcpimStatistics,
+     Scope::RPort,
+     {"pPortWwn", "lPortWwn", "rPortWwn"},
+     "fcpim",
+     false},
     {EP_getDynamicFabricStatistics, Scope::FcPort, {"wwn"}, "fabric", false},
     {EP_getDynamicIocStatistics, Scope::Adapter, {"pwwn"}, "ioc", false},
     {EP_getDynamicFirmwareStatistics, Scope::Adapter, {"indexStr"}, "firmware", false},
     {EP_resetStatisticsForPortAuth, Scope::FcPort, {"wwn"}, "auth", true},
     {EP_resetStatisticsForPort, Scope::FcPort, {"indexStr"}, "port", true},
     {EP_resetStatisticsForLPort, Scope::LPort, {"pwwn", "lwwn"}, "lport", true},
-    {EP_resetStatisticsForFcpim, Scope::RPort, {"pPortWwn", "lPortWwn", "rPortWwn"}, "fcpim,fcpimIop", true},
+    {EP_resetStatisticsForFcpim,
+     Scope::RPort,
+     {"pPortWwn", "lPortWwn", "rPortWwn"},
+     "fcpim,fcpimIop",
+     true},
     {EP_resetStatisticsForRPort, Scope::RPort, {"pPortWwn", "lPortWwn", "rPortWwn"}, "rport", true},
     {EP_resetStatisticsForVPort, Scope::VPort, {"pwwn", "vwwn"}, "vport", true},
     {EP_resetStatisticsForIoc, Scope::Adapter, {"pwwn"}, "ioc", true},
@@ -331,56 +403,59 @@ Json::Value& lunHolder(Json::Value& rp, const Json::Value& req, const char* lunM
     for (const Json::Value& u : rp["lunList"])
         if (u["number"].isIntegral() && u["number"].asLargestInt() == lun)
             return rp["lunStatistics"][std::to_string(lun)];
-    fail(kNotFound, "no LUN " + std::to_string(lun) + " on remote port " + rp["remotePortWwn"].asString());
+    fail(kNotFound,
+         "no LUN " + std::to_string(lun) + " on remote port " + rp["remotePortWwn"].asString());
 }
 
 StatTarget resolve(Call& c, Scope scope, const std::array<const char*, 4>& keys) {
     const Json::Value& req = c.req;
     StatTarget t;
     switch (scope) {
-    case Scope::Adapter: {
-        std::string k = key(req, keys[0], Form::Any);
-        t.holder = &c.st.model.adapter(adapterOwning(c, k));
-        t.seed = k;
-        break;
-    }
-    case Scope::FcPort: {
-        std::string k = key(req, keys[0], Form::Any);
-        t.holder = &fcPortWrapper(c, k);
-        t.fcoe = (*t.holder)["port"]["isFCoE"].asBool();
-        t.seed = k;
-        break;
-    }
-    case Scope::LPortKey: {
-        std::string k = key(req, keys[0], Form::Wwn);
-        VPortRef v;
-        t.holder = c.st.model.findVPort(k, v) ? &c.st.model.vport(v) : &fcPortWrapper(c, k);
-        t.seed = k;
-        break;
-    }
-    case Scope::EthPort: {
-        std::string k = key(req, keys[0], Form::Mac);
-        t.holder = &ethPortWrapper(c, k);
-        t.seed = k;
-        break;
-    }
-    case Scope::LPort:
-    case Scope::VPort: {
-        std::string p = key(req, keys[0], Form::Wwn), l = key(req, keys[1], Form::Wwn);
-        t.holder = &logicalPort(c, p, l);
-        if (scope == Scope::VPort && !t.holder->isMember("vportWwn")) fail(kNotFound, "no virtual port " + l);
-        t.seed = l;
-        break;
-    }
-    case Scope::RPort:
-    case Scope::Lun: {
-        std::string p = key(req, keys[0], Form::Wwn), l = key(req, keys[1], Form::Wwn);
-        std::string r = key(req, keys[2], Form::Wwn);
-        Json::Value& rp = remotePort(c, p, l, r);
-        t.holder = scope == Scope::RPort ? &rp : &lunHolder(rp, req, keys[3]);
-        t.seed = p + r + (scope == Scope::Lun ? std::to_string(number(req, keys[3])) : std::string());
-        break;
-    }
+        case Scope::Adapter: {
+            std::string k = key(req, keys[0], Form::Any);
+            t.holder = &c.st.model.adapter(adapterOwning(c, k));
+            t.seed = k;
+            break;
+        }
+        case Scope::FcPort: {
+            std::string k = key(req, keys[0], Form::Any);
+            t.holder = &fcPortWrapper(c, k);
+            t.fcoe = (*t.holder)["port"]["isFCoE"].asBool();
+            t.seed = k;
+            break;
+        }
+        case Scope::LPortKey: {
+            std::string k = key(req, keys[0], Form::Wwn);
+            VPortRef v;
+            t.holder = c.st.model.findVPort(k, v) ? &c.st.model.vport(v) : &fcPortWrapper(c, k);
+            t.seed = k;
+            break;
+        }
+        case Scope::EthPort: {
+            std::string k = key(req, keys[0], Form::Mac);
+            t.holder = &ethPortWrapper(c, k);
+            t.seed = k;
+            break;
+        }
+        case Scope::LPort:
+        case Scope::VPort: {
+            std::string p = key(req, keys[0], Form::Wwn), l = key(req, keys[1], Form::Wwn);
+            t.holder = &logicalPort(c, p, l);
+            if (scope == Scope::VPort && !t.holder->isMember("vportWwn"))
+                fail(kNotFound, "no virtual port " + l);
+            t.seed = l;
+            break;
+        }
+        case Scope::RPort:
+        case Scope::Lun: {
+            std::string p = key(req, keys[0], Form::Wwn), l = key(req, keys[1], Form::Wwn);
+            std::string r = key(req, keys[2], Form::Wwn);
+            Json::Value& rp = remotePort(c, p, l, r);
+            t.holder = scope == Scope::RPort ? &rp : &lunHolder(rp, req, keys[3]);
+            t.seed = p + r +
+                     (scope == Scope::Lun ? std::to_string(number(req, keys[3])) : std::string());
+            break;
+        }
     }
     return t;
 }
@@ -388,15 +463,19 @@ StatTarget resolve(Call& c, Scope scope, const std::array<const char*, 4>& keys)
 Json::Value statistics(Call& c) {
     const StatRow* row = nullptr;
     for (const StatRow& r : kStatRows)
-        if (r.id == c.id) row = &r;
+        if (r.id == c.id)
+            row = &r;
     StatTarget t = resolve(c, row->scope, row->keys);
     std::stringstream groups(row->groups);
     std::string group;
     while (std::getline(groups, group, ',')) {
-        if (group == "fcoe" && !t.fcoe) fail(kInvalidState, "not an FCoE port");
+        if (group == "fcoe" && !t.fcoe)
+            fail(kInvalidState, "not an FCoE port");
         Json::Value& list = statsGroup(*t.holder, group, t.seed, t.fcoe);
-        if (!row->reset) return list;
-        for (Json::Value& e : list) e["value"] = "0";
+        if (!row->reset)
+            return list;
+        for (Json::Value& e : list)
+            e["value"] = "0";
     }
     return ok();
 }
@@ -406,8 +485,9 @@ Json::Value statistics(Call& c) {
 
 Json::Value initHbaLib(Call& c) {
     const long long app = number(c.req, "appId");
-    c.log(2, __FILE__, __LINE__, "library initialised for application " + std::to_string(app) + ": " +
-                           std::to_string(c.st.model.adapterCount()) + " adapter(s)");
+    c.log(2, __FILE__, __LINE__,
+          "library initialised for application " + std::to_string(app) + ": " +
+              std::to_string(c.st.model.adapterCount()) + " adapter(s)");
     Json::Value r(Json::objectValue);
     r["result"] = c.st.initResult;
     return r;
@@ -417,7 +497,8 @@ Json::Value getAllAdaptersIndexString(Call& c) {
     noKeyRequest(c.req);
     Json::Value r(Json::objectValue);
     r["indexStrings"] = Json::Value(Json::arrayValue);
-    for (int a = 0; a < c.st.model.adapterCount(); ++a) r["indexStrings"].append(c.st.model.adapterKey(a));
+    for (int a = 0; a < c.st.model.adapterCount(); ++a)
+        r["indexStrings"].append(c.st.model.adapterKey(a));
     return r;
 }
 
@@ -457,7 +538,8 @@ Json::Value getHost(Call& c) {
 
 Json::Value getServerTime(Call& c) {
     const Json::Value& fixed = c.st.model.root()["serverTime"];
-    if (fixed.isObject()) return fixed;
+    if (fixed.isObject())
+        return fixed;
     Json::Value r(Json::objectValue);
     r["serverTime"] = static_cast<Json::Int64>(std::time(nullptr));
     return r;
@@ -465,7 +547,8 @@ Json::Value getServerTime(Call& c) {
 
 Json::Value getDriverUpdateStatus(Call& c) {
     const Json::Value& fixed = c.st.model.root()["driverUpdateStatus"];
-    if (fixed.isObject()) return fixed;
+    if (fixed.isObject())
+        return fixed;
     Json::Value r(Json::objectValue);
     r["status"] = 0;
     r["inProgress"] = false;
@@ -492,7 +575,8 @@ Json::Value getGlobalInfo(Call& c) {
         g["ethPort"] = eths.size() > 0;
         const Json::ArrayIndex n = std::max(fcs.size(), eths.size());
         g["numOfPorts"] = n;
-        for (const char* list : {"portHasFc", "portWwn", "portHasEth", "portMac", "portHasFcoe", "fcoeMac"})
+        for (const char* list :
+             {"portHasFc", "portWwn", "portHasEth", "portMac", "portHasFcoe", "fcoeMac"})
             g[list] = Json::Value(Json::arrayValue);
         for (Json::ArrayIndex j = 0; j < n; ++j) {
             const bool hasFc = j < fcs.size(), hasEth = j < eths.size();
@@ -532,10 +616,13 @@ Json::Value setPortByWwn(Call& c) {
     Json::Value& port = w["port"];
     copyListed(port, given, names, "port");
     for (const Json::Value& n : names) {
-        if (n.asString() != "portStatus") continue;
-        const Json::Value state = port["portStatus"].asBool() ? w["enabledStatusValue"] : Json::Value(10);
+        if (n.asString() != "portStatus")
+            continue;
+        const Json::Value state =
+            port["portStatus"].asBool() ? w["enabledStatusValue"] : Json::Value(10);
         port["portStatusValue"] = state;
-        if (isEth) w["ethData"]["ethPortStateMOFValue"] = state;
+        if (isEth)
+            w["ethData"]["ethPortStateMOFValue"] = state;
     }
     Json::Value r = ok();
     r["port"] = port;
@@ -544,13 +631,15 @@ Json::Value setPortByWwn(Call& c) {
 
 Json::Value getOpticsSFP(Call& c) {
     Json::Value& w = anyPortWrapper(c, key(c.req, "indexStr", Form::Any));
-    if (!w["sfp"].isObject()) fail(kNotFound, "no optic in port " + c.req["indexStr"].asString());
+    if (!w["sfp"].isObject())
+        fail(kNotFound, "no optic in port " + c.req["indexStr"].asString());
     return w["sfp"];
 }
 
 Json::Value getOpticsPOM(Call& c) {
     Json::Value& w = anyPortWrapper(c, key(c.req, "portWwn", Form::Any));
-    if (!w["sfp"].isObject()) fail(kNotFound, "no optic in port " + c.req["portWwn"].asString());
+    if (!w["sfp"].isObject())
+        fail(kNotFound, "no optic in port " + c.req["portWwn"].asString());
     Json::Value d(Json::objectValue);
     d["temperature"] = "34.5";
     d["voltage"] = "3.31";
@@ -588,7 +677,8 @@ Json::Value setFcByFcWwn(Call& c) {
 
 Json::Value& fcoeData(Call& c, const std::string& k) {
     Json::Value& w = fcPortWrapper(c, k);
-    if (!w["port"]["isFCoE"].asBool()) fail(kInvalidState, "not an FCoE port: " + k);
+    if (!w["port"]["isFCoE"].asBool())
+        fail(kInvalidState, "not an FCoE port: " + k);
     Json::Value d(Json::objectValue);
     d["wwn"] = w["port"]["wwn"];
     d["fcoeMac"] = w["port"].get("fcoeMac", "");
@@ -597,7 +687,9 @@ Json::Value& fcoeData(Call& c, const std::string& k) {
     return materialize(w, "fcoe", d);
 }
 
-Json::Value getFcoeByPort(Call& c) { return fcoeData(c, key(c.req, "indexStr", Form::Any)); }
+Json::Value getFcoeByPort(Call& c) {
+    return fcoeData(c, key(c.req, "indexStr", Form::Any));
+}
 
 Json::Value setFcoeByPort(Call& c) {
     Json::Value& fcoe = fcoeData(c, key(c.req, "indexStr", Form::Any));
@@ -638,17 +730,20 @@ Json::Value authDefaults() {
 }
 
 Json::Value getPortAuthentication(Call& c) {
-    return materialize(fcPortWrapper(c, key(c.req, "wwn", Form::Wwn)), "authentication", authDefaults());
+    return materialize(fcPortWrapper(c, key(c.req, "wwn", Form::Wwn)), "authentication",
+                       authDefaults());
 }
 
 Json::Value setPortAuthentication(Call& c) {
-    Json::Value& auth = materialize(fcPortWrapper(c, key(c.req, "pPortWwn", Form::Wwn)), "authentication", authDefaults());
+    Json::Value& auth = materialize(fcPortWrapper(c, key(c.req, "pPortWwn", Form::Wwn)),
+                                    "authentication", authDefaults());
     const Json::Value& given = object(c.req, "portAuth");
     for (const std::string& name : given.getMemberNames()) {
         if (auth.isMember(name) && !sameType(auth[name], given[name]))
             fail(kInvalidValue, quoted(name.c_str()) + " has the wrong JSON type");
     }
-    for (const std::string& name : given.getMemberNames()) auth[name] = given[name];
+    for (const std::string& name : given.getMemberNames())
+        auth[name] = given[name];
     Json::Value r = ok();
     r["portAuth"] = auth;
     return r;
@@ -717,11 +812,13 @@ Json::Value getAllRemotePorts(Call& c) {
     std::string p = key(c.req, "pPortWwn", Form::Wwn), l = key(c.req, "lPortWwn", Form::Wwn);
     Json::Value& lport = logicalPort(c, p, l);
     Json::Value r(Json::arrayValue);
-    if (lport.isMember("vportWwn")) return r;  // virtual ports see no remote ports here
+    if (lport.isMember("vportWwn"))
+        return r;  // virtual ports see no remote ports here
     for (const Json::Value& rp : lport["remotePorts"]) {
         Json::Value s(Json::objectValue);
         s["remotePortWwn"] = rp["remotePortWwn"];
-        if (rp.isMember("remoteNodeWwn")) s["remoteNodeWwn"] = rp["remoteNodeWwn"];
+        if (rp.isMember("remoteNodeWwn"))
+            s["remoteNodeWwn"] = rp["remoteNodeWwn"];
         s["isTarget"] = rp["deviceData"]["isTarget"];
         r.append(s);
     }
@@ -729,13 +826,15 @@ Json::Value getAllRemotePorts(Call& c) {
 }
 
 Json::Value getCompleteRemotePort(Call& c) {
-    return stripped(remotePort(c, key(c.req, "pPortWwn", Form::Wwn), key(c.req, "lPortWwn", Form::Wwn),
+    return stripped(remotePort(c, key(c.req, "pPortWwn", Form::Wwn),
+                               key(c.req, "lPortWwn", Form::Wwn),
                                key(c.req, "rPortWwn", Form::Wwn)));
 }
 
 Json::Value getAllLunsByRemotePort(Call& c) {
-    Json::Value& rp = remotePort(c, key(c.req, "pPortWwn", Form::Wwn), key(c.req, "lPortWwn", Form::Wwn),
-                                 key(c.req, "rPortWwn", Form::Wwn));
+    Json::Value& rp =
+        remotePort(c, key(c.req, "pPortWwn", Form::Wwn), key(c.req, "lPortWwn", Form::Wwn),
+                   key(c.req, "rPortWwn", Form::Wwn));
     Json::Value r(Json::objectValue);
     r["lunList"] = rp.isMember("lunList") ? rp["lunList"] : Json::Value(Json::arrayValue);
     return r;
@@ -749,7 +848,8 @@ Json::Value lunMaskDefaults() {
 }
 
 Json::Value getLunMaskData(Call& c) {
-    return materialize(fcPortWrapper(c, key(c.req, "indexStr", Form::Any)), "lunMask", lunMaskDefaults());
+    return materialize(fcPortWrapper(c, key(c.req, "indexStr", Form::Any)), "lunMask",
+                       lunMaskDefaults());
 }
 
 // Adds the objects of `added` missing from `list` and removes those of `removed`.
@@ -757,27 +857,35 @@ void editList(Json::Value& list, const Json::Value* removed, const Json::Value* 
     for (const Json::Value* l : {removed, added})
         if (l)
             for (const Json::Value& e : *l)
-                if (!e.isObject()) fail(kBadRequest, "list entries must be JSON objects");
+                if (!e.isObject())
+                    fail(kBadRequest, "list entries must be JSON objects");
     Json::Value next(Json::arrayValue);
     for (const Json::Value& e : list) {
         bool drop = false;
         if (removed)
-            for (const Json::Value& x : *removed) drop = drop || x == e;
-        if (!drop) next.append(e);
+            for (const Json::Value& x : *removed)
+                drop = drop || x == e;
+        if (!drop)
+            next.append(e);
     }
     if (added)
         for (const Json::Value& x : *added) {
             bool present = false;
-            for (const Json::Value& e : next) present = present || x == e;
-            if (!present) next.append(x);
+            for (const Json::Value& e : next)
+                present = present || x == e;
+            if (!present)
+                next.append(x);
         }
     list = next;
 }
 
 Json::Value setLunMaskData(Call& c) {
-    Json::Value& mask = materialize(fcPortWrapper(c, key(c.req, "indexStr", Form::Any)), "lunMask", lunMaskDefaults());
-    const Json::Value* removed = has(c.req, "removedLunMaskData") ? &array(c.req, "removedLunMaskData") : nullptr;
-    const Json::Value* added = has(c.req, "addedLunMaskData") ? &array(c.req, "addedLunMaskData") : nullptr;
+    Json::Value& mask = materialize(fcPortWrapper(c, key(c.req, "indexStr", Form::Any)), "lunMask",
+                                    lunMaskDefaults());
+    const Json::Value* removed =
+        has(c.req, "removedLunMaskData") ? &array(c.req, "removedLunMaskData") : nullptr;
+    const Json::Value* added =
+        has(c.req, "addedLunMaskData") ? &array(c.req, "addedLunMaskData") : nullptr;
     const bool clear = has(c.req, "clearLunMaskData") && flag(c.req, "clearLunMaskData");
     Json::Value list = clear ? Json::Value(Json::arrayValue) : mask["lunMaskData"];
     editList(list, removed, added);
@@ -802,8 +910,10 @@ Json::Value setAdapterState(Call& c) {
 
 Json::Value& advAdapterData(Json::Value& ad) {
     Json::Value& adv = ad["advAdapterData"];
-    if (!adv.isMember("trunkingEnabled")) adv["trunkingEnabled"] = false;
-    if (!adv.isMember("adapterMode")) adv["adapterMode"] = ad["hbaData"].isMember("hbaMAC") ? "CNA" : "HBA";
+    if (!adv.isMember("trunkingEnabled"))
+        adv["trunkingEnabled"] = false;
+    if (!adv.isMember("adapterMode"))
+        adv["adapterMode"] = ad["hbaData"].isMember("hbaMAC") ? "CNA" : "HBA";
     return adv;
 }
 
@@ -812,9 +922,11 @@ Json::Value getAdvAdapterData(Call& c) {
 }
 
 Json::Value setAdapterMode(Call& c) {
-    Json::Value& adv = advAdapterData(c.st.model.adapter(adapterExact(c, key(c.req, "indexStr", Form::Any))));
+    Json::Value& adv =
+        advAdapterData(c.st.model.adapter(adapterExact(c, key(c.req, "indexStr", Form::Any))));
     const Json::Value& mode = member(c.req, "adapterMode");
-    if (!mode.isString() && !mode.isIntegral()) fail(kBadRequest, "\"adapterMode\" must be text or an integer");
+    if (!mode.isString() && !mode.isIntegral())
+        fail(kBadRequest, "\"adapterMode\" must be text or an integer");
     adv["adapterMode"] = mode;
     Json::Value r = ok();
     r["adapterMode"] = mode;
@@ -835,7 +947,8 @@ Json::Value setFcTrunkingState(Call& c) {
 // The key of an alias object: "indexStr", "wwn" or "mac", whichever it has.
 std::string aliasKey(Call& c) {
     for (const char* name : {"indexStr", "wwn", "mac"})
-        if (has(c.req, name)) return key(c.req, name, Form::Any);
+        if (has(c.req, name))
+            return key(c.req, name, Form::Any);
     fail(kBadRequest, "the alias object needs \"indexStr\", \"wwn\" or \"mac\"");
 }
 
@@ -887,7 +1000,8 @@ Json::Value getAdapterPciFnData(Call& c) {
         }
     }
     for (const Json::Value& ep : ad["ethPorts"])
-        for (const Json::Value& v : ep["vnics"]) fns.append(v);
+        for (const Json::Value& v : ep["vnics"])
+            fns.append(v);
     Json::Value r(Json::objectValue);
     r["pciFunctions"] = fns;
     return r;
@@ -901,12 +1015,15 @@ Json::Value createVport(Call& c) {
     Json::Value& w = fcPortWrapper(c, key(c.req, "pwwn", Form::Wwn), &base);
     const std::string vwwn = key(c.req, "vwwn", Form::Wwn);
     const std::string nwwn = key(c.req, "nwwn", Form::Wwn);
-    if (c.st.model.wwnInUse(vwwn)) fail(kInvalidValue, "WWN already in use: " + vwwn);
+    if (c.st.model.wwnInUse(vwwn))
+        fail(kInvalidValue, "WWN already in use: " + vwwn);
     Json::Value v(Json::objectValue);
     v["vportWwn"] = vwwn;
     v["nodeWwn"] = nwwn;
-    v["symbolicName"] = has(c.req, "symbolicName") ? Json::Value(text(c.req, "symbolicName")) : Json::Value("");
-    v["vfId"] = has(c.req, "vfId") ? Json::Value(static_cast<Json::Int64>(number(c.req, "vfId"))) : Json::Value(0);
+    v["symbolicName"] =
+        has(c.req, "symbolicName") ? Json::Value(text(c.req, "symbolicName")) : Json::Value("");
+    v["vfId"] = has(c.req, "vfId") ? Json::Value(static_cast<Json::Int64>(number(c.req, "vfId")))
+                                   : Json::Value(0);
     v["state"] = w["port"]["portStatusValue"].asInt() == 2 ? "Online" : "Offline";
     w["vports"].append(v);
     c.st.model.reindex();
@@ -921,18 +1038,24 @@ Json::Value deleteVport(Call& c) {
     std::vector<std::string> gone;
     for (const Json::Value& e : list) {
         std::string k;
-        if (e.isString()) k = e.asString();
+        if (e.isString())
+            k = e.asString();
         for (const char* name : {"vportWwn", "vwwn", "wwn"})
-            if (k.empty() && e.isObject() && e[name].isString()) k = e[name].asString();
-        if (!isWwn(k)) fail(kBadKey, "\"vportArray\" entries must be virtual port WWNs in colon format");
+            if (k.empty() && e.isObject() && e[name].isString())
+                k = e[name].asString();
+        if (!isWwn(k))
+            fail(kBadKey, "\"vportArray\" entries must be virtual port WWNs in colon format");
         bool found = false;
-        for (const Json::Value& v : w["vports"]) found = found || sameKey(v["vportWwn"].asString(), k);
-        if (!found) fail(kNotFound, "no virtual port " + k + " on port " + w["port"]["wwn"].asString());
+        for (const Json::Value& v : w["vports"])
+            found = found || sameKey(v["vportWwn"].asString(), k);
+        if (!found)
+            fail(kNotFound, "no virtual port " + k + " on port " + w["port"]["wwn"].asString());
         gone.push_back(lowerCase(k));
     }
     Json::Value kept(Json::arrayValue);
     for (const Json::Value& v : w["vports"])
-        if (std::find(gone.begin(), gone.end(), lowerCase(v["vportWwn"].asString())) == gone.end()) kept.append(v);
+        if (std::find(gone.begin(), gone.end(), lowerCase(v["vportWwn"].asString())) == gone.end())
+            kept.append(v);
     w["vports"] = kept;
     c.st.model.reindex();
     Json::Value r = ok();
@@ -944,14 +1067,16 @@ Json::Value getAllVPorts(Call& c) {
     Json::Value& w = fcPortWrapper(c, key(c.req, "wwn", Form::Wwn));
     Json::Value r(Json::objectValue);
     r["vports"] = Json::Value(Json::arrayValue);
-    for (const Json::Value& v : w["vports"]) r["vports"].append(stripped(v));
+    for (const Json::Value& v : w["vports"])
+        r["vports"].append(stripped(v));
     return r;
 }
 
 Json::Value getVPort(Call& c) {
     std::string p = key(c.req, "pPortWwn", Form::Wwn), l = key(c.req, "lPortWwn", Form::Wwn);
     Json::Value& v = logicalPort(c, p, l);
-    if (!v.isMember("vportWwn")) fail(kNotFound, "no virtual port " + l);
+    if (!v.isMember("vportWwn"))
+        fail(kNotFound, "no virtual port " + l);
     return stripped(v);
 }
 
@@ -963,13 +1088,15 @@ void checkBandwidth(long long minBw, long long maxBw) {
 Json::Value createvNIC(Call& c) {
     EthPortRef ref;
     const std::string mac = key(c.req, "mac", Form::Mac);
-    if (!c.st.model.findEthPort(mac, ref)) fail(kNotFound, "no Ethernet port " + mac);
+    if (!c.st.model.findEthPort(mac, ref))
+        fail(kNotFound, "no Ethernet port " + mac);
     const long long minBw = number(c.req, "minBandwidth"), maxBw = number(c.req, "maxBandwidth");
     checkBandwidth(minBw, maxBw);
     Json::Value& ad = c.st.model.adapter(ref.a);
     int next = 0;
     for (const Json::Value& ep : ad["ethPorts"])
-        for (const Json::Value& v : ep["vnics"]) next = std::max(next, v["pciFunctionIndex"].asInt() + 1);
+        for (const Json::Value& v : ep["vnics"])
+            next = std::max(next, v["pciFunctionIndex"].asInt() + 1);
     next = std::max<int>(next, 16);
     Json::Value v(Json::objectValue);
     v["pciFunctionIndex"] = next;
@@ -987,21 +1114,26 @@ Json::Value createvNIC(Call& c) {
 }
 
 Json::Value& vnicByIndex(Json::Value& ep, const Json::Value& index) {
-    if (!index.isIntegral()) fail(kBadRequest, "\"pciFunctionIndex\" must be an integer");
+    if (!index.isIntegral())
+        fail(kBadRequest, "\"pciFunctionIndex\" must be an integer");
     for (Json::Value& v : ep["vnics"])
-        if (v["pciFunctionIndex"].asLargestInt() == index.asLargestInt()) return v;
+        if (v["pciFunctionIndex"].asLargestInt() == index.asLargestInt())
+            return v;
     fail(kNotFound, "no vNIC with PCI function " + std::to_string(index.asLargestInt()));
 }
 
 Json::Value deletevNICs(Call& c) {
     Json::Value& ep = ethPortWrapper(c, key(c.req, "mac", Form::Mac));
     const Json::Value& list = array(c.req, "pciFunctionIndices");
-    for (const Json::Value& i : list) vnicByIndex(ep, i);
+    for (const Json::Value& i : list)
+        vnicByIndex(ep, i);
     Json::Value kept(Json::arrayValue);
     for (const Json::Value& v : ep["vnics"]) {
         bool drop = false;
-        for (const Json::Value& i : list) drop = drop || v["pciFunctionIndex"].asLargestInt() == i.asLargestInt();
-        if (!drop) kept.append(v);
+        for (const Json::Value& i : list)
+            drop = drop || v["pciFunctionIndex"].asLargestInt() == i.asLargestInt();
+        if (!drop)
+            kept.append(v);
     }
     ep["vnics"] = kept;
     Json::Value r = ok();
@@ -1016,10 +1148,13 @@ Json::Value modifyvNIC(Call& c) {
     Json::Value work(Json::objectValue);
     work["vnics"] = ep["vnics"];
     for (const Json::Value& m : list) {
-        if (!m.isObject()) fail(kBadRequest, "\"vNICs\" entries must be JSON objects");
+        if (!m.isObject())
+            fail(kBadRequest, "\"vNICs\" entries must be JSON objects");
         Json::Value& v = vnicByIndex(work, m["pciFunctionIndex"]);
-        long long minBw = has(m, "minBandwidth") ? number(m, "minBandwidth") : v["minBandwidth"].asLargestInt();
-        long long maxBw = has(m, "maxBandwidth") ? number(m, "maxBandwidth") : v["maxBandwidth"].asLargestInt();
+        long long minBw =
+            has(m, "minBandwidth") ? number(m, "minBandwidth") : v["minBandwidth"].asLargestInt();
+        long long maxBw =
+            has(m, "maxBandwidth") ? number(m, "maxBandwidth") : v["maxBandwidth"].asLargestInt();
         checkBandwidth(minBw, maxBw);
         v["minBandwidth"] = static_cast<Json::Int64>(minBw);
         v["maxBandwidth"] = static_cast<Json::Int64>(maxBw);
@@ -1035,9 +1170,11 @@ Json::Value modifyvNIC(Call& c) {
 
 Json::Value setAdvIoProfile(Call& c) {
     Json::Value& w = fcPortWrapper(c, key(c.req, "indexStr", Form::Any));
-    const bool hasAdded = has(c.req, "addedAdvancedIoProfiles"), hasRemoved = has(c.req, "removedAdvancedIoProfiles");
+    const bool hasAdded = has(c.req, "addedAdvancedIoProfiles"),
+               hasRemoved = has(c.req, "removedAdvancedIoProfiles");
     if (!hasAdded && !hasRemoved)
-        fail(kBadRequest, "the request needs \"addedAdvancedIoProfiles\" or \"removedAdvancedIoProfiles\"");
+        fail(kBadRequest,
+             "the request needs \"addedAdvancedIoProfiles\" or \"removedAdvancedIoProfiles\"");
     Json::Value list = w["advIoProfiles"];
     editList(list, hasRemoved ? &array(c.req, "removedAdvancedIoProfiles") : nullptr,
              hasAdded ? &array(c.req, "addedAdvancedIoProfiles") : nullptr);
@@ -1057,8 +1194,10 @@ Json::Value clearAdvIoProfile(Call& c) {
     Json::Value& w = fcPortWrapper(c, key(c.req, "indexStr", Form::Any));
     std::vector<std::pair<std::string, std::string>> scope;
     for (const char* name : {"lPortWwn", "rPortWwn"})
-        if (has(c.req, name)) scope.emplace_back(name, key(c.req, name, Form::Wwn));
-    if (has(c.req, "lunId")) scope.emplace_back("lunId", std::to_string(number(c.req, "lunId")));
+        if (has(c.req, name))
+            scope.emplace_back(name, key(c.req, name, Form::Wwn));
+    if (has(c.req, "lunId"))
+        scope.emplace_back("lunId", std::to_string(number(c.req, "lunId")));
     Json::Value kept(Json::arrayValue);
     unsigned removed = 0;
     for (const Json::Value& p : w["advIoProfiles"]) {
@@ -1097,7 +1236,8 @@ Json::Value resetDataForAdvIoProf(Call& c) {
                 holders.push_back(&lunHolder(rp, c.req, "lunId"));
             } else {
                 const long long first = number(c.req, "lunId"), last = number(c.req, "endLunRange");
-                if (first > last) fail(kInvalidValue, "\"lunId\" is after \"endLunRange\"");
+                if (first > last)
+                    fail(kInvalidValue, "\"lunId\" is after \"endLunRange\"");
                 for (const Json::Value& u : rp["lunList"]) {
                     long long n = u["number"].asLargestInt();
                     if (u["number"].isIntegral() && n >= first && n <= last)
@@ -1107,7 +1247,8 @@ Json::Value resetDataForAdvIoProf(Call& c) {
         }
     }
     for (Json::Value* h : holders)
-        for (Json::Value& e : statsGroup(*h, "advIo", p, false)) e["value"] = "0";
+        for (Json::Value& e : statsGroup(*h, "advIo", p, false))
+            e["value"] = "0";
     return ok();
 }
 
@@ -1118,7 +1259,8 @@ Json::Value outcome(const Json::Value& defaults, const Json::Value& holder, cons
     Json::Value r = defaults;
     const Json::Value& given = holder["diagnostics"][test];
     if (given.isObject())
-        for (const std::string& name : given.getMemberNames()) r[name] = given[name];
+        for (const std::string& name : given.getMemberNames())
+            r[name] = given[name];
     return r;
 }
 
@@ -1127,7 +1269,9 @@ Json::Value diagMemoryTest(Call& c) {
     Json::Value d(Json::objectValue);
     d["failed"] = false;
     d["status"] = 0;
-    for (const char* n : {"address", "expected value", "actual value", "error status", "error address"}) d[n] = 0;
+    for (const char* n :
+         {"address", "expected value", "actual value", "error status", "error address"})
+        d[n] = 0;
     d["type"] = "march";
     d["output"] = "Memory test passed";
     return outcome(d, ad, "MemoryTest");
@@ -1139,8 +1283,10 @@ Json::Value loopback(Call& c, bool eth) {
     const long long frames = number(c.req, "frameCount");
     number(c.req, "mode");
     number(c.req, "dataPattern");
-    if (!eth) number(c.req, "speed");
-    if (frames < 0) fail(kInvalidValue, "\"frameCount\" must not be negative");
+    if (!eth)
+        number(c.req, "speed");
+    if (frames < 0)
+        fail(kInvalidValue, "\"frameCount\" must not be negative");
     Json::Value d(Json::objectValue);
     d["failed"] = false;
     d["outstandingFrames"] = 0;
@@ -1152,8 +1298,12 @@ Json::Value loopback(Call& c, bool eth) {
     return outcome(d, w, eth ? "EthLoopbackTest" : "LoopbackTest");
 }
 
-Json::Value diagLoopbackTest(Call& c) { return loopback(c, false); }
-Json::Value diagEthLoopbackTest(Call& c) { return loopback(c, true); }
+Json::Value diagLoopbackTest(Call& c) {
+    return loopback(c, false);
+}
+Json::Value diagEthLoopbackTest(Call& c) {
+    return loopback(c, true);
+}
 
 Json::Value diagPCILoopbackTest(Call& c) {
     Json::Value& w = anyPortWrapper(c, key(c.req, "portWwn", Form::Any));
@@ -1165,9 +1315,9 @@ Json::Value diagPCILoopbackTest(Call& c) {
     return outcome(d, w, "PCILoopbackTest");
 }
 
-const char* const kTestFunctions[] = {"QuickTest", "MemoryTest", "QueueTest", "PCILoopbackTest",
-                                      "DPortTest", "LEDTest", "LoopbackTest", "EthLoopbackTest",
-                                      "EchoTest", "FCPingTest", "FCTraceTest"};
+const char* const kTestFunctions[] = {"QuickTest", "MemoryTest", "QueueTest",    "PCILoopbackTest",
+                                      "DPortTest", "LEDTest",    "LoopbackTest", "EthLoopbackTest",
+                                      "EchoTest",  "FCPingTest", "FCTraceTest"};
 
 Json::Value postDiagnostics(Call& c) {
     const std::string function = text(c.req, "function");
@@ -1175,12 +1325,16 @@ Json::Value postDiagnostics(Call& c) {
                      [&](const char* f) { return function == f; }))
         fail(kInvalidValue, "unknown test function " + function);
     const std::string id = requestId(c.req);
-    if (has(c.req, "hbaWwn")) adapterExact(c, key(c.req, "hbaWwn", Form::Any));
-    if (has(c.req, "portWwn")) anyPortWrapper(c, key(c.req, "portWwn", Form::Any));
+    if (has(c.req, "hbaWwn"))
+        adapterExact(c, key(c.req, "hbaWwn", Form::Any));
+    if (has(c.req, "portWwn"))
+        anyPortWrapper(c, key(c.req, "portWwn", Form::Any));
     for (const char* name : {"localPortWwn", "remotePortWwn"})
-        if (has(c.req, name)) key(c.req, name, Form::Wwn);
+        if (has(c.req, name))
+            key(c.req, name, Form::Wwn);
     DiagRequest& dr = c.st.diagRequests[id];
-    if (dr.state != "posted") fail(kInvalidState, "tests of request " + id + " were already started");
+    if (dr.state != "posted")
+        fail(kInvalidState, "tests of request " + id + " were already started");
     Json::Value t(Json::objectValue);
     t["function"] = function;
     t["request"] = c.req;
@@ -1194,7 +1348,8 @@ Json::Value postDiagnostics(Call& c) {
 
 DiagRequest& diagRequest(Call& c, const std::string& id) {
     auto it = c.st.diagRequests.find(id);
-    if (it == c.st.diagRequests.end()) fail(kNotFound, "no diagnostic request " + id);
+    if (it == c.st.diagRequests.end())
+        fail(kNotFound, "no diagnostic request " + id);
     DiagRequest& dr = it->second;
     if (dr.state == "running" &&
         std::chrono::steady_clock::now() - dr.started >= std::chrono::milliseconds(dr.durationMs))
@@ -1206,7 +1361,8 @@ Json::Value startTests(Call& c) {
     const std::string id = requestId(c.req);
     const bool stopOnError = flag(c.req, "stopOnError");
     DiagRequest& dr = diagRequest(c, id);
-    if (dr.state != "posted") fail(kInvalidState, "tests of request " + id + " were already started");
+    if (dr.state != "posted")
+        fail(kInvalidState, "tests of request " + id + " were already started");
     dr.stopOnError = stopOnError;
     for (const Json::Value& t : dr.tests) {
         const std::string function = t["function"].asString();
@@ -1225,9 +1381,11 @@ Json::Value startTests(Call& c) {
         else if (c.st.model.findEthPort(port, e))
             res = outcome(d, c.st.model.ethPort(e.a, e.e), function.c_str());
         else if (c.st.model.findAdapter(req.get("hbaWwn", "").asString()) >= 0)
-            res = outcome(d, c.st.model.adapter(c.st.model.findAdapter(req["hbaWwn"].asString())), function.c_str());
+            res = outcome(d, c.st.model.adapter(c.st.model.findAdapter(req["hbaWwn"].asString())),
+                          function.c_str());
         dr.results.append(res);
-        if (stopOnError && res["failed"].asBool()) break;
+        if (stopOnError && res["failed"].asBool())
+            break;
     }
     dr.started = std::chrono::steady_clock::now();
     dr.durationMs = c.st.model.root().get("diagnosticDurationMs", 0).asInt();
@@ -1252,7 +1410,8 @@ Json::Value getDiagnosticsResults(Call& c) {
 Json::Value cancelTests(Call& c) {
     const std::string id = requestId(c.req);
     DiagRequest& dr = diagRequest(c, id);
-    if (dr.state == "completed") fail(kInvalidState, "tests of request " + id + " have completed");
+    if (dr.state == "completed")
+        fail(kInvalidState, "tests of request " + id + " have completed");
     dr.state = "cancelled";
     Json::Value r = ok();
     r["requestID"] = id;
@@ -1311,13 +1470,15 @@ Json::Value adapterUpdateFlash(Call& c) {
     std::string version, bios;
     int status = 0;
     std::string message = "Flash update successful";
-    if (reader->parse(content.data(), content.data() + content.size(), &image, nullptr) && image.isObject()) {
+    if (reader->parse(content.data(), content.data() + content.size(), &image, nullptr) &&
+        image.isObject()) {
         version = image.get("version", "").asString();
         bios = image.get("biosVersion", "").asString();
         status = image.get("status", 0).asInt();
         message = image.get("message", status == 0 ? message : "flash update failed").asString();
     } else {
-        std::string base = file.substr(file.find_last_of('/') == std::string::npos ? 0 : file.find_last_of('/') + 1);
+        std::string base = file.substr(
+            file.find_last_of('/') == std::string::npos ? 0 : file.find_last_of('/') + 1);
         version = base.substr(0, base.find_last_of('.'));
     }
     if (status == 0 && version.empty()) {
@@ -1326,12 +1487,15 @@ Json::Value adapterUpdateFlash(Call& c) {
     }
     r["status"] = status;
     r["message"] = message;
-    if (status != 0) return r;
+    if (status != 0)
+        return r;
     ad["firmware"]["version"] = version;
-    if (!bios.empty()) ad["firmware"]["biosVersion"] = bios;
+    if (!bios.empty())
+        ad["firmware"]["biosVersion"] = bios;
     ad["flash"]["flashStatus"] = true;
     r["firmwareVersion"] = version;
-    c.log(2, __FILE__, __LINE__, "adapter " + k + " flashed with firmware " + version + " from " + file);
+    c.log(2, __FILE__, __LINE__,
+          "adapter " + k + " flashed with firmware " + version + " from " + file);
     return r;
 }
 
@@ -1415,9 +1579,11 @@ const HandlerRow kHandlers[] = {
 
 Handler handlerFor(EntryId id) {
     for (const HandlerRow& row : kHandlers)
-        if (row.id == id) return row.handler;
+        if (row.id == id)
+            return row.handler;
     for (const StatRow& row : kStatRows)
-        if (row.id == id) return statistics;
+        if (row.id == id)
+            return statistics;
     return nullptr;
 }
 

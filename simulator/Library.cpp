@@ -40,30 +40,44 @@ struct KindName {
     int kind;
 };
 const KindName kKindNames[] = {
-    {"null", TVRN_SIM_FAULT_NULL_ANSWER},          {"error", TVRN_SIM_FAULT_ERROR_OBJECT},
-    {"hbaAgentError", TVRN_SIM_FAULT_HBA_AGENT_ERROR}, {"stdException", TVRN_SIM_FAULT_STD_EXCEPTION},
-    {"nonStandardException", TVRN_SIM_FAULT_NON_STANDARD}, {"dropMember", TVRN_SIM_FAULT_DROP_MEMBER},
-    {"wrongType", TVRN_SIM_FAULT_WRONG_TYPE}, {"delay", TVRN_SIM_FAULT_DELAY},
+    {"null", TVRN_SIM_FAULT_NULL_ANSWER},
+    {"error", TVRN_SIM_FAULT_ERROR_OBJECT},
+    {"hbaAgentError", TVRN_SIM_FAULT_HBA_AGENT_ERROR},
+    {"stdException", TVRN_SIM_FAULT_STD_EXCEPTION},
+    {"nonStandardException", TVRN_SIM_FAULT_NON_STANDARD},
+    {"dropMember", TVRN_SIM_FAULT_DROP_MEMBER},
+    {"wrongType", TVRN_SIM_FAULT_WRONG_TYPE},
+    {"delay", TVRN_SIM_FAULT_DELAY},
 };
 
-bool isMemberFault(int kind) { return kind == TVRN_SIM_FAULT_DROP_MEMBER || kind == TVRN_SIM_FAULT_WRONG_TYPE; }
+bool isMemberFault(int kind) {
+    return kind == TVRN_SIM_FAULT_DROP_MEMBER || kind == TVRN_SIM_FAULT_WRONG_TYPE;
+}
 
 bool validFault(int id, int kind, int code, const std::string& text) {
-    if (id < 0 || kEntries[id].kind != EntryKind::JSON) return false;
-    if (kind < TVRN_SIM_FAULT_NULL_ANSWER || kind > TVRN_SIM_FAULT_DELAY) return false;
-    if (isMemberFault(kind) && text.empty()) return false;
-    if (kind == TVRN_SIM_FAULT_DELAY && (code < 0 || code > kMaxDelayMs)) return false;
+    if (id < 0 || kEntries[id].kind != EntryKind::JSON)
+        return false;
+    if (kind < TVRN_SIM_FAULT_NULL_ANSWER || kind > TVRN_SIM_FAULT_DELAY)
+        return false;
+    if (isMemberFault(kind) && text.empty())
+        return false;
+    if (kind == TVRN_SIM_FAULT_DELAY && (code < 0 || code > kMaxDelayMs))
+        return false;
     return true;
 }
 
 // "default" and "default.json" name the built-in host.
-bool isBuiltinName(const std::string& name) { return name == "default" || name == "default.json"; }
+bool isBuiltinName(const std::string& name) {
+    return name == "default" || name == "default.json";
+}
 
 // The faults a fixture lists: [{"entryPoint", "kind", "key", "code", "text", "times"}].
 std::vector<Fault> parseFaults(const Json::Value& list) {
     std::vector<Fault> out;
-    if (list.isNull()) return out;
-    if (!list.isArray()) throw FixtureError("faults: must be a JSON array");
+    if (list.isNull())
+        return out;
+    if (!list.isArray())
+        throw FixtureError("faults: must be a JSON array");
     for (Json::ArrayIndex i = 0; i < list.size(); ++i) {
         const Json::Value& f = list[i];
         const std::string where = "faults[" + std::to_string(i) + "]";
@@ -71,18 +85,29 @@ std::vector<Fault> parseFaults(const Json::Value& list) {
             throw FixtureError(where + ": needs \"entryPoint\" and \"kind\" texts");
         int kind = 0;
         for (const KindName& k : kKindNames)
-            if (f["kind"].asString() == k.name) kind = k.kind;
-        if ((f.isMember("key") && !f["key"].isString()) || (f.isMember("text") && !f["text"].isString()) ||
-            (f.isMember("code") && !f["code"].isIntegral()) || (f.isMember("times") && !f["times"].isIntegral()) ||
+            if (f["kind"].asString() == k.name)
+                kind = k.kind;
+        if ((f.isMember("key") && !f["key"].isString()) ||
+            (f.isMember("text") && !f["text"].isString()) ||
+            (f.isMember("code") && !f["code"].isIntegral()) ||
+            (f.isMember("times") && !f["times"].isIntegral()) ||
             (f.isMember("skip") && !f["skip"].isIntegral()))
-            throw FixtureError(where + ": \"key\" and \"text\" are texts, \"code\", \"times\" and \"skip\" integers");
-        Fault fault{entryIdByName(f["entryPoint"].asCString()), lowerCase(f.get("key", "").asString()), kind,
-                    f.get("code", 0).asInt(), f.get("text", "").asString(), f.get("times", 0).asInt(),
+            throw FixtureError(
+                where +
+                ": \"key\" and \"text\" are texts, \"code\", \"times\" and \"skip\" integers");
+        Fault fault{entryIdByName(f["entryPoint"].asCString()),
+                    lowerCase(f.get("key", "").asString()),
+                    kind,
+                    f.get("code", 0).asInt(),
+                    f.get("text", "").asString(),
+                    f.get("times", 0).asInt(),
                     f.get("skip", 0).asInt()};
         if (!validFault(fault.entry, kind, fault.code, fault.text) || fault.skip < 0)
-            throw FixtureError(where + ": unknown JSON entry point or fault kind, a member fault without \"text\","
-                                       " a delay \"code\" that is not 0 to 600000 milliseconds, or a negative"
-                                       " \"skip\"");
+            throw FixtureError(
+                where +
+                ": unknown JSON entry point or fault kind, a member fault without \"text\","
+                " a delay \"code\" that is not 0 to 600000 milliseconds, or a negative"
+                " \"skip\"");
         out.push_back(fault);
     }
     return out;
@@ -108,9 +133,13 @@ Library& Library::instance() {
     return *lib;
 }
 
-Library* Library::existing() { return gInstance.load(); }
+Library* Library::existing() {
+    return gInstance.load();
+}
 
-void Library::shutdown() { events_.shutdown(); }
+void Library::shutdown() {
+    events_.shutdown();
+}
 
 // ---------------------------------------------------------------------------
 // Entry points
@@ -132,22 +161,16 @@ Json::Value Library::callJson(EntryId id, const Json::Value& request) {
     const bool faulted = takeFault(id, request, fault);
     if (faulted) {
         switch (fault.kind) {
-        case TVRN_SIM_FAULT_NULL_ANSWER:
-            return Json::Value();
-        case TVRN_SIM_FAULT_ERROR_OBJECT:
-            return errorAnswer(fault.code, fault.text);
-        case TVRN_SIM_FAULT_HBA_AGENT_ERROR:
-            throw CPTA::HbaAgentError(fault.code, fault.text);
-        case TVRN_SIM_FAULT_STD_EXCEPTION:
-            throw std::runtime_error(fault.text);
-        case TVRN_SIM_FAULT_NON_STANDARD:
-            throw fault.code;
-        case TVRN_SIM_FAULT_DELAY:
-            // Outside every lock: other calls go on meanwhile.
-            std::this_thread::sleep_for(std::chrono::milliseconds(fault.code));
-            break;
-        default:
-            break;
+            case TVRN_SIM_FAULT_NULL_ANSWER: return Json::Value();
+            case TVRN_SIM_FAULT_ERROR_OBJECT: return errorAnswer(fault.code, fault.text);
+            case TVRN_SIM_FAULT_HBA_AGENT_ERROR: throw CPTA::HbaAgentError(fault.code, fault.text);
+            case TVRN_SIM_FAULT_STD_EXCEPTION: throw std::runtime_error(fault.text);
+            case TVRN_SIM_FAULT_NON_STANDARD: throw fault.code;
+            case TVRN_SIM_FAULT_DELAY:
+                // Outside every lock: other calls go on meanwhile.
+                std::this_thread::sleep_for(std::chrono::milliseconds(fault.code));
+                break;
+            default: break;
         }
     }
     Json::Value answer;
@@ -177,10 +200,12 @@ Json::Value Library::callJson(EntryId id, const Json::Value& request) {
 }
 
 Json::Value Library::registerForEvents(const Json::Value& request) {
-    if (!request.isNull() && !request.isObject()) return errorAnswer(kBadRequest, "the request must be a JSON object");
+    if (!request.isNull() && !request.isObject())
+        return errorAnswer(kBadRequest, "the request must be a JSON object");
     bool drop = false;
     if (request.isObject() && request.isMember("dropOldEvents")) {
-        if (!request["dropOldEvents"].isBool()) return errorAnswer(kBadRequest, "\"dropOldEvents\" must be a boolean");
+        if (!request["dropOldEvents"].isBool())
+            return errorAnswer(kBadRequest, "\"dropOldEvents\" must be a boolean");
         drop = request["dropOldEvents"].asBool();
     }
     std::vector<std::string> initial;
@@ -189,7 +214,8 @@ Json::Value Library::registerForEvents(const Json::Value& request) {
         for (const Json::Value& e : state_.model.root()["events"])
             initial.push_back(e.isString() ? e.asString() : compact(e));
     }
-    if (!events_.subscribe(drop, initial)) return errorAnswer(kInvalidState, "the library is shutting down");
+    if (!events_.subscribe(drop, initial))
+        return errorAnswer(kInvalidState, "the library is shutting down");
     log({LogLine{1, __FILE__, __LINE__, "client registered for events"}});
     Json::Value r(Json::objectValue);
     r["status"] = 0;
@@ -197,7 +223,8 @@ Json::Value Library::registerForEvents(const Json::Value& request) {
 }
 
 Json::Value Library::unregisterForEvents(const Json::Value& request) {
-    if (!request.isNull() && !request.isObject()) return errorAnswer(kBadRequest, "the request must be a JSON object");
+    if (!request.isNull() && !request.isObject())
+        return errorAnswer(kBadRequest, "the request must be a JSON object");
     events_.unsubscribe();
     log({LogLine{1, __FILE__, __LINE__, "client unregistered from events"}});
     Json::Value r(Json::objectValue);
@@ -226,29 +253,35 @@ const char* Library::version() {
     return version_;
 }
 
-void Library::setEventCallback(EventCallback cb) { events_.setCallback(cb); }
+void Library::setEventCallback(EventCallback cb) {
+    events_.setCallback(cb);
+}
 
 void Library::setLogCallback(LogCallback cb) {
     logCb_.store(cb);
     std::vector<LogLine> pending;
     {
         std::lock_guard<std::mutex> lock(mu_);
-        if (cb) pending.swap(pendingLogs_);
+        if (cb)
+            pending.swap(pendingLogs_);
     }
     log(std::move(pending));
 }
 
 void Library::log(std::vector<LogLine> lines) {
-    if (lines.empty()) return;
+    if (lines.empty())
+        return;
     LogCallback cb = logCb_.load();
     if (!cb) {
         // Warnings and errors wait for a callback; the rest is dropped.
         std::lock_guard<std::mutex> lock(mu_);
         for (LogLine& l : lines)
-            if (l.level >= 3 && pendingLogs_.size() < kMaxPendingLogs) pendingLogs_.push_back(std::move(l));
+            if (l.level >= 3 && pendingLogs_.size() < kMaxPendingLogs)
+                pendingLogs_.push_back(std::move(l));
         return;
     }
-    for (const LogLine& l : lines) cb(l.level, baseName(l.file), l.line, l.text.c_str());
+    for (const LogLine& l : lines)
+        cb(l.level, baseName(l.file), l.line, l.text.c_str());
 }
 
 // ---------------------------------------------------------------------------
@@ -273,8 +306,10 @@ int Library::loadFixture(const char* nameOrPath) {
     if (wanted.find('/') == std::string::npos) {
         path = fixtureDir() + "/" + wanted;
         struct stat sb;
-        const bool hasSuffix = wanted.size() > 5 && wanted.compare(wanted.size() - 5, 5, ".json") == 0;
-        if (stat(path.c_str(), &sb) != 0 && !hasSuffix) path += ".json";
+        const bool hasSuffix =
+            wanted.size() > 5 && wanted.compare(wanted.size() - 5, 5, ".json") == 0;
+        if (stat(path.c_str(), &sb) != 0 && !hasSuffix)
+            path += ".json";
     }
     std::ifstream in(path, std::ios::binary);
     if (!in) {
@@ -304,11 +339,13 @@ int Library::loadFixtureText(const std::string& text, const std::string& source)
         faults = parseFaults(fixture["faults"]);
         if (fixture.isMember("version")) {
             const Json::Value& v = fixture["version"];
-            if (!v.isNull() && !v.isString()) throw FixtureError("version: must be text or null");
+            if (!v.isNull() && !v.isString())
+                throw FixtureError("version: must be text or null");
             versionText = v.isNull() ? nullptr : v.asCString();
         }
         if (fixture.isMember("initResult")) {
-            if (!fixture["initResult"].isInt()) throw FixtureError("initResult: must be an integer");
+            if (!fixture["initResult"].isInt())
+                throw FixtureError("initResult: must be an integer");
             initResult = fixture["initResult"].asInt();
         }
     } catch (const FixtureError& e) {
@@ -358,7 +395,9 @@ std::string Library::lastError() {
     return lastError_;
 }
 
-const char* Library::intern(const std::string& text) { return versions_.insert(text).first->c_str(); }
+const char* Library::intern(const std::string& text) {
+    return versions_.insert(text).first->c_str();
+}
 
 void Library::setVersion(const char* text) {
     std::lock_guard<std::mutex> lock(mu_);
@@ -373,11 +412,12 @@ void Library::setInitResult(int result) {
 // ---------------------------------------------------------------------------
 // Faults and counters
 
-int Library::setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times,
-                      int skip) {
+int Library::setFault(const char* entryPoint, const char* key, int kind, int code, const char* text,
+                      int times, int skip) {
     const int id = entryIdByName(entryPoint);
     const std::string t = text ? text : "";
-    if (!validFault(id, kind, code, t) || skip < 0) return -1;
+    if (!validFault(id, kind, code, t) || skip < 0)
+        return -1;
     std::lock_guard<std::mutex> lock(mu_);
     faults_.push_back(Fault{id, lowerCase(key ? key : ""), kind, code, t, times, skip});
     return 0;
@@ -390,29 +430,36 @@ void Library::clearFaults() {
 
 bool Library::takeFault(EntryId id, const Json::Value& request, Fault& out) {
     std::lock_guard<std::mutex> lock(mu_);
-    if (faults_.empty()) return false;
+    if (faults_.empty())
+        return false;
     auto keyed = [&request](const std::string& key) {
-        if (!request.isObject()) return false;
+        if (!request.isObject())
+            return false;
         for (const std::string& name : request.getMemberNames())
-            if (request[name].isString() && lowerCase(request[name].asString()) == key) return true;
+            if (request[name].isString() && lowerCase(request[name].asString()) == key)
+                return true;
         return false;
     };
     auto chosen = faults_.end();
     for (auto it = faults_.begin(); it != faults_.end(); ++it) {
-        if (it->entry != id) continue;
+        if (it->entry != id)
+            continue;
         if (!it->key.empty() && keyed(it->key)) {
             chosen = it;
             break;
         }
-        if (it->key.empty() && chosen == faults_.end()) chosen = it;
+        if (it->key.empty() && chosen == faults_.end())
+            chosen = it;
     }
-    if (chosen == faults_.end()) return false;
+    if (chosen == faults_.end())
+        return false;
     if (chosen->skip > 0) {
         --chosen->skip;
         return false;
     }
     out = *chosen;
-    if (chosen->remaining > 0 && --chosen->remaining == 0) faults_.erase(chosen);
+    if (chosen->remaining > 0 && --chosen->remaining == 0)
+        faults_.erase(chosen);
     return true;
 }
 
@@ -423,12 +470,14 @@ std::uint64_t Library::callCount(const char* entryPoint) {
 
 std::uint64_t Library::totalCalls() {
     std::uint64_t sum = 0;
-    for (const auto& c : counters_) sum += c.load(std::memory_order_relaxed);
+    for (const auto& c : counters_)
+        sum += c.load(std::memory_order_relaxed);
     return sum;
 }
 
 void Library::resetCounters() {
-    for (auto& c : counters_) c.store(0, std::memory_order_relaxed);
+    for (auto& c : counters_)
+        c.store(0, std::memory_order_relaxed);
 }
 
 std::string Library::recordedCalls() {
@@ -460,10 +509,13 @@ void Library::clearRecording() {
 void applyMemberFault(Json::Value& answer, const std::string& path, bool drop) {
     std::vector<std::string> parts;
     std::stringstream ss(path);
-    for (std::string part; std::getline(ss, part, '.');) parts.push_back(part);
-    if (parts.empty()) return;
+    for (std::string part; std::getline(ss, part, '.');)
+        parts.push_back(part);
+    if (parts.empty())
+        return;
     auto index = [](const std::string& s, Json::ArrayIndex& out) {
-        if (s.empty() || s.find_first_not_of("0123456789") != std::string::npos) return false;
+        if (s.empty() || s.find_first_not_of("0123456789") != std::string::npos)
+            return false;
         out = static_cast<Json::ArrayIndex>(std::stoul(s));
         return true;
     };
@@ -475,7 +527,8 @@ void applyMemberFault(Json::Value& answer, const std::string& path, bool drop) {
             next = &(*cur)[n];
         else if (cur->isObject() && cur->isMember(parts[i]))
             next = &(*cur)[parts[i]];
-        if (!next) return;
+        if (!next)
+            return;
         if (i + 1 < parts.size()) {
             cur = next;
             continue;

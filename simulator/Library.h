@@ -60,8 +60,8 @@ public:
     static std::string fixtureDir();
     void setVersion(const char* text);
     void setInitResult(int result);
-    int setFault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times,
-                 int skip = 0);
+    int setFault(const char* entryPoint, const char* key, int kind, int code, const char* text,
+                 int times, int skip = 0);
     void clearFaults();
     std::uint64_t callCount(const char* entryPoint);
     std::uint64_t totalCalls();

@@ -20,12 +20,26 @@ struct FixtureError : std::runtime_error {
 std::string lowerCase(std::string s);
 // Pairs of hexadecimal digits separated by colons: 8 pairs for a WWN, 6 for a MAC.
 bool isColonKey(const std::string& s, int pairs);
-inline bool isWwn(const std::string& s) { return isColonKey(s, 8); }
-inline bool isMac(const std::string& s) { return isColonKey(s, 6); }
+inline bool isWwn(const std::string& s) {
+    return isColonKey(s, 8);
+}
+inline bool isMac(const std::string& s) {
+    return isColonKey(s, 6);
+}
 
-struct FcPortRef { int a = -1; int p = -1; };
-struct EthPortRef { int a = -1; int e = -1; };
-struct VPortRef { int a = -1; int p = -1; int v = -1; };
+struct FcPortRef {
+    int a = -1;
+    int p = -1;
+};
+struct EthPortRef {
+    int a = -1;
+    int e = -1;
+};
+struct VPortRef {
+    int a = -1;
+    int p = -1;
+    int v = -1;
+};
 
 class Model {
 public:
@@ -41,7 +55,9 @@ public:
     Json::Value& adapter(int a) { return root_["adapters"][Json::ArrayIndex(a)]; }
     Json::Value& fcPort(int a, int p) { return adapter(a)["fcPorts"][Json::ArrayIndex(p)]; }
     Json::Value& ethPort(int a, int e) { return adapter(a)["ethPorts"][Json::ArrayIndex(e)]; }
-    Json::Value& vport(const VPortRef& r) { return fcPort(r.a, r.p)["vports"][Json::ArrayIndex(r.v)]; }
+    Json::Value& vport(const VPortRef& r) {
+        return fcPort(r.a, r.p)["vports"][Json::ArrayIndex(r.v)];
+    }
 
     int adapterCount() const { return static_cast<int>(root_["adapters"].size()); }
     // The index string of an adapter: its MAC for a CNA, else its WWN.

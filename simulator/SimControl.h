@@ -52,12 +52,13 @@ void tvrn_sim_set_init_result(int result);
  * the fault is gone; otherwise it stays until cleared. Returns 0, or -1 for an
  * unknown or non-JSON entry point, an unknown kind, a member fault without
  * `text`, or a delay outside 0 to 600000 milliseconds. */
-int tvrn_sim_set_fault(const char* entryPoint, const char* key, int kind, int code, const char* text, int times);
+int tvrn_sim_set_fault(const char* entryPoint, const char* key, int kind, int code,
+                       const char* text, int times);
 /* The same, but the first `skip` calls the fault would fire for are answered
  * as usual (and do not count against `times`): with skip 1 and times 1 it
  * fires on the second matching call only. -1 also for a negative `skip`. */
-int tvrn_sim_set_fault_after(const char* entryPoint, const char* key, int kind, int code, const char* text,
-                             int skip, int times);
+int tvrn_sim_set_fault_after(const char* entryPoint, const char* key, int kind, int code,
+                             const char* text, int skip, int times);
 void tvrn_sim_clear_faults(void);
 
 /* Calls of one entry point (any kind) since the last counter reset; 0 for an

@@ -28,17 +28,28 @@ using tvrne2e::Module_Session;
 namespace {
 
 const char* const kAssociations[] = {
-    "TAVRIN_AdapterElementSoftwareIdentity", "TAVRIN_AssociatedAlarm",
-    "TAVRIN_ControlledBy",                   "TAVRIN_DeviceSAPImplementation",
-    "TAVRIN_ElementStatisticalData",         "TAVRIN_EthernetPortControlledBy",
-    "TAVRIN_EthernetPortRealizes",           "TAVRIN_EthernetPortSystemDevice",
-    "TAVRIN_FCPortSystemDevice",             "TAVRIN_HostedAccessPoint",
-    "TAVRIN_HostedCollection",               "TAVRIN_HostedDependency",
-    "TAVRIN_HostedLANEndpoint",              "TAVRIN_InstalledSoftwareIdentity",
-    "TAVRIN_LANEndpointDeviceSAPImplementation", "TAVRIN_MemberOfCollection",
-    "TAVRIN_PhysicalConnectorContainer",     "TAVRIN_PortControllerSystemDevice",
-    "TAVRIN_ProductElementComponent",        "TAVRIN_ProductPhysicalComponent",
-    "TAVRIN_Realizes",                       "TAVRIN_StorageResourcesSystemDevice",
+    "TAVRIN_AdapterElementSoftwareIdentity",
+    "TAVRIN_AssociatedAlarm",
+    "TAVRIN_ControlledBy",
+    "TAVRIN_DeviceSAPImplementation",
+    "TAVRIN_ElementStatisticalData",
+    "TAVRIN_EthernetPortControlledBy",
+    "TAVRIN_EthernetPortRealizes",
+    "TAVRIN_EthernetPortSystemDevice",
+    "TAVRIN_FCPortSystemDevice",
+    "TAVRIN_HostedAccessPoint",
+    "TAVRIN_HostedCollection",
+    "TAVRIN_HostedDependency",
+    "TAVRIN_HostedLANEndpoint",
+    "TAVRIN_InstalledSoftwareIdentity",
+    "TAVRIN_LANEndpointDeviceSAPImplementation",
+    "TAVRIN_MemberOfCollection",
+    "TAVRIN_PhysicalConnectorContainer",
+    "TAVRIN_PortControllerSystemDevice",
+    "TAVRIN_ProductElementComponent",
+    "TAVRIN_ProductPhysicalComponent",
+    "TAVRIN_Realizes",
+    "TAVRIN_StorageResourcesSystemDevice",
     "TAVRIN_SCSIInitiatorTargetLogicalUnitPath",
 };
 
@@ -94,8 +105,8 @@ void enumerate(benchmark::State& state, const San* san, const char* association)
 }
 
 void printSummary() {
-    std::printf("\n%-42s %10s %12s %10s %12s %7s\n", "association", "small", "us/instance",
-                "large", "us/instance", "ratio");
+    std::printf("\n%-42s %10s %12s %10s %12s %7s\n", "association", "small", "us/instance", "large",
+                "us/instance", "ratio");
     for (const auto& a : gResults) {
         auto small = a.second.find("small"), large = a.second.find("large");
         if (small == a.second.end() || large == a.second.end())
@@ -117,8 +128,8 @@ int main(int argc, char** argv) {
     for (const San& san : kSans)
         for (const char* association : kAssociations)
             benchmark::RegisterBenchmark(
-                (std::string("enumerate/") + san.name + "/" + association).c_str(), enumerate,
-                &san, association)
+                (std::string("enumerate/") + san.name + "/" + association).c_str(), enumerate, &san,
+                association)
                 ->Unit(benchmark::kMillisecond);
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();

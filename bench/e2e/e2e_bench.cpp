@@ -25,12 +25,14 @@ using tvrne2e::Module_Session;
 namespace {
 
 const char* const kClasses[] = {
-    "TAVRIN_ComputerSystem",   "TAVRIN_PortController",   "TAVRIN_FCPort",
-    "TAVRIN_SCSIProtocolEndpoint", "TAVRIN_FCPortStatistics", "TAVRIN_PhysicalPackage",
-    "TAVRIN_Product",          "TAVRIN_AdapterSoftwareIdentity", "TAVRIN_StorageExtent",
-    "TAVRIN_TapeDrive",        "TAVRIN_EthernetPort",     "TAVRIN_LogicalPortGroup",
-    "TAVRIN_LANEndpoint",      "TAVRIN_PhysicalConnector", "TAVRIN_AlarmDevice",
-    "TAVRIN_LogicalDisk",
+    "TAVRIN_ComputerSystem",   "TAVRIN_PortController",
+    "TAVRIN_FCPort",           "TAVRIN_SCSIProtocolEndpoint",
+    "TAVRIN_FCPortStatistics", "TAVRIN_PhysicalPackage",
+    "TAVRIN_Product",          "TAVRIN_AdapterSoftwareIdentity",
+    "TAVRIN_StorageExtent",    "TAVRIN_TapeDrive",
+    "TAVRIN_EthernetPort",     "TAVRIN_LogicalPortGroup",
+    "TAVRIN_LANEndpoint",      "TAVRIN_PhysicalConnector",
+    "TAVRIN_AlarmDevice",      "TAVRIN_LogicalDisk",
 };
 
 Module_Session* gSession = nullptr;

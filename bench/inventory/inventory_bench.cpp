@@ -34,14 +34,22 @@ struct ClassCase {
 };
 
 const ClassCase kClasses[] = {
-    {CID_COMPUTER_SYSTEM, false},  {CID_PORT_CONTROLLER, false},
-    {CID_FC_PORT, false},          {CID_SCSI_PROTOCOL_ENDPOINT, false},
-    {CID_FC_PORT_STATISTICS, false}, {CID_PHYSICAL_PACKAGE, false},
-    {CID_PRODUCT, false},          {CID_ADAPTER_SOFTWARE_IDENTITY, false},
-    {CID_ETHERNET_PORT, false},    {CID_LOGICAL_PORT_GROUP, false},
-    {CID_LAN_ENDPOINT, false},     {CID_PHYSICAL_CONNECTOR, false},
-    {CID_ALARM_DEVICE, false},     {CID_STORAGE_EXTENT, true},
-    {CID_TAPE_DRIVE, true},        {CID_LOGICAL_DISK, true},
+    {CID_COMPUTER_SYSTEM, false},
+    {CID_PORT_CONTROLLER, false},
+    {CID_FC_PORT, false},
+    {CID_SCSI_PROTOCOL_ENDPOINT, false},
+    {CID_FC_PORT_STATISTICS, false},
+    {CID_PHYSICAL_PACKAGE, false},
+    {CID_PRODUCT, false},
+    {CID_ADAPTER_SOFTWARE_IDENTITY, false},
+    {CID_ETHERNET_PORT, false},
+    {CID_LOGICAL_PORT_GROUP, false},
+    {CID_LAN_ENDPOINT, false},
+    {CID_PHYSICAL_CONNECTOR, false},
+    {CID_ALARM_DEVICE, false},
+    {CID_STORAGE_EXTENT, true},
+    {CID_TAPE_DRIVE, true},
+    {CID_LOGICAL_DISK, true},
 };
 
 int gHostLookups = 0;
@@ -49,7 +57,9 @@ int countingHostName(char* name, size_t length) {
     gHostLookups++;
     return ::gethostname(name, length);
 }
-int systemDomainName(char* name, size_t length) { return ::getdomainname(name, length); }
+int systemDomainName(char* name, size_t length) {
+    return ::getdomainname(name, length);
+}
 bool fixedAddress(const char*, std::vector<std::string>& addresses) {
     addresses = {"192.0.2.10"};
     return true;

@@ -40,117 +40,117 @@ extern "C" {
  * meant to be tested with #ifdef.
  */
 #ifdef CMPI_VERSION
-#  if (CMPI_VERSION == 200)
-#    define CMPI_VER_200 1
-#  elif (CMPI_VERSION == 100)
-#    define CMPI_VER_100 1
-#  elif (CMPI_VERSION == 90)
-#    define CMPI_VER_90 1
-#  elif (CMPI_VERSION == 87)
-#    define CMPI_VER_87 1
-#  elif (CMPI_VERSION == 86)
-#    define CMPI_VER_86 1
-#  elif (CMPI_VERSION == 85)
-#    define CMPI_VER_85 1
-#  elif (CMPI_VERSION == 80)
-#    define CMPI_VER_80 1
-#  else
-#    error "Unsupported CMPI_VERSION (use 80, 85, 86, 87, 90, 100 or 200)"
-#  endif
+#if (CMPI_VERSION == 200)
+#define CMPI_VER_200 1
+#elif (CMPI_VERSION == 100)
+#define CMPI_VER_100 1
+#elif (CMPI_VERSION == 90)
+#define CMPI_VER_90 1
+#elif (CMPI_VERSION == 87)
+#define CMPI_VER_87 1
+#elif (CMPI_VERSION == 86)
+#define CMPI_VER_86 1
+#elif (CMPI_VERSION == 85)
+#define CMPI_VER_85 1
+#elif (CMPI_VERSION == 80)
+#define CMPI_VER_80 1
 #else
-#  define CMPI_VER_200
+#error "Unsupported CMPI_VERSION (use 80, 85, 86, 87, 90, 100 or 200)"
+#endif
+#else
+#define CMPI_VER_200
 #endif
 
 #if defined(CMPI_VER_200) || defined(CMPI_VER_ALL)
-#  ifndef CMPI_VER_200
-#    define CMPI_VER_200
-#  endif
-#  ifndef CMPI_VER_100
-#    define CMPI_VER_100
-#  endif
-#  ifndef CMPI_VER_90
-#    define CMPI_VER_90
-#  endif
-#  ifndef CMPI_VER_87
-#    define CMPI_VER_87
-#  endif
-#  ifndef CMPI_VER_86
-#    define CMPI_VER_86
-#  endif
-#  ifndef CMPI_VER_85
-#    define CMPI_VER_85
-#  endif
-#  ifndef CMPI_VER_80
-#    define CMPI_VER_80
-#  endif
-#  define CMPICurrentVersion CMPIVersion200
+#ifndef CMPI_VER_200
+#define CMPI_VER_200
+#endif
+#ifndef CMPI_VER_100
+#define CMPI_VER_100
+#endif
+#ifndef CMPI_VER_90
+#define CMPI_VER_90
+#endif
+#ifndef CMPI_VER_87
+#define CMPI_VER_87
+#endif
+#ifndef CMPI_VER_86
+#define CMPI_VER_86
+#endif
+#ifndef CMPI_VER_85
+#define CMPI_VER_85
+#endif
+#ifndef CMPI_VER_80
+#define CMPI_VER_80
+#endif
+#define CMPICurrentVersion CMPIVersion200
 #elif defined(CMPI_VER_100)
-#  ifndef CMPI_VER_90
-#    define CMPI_VER_90
-#  endif
-#  ifndef CMPI_VER_87
-#    define CMPI_VER_87
-#  endif
-#  ifndef CMPI_VER_86
-#    define CMPI_VER_86
-#  endif
-#  ifndef CMPI_VER_85
-#    define CMPI_VER_85
-#  endif
-#  ifndef CMPI_VER_80
-#    define CMPI_VER_80
-#  endif
-#  define CMPICurrentVersion CMPIVersion100
+#ifndef CMPI_VER_90
+#define CMPI_VER_90
+#endif
+#ifndef CMPI_VER_87
+#define CMPI_VER_87
+#endif
+#ifndef CMPI_VER_86
+#define CMPI_VER_86
+#endif
+#ifndef CMPI_VER_85
+#define CMPI_VER_85
+#endif
+#ifndef CMPI_VER_80
+#define CMPI_VER_80
+#endif
+#define CMPICurrentVersion CMPIVersion100
 #elif defined(CMPI_VER_90)
-#  ifndef CMPI_VER_87
-#    define CMPI_VER_87
-#  endif
-#  ifndef CMPI_VER_86
-#    define CMPI_VER_86
-#  endif
-#  ifndef CMPI_VER_85
-#    define CMPI_VER_85
-#  endif
-#  ifndef CMPI_VER_80
-#    define CMPI_VER_80
-#  endif
-#  define CMPICurrentVersion CMPIVersion090
+#ifndef CMPI_VER_87
+#define CMPI_VER_87
+#endif
+#ifndef CMPI_VER_86
+#define CMPI_VER_86
+#endif
+#ifndef CMPI_VER_85
+#define CMPI_VER_85
+#endif
+#ifndef CMPI_VER_80
+#define CMPI_VER_80
+#endif
+#define CMPICurrentVersion CMPIVersion090
 #elif defined(CMPI_VER_87)
-#  ifndef CMPI_VER_86
-#    define CMPI_VER_86
-#  endif
-#  ifndef CMPI_VER_85
-#    define CMPI_VER_85
-#  endif
-#  ifndef CMPI_VER_80
-#    define CMPI_VER_80
-#  endif
-#  define CMPICurrentVersion CMPIVersion087
+#ifndef CMPI_VER_86
+#define CMPI_VER_86
+#endif
+#ifndef CMPI_VER_85
+#define CMPI_VER_85
+#endif
+#ifndef CMPI_VER_80
+#define CMPI_VER_80
+#endif
+#define CMPICurrentVersion CMPIVersion087
 #elif defined(CMPI_VER_86)
-#  ifndef CMPI_VER_85
-#    define CMPI_VER_85
-#  endif
-#  ifndef CMPI_VER_80
-#    define CMPI_VER_80
-#  endif
-#  define CMPICurrentVersion CMPIVersion086
+#ifndef CMPI_VER_85
+#define CMPI_VER_85
+#endif
+#ifndef CMPI_VER_80
+#define CMPI_VER_80
+#endif
+#define CMPICurrentVersion CMPIVersion086
 #elif defined(CMPI_VER_85)
-#  ifndef CMPI_VER_80
-#    define CMPI_VER_80
-#  endif
-#  define CMPICurrentVersion CMPIVersion085
+#ifndef CMPI_VER_80
+#define CMPI_VER_80
+#endif
+#define CMPICurrentVersion CMPIVersion085
 #elif defined(CMPI_VER_80)
-#  define CMPICurrentVersion CMPIVersion080
+#define CMPICurrentVersion CMPIVersion080
 #else
 /* No level could be determined: fall back to the full interface. */
-#  define CMPI_VER_200
-#  define CMPI_VER_100
-#  define CMPI_VER_90
-#  define CMPI_VER_87
-#  define CMPI_VER_86
-#  define CMPI_VER_85
-#  define CMPI_VER_80
-#  define CMPICurrentVersion CMPIVersion200
+#define CMPI_VER_200
+#define CMPI_VER_100
+#define CMPI_VER_90
+#define CMPI_VER_87
+#define CMPI_VER_86
+#define CMPI_VER_85
+#define CMPI_VER_80
+#define CMPICurrentVersion CMPIVersion200
 #endif
 
 /* ------------------------------------------------------------------------
@@ -388,19 +388,19 @@ typedef unsigned short CMPIType;
 #define CMPI_nameString (CMPI_string | ((16 + 10) << 8))
 
 #ifndef CMPI_NO_SYNONYM_SUPPORT
-#  define CMPI_Byte CMPI_sint8
-#  define CMPI_Short CMPI_sint16
-#  define CMPI_Int CMPI_sint32
-#  define CMPI_Long CMPI_sint64
-#  define CMPI_Float CMPI_real32
-#  define CMPI_Double CMPI_real64
+#define CMPI_Byte CMPI_sint8
+#define CMPI_Short CMPI_sint16
+#define CMPI_Int CMPI_sint32
+#define CMPI_Long CMPI_sint64
+#define CMPI_Float CMPI_real32
+#define CMPI_Double CMPI_real64
 
-#  define CMPI_ByteA CMPI_sint8A
-#  define CMPI_ShortA CMPI_sint16A
-#  define CMPI_IntA CMPI_sint32A
-#  define CMPI_LongA CMPI_sint64A
-#  define CMPI_FloatA CMPI_real32A
-#  define CMPI_DoubleA CMPI_real64A
+#define CMPI_ByteA CMPI_sint8A
+#define CMPI_ShortA CMPI_sint16A
+#define CMPI_IntA CMPI_sint32A
+#define CMPI_LongA CMPI_sint64A
+#define CMPI_FloatA CMPI_real32A
+#define CMPI_DoubleA CMPI_real64A
 #endif
 
 /* ------------------------------------------------------------------------
@@ -437,8 +437,8 @@ typedef CMPIData CMPIAccessor(const char *, void *parm);
 #define CMPI_MB_Supports_Qualifier 0x00001000
 #define CMPI_MB_Supports_Schema 0x00003000
 #ifdef CMPI_VER_200
-#  define CMPI_MB_Supports_MemEnhancements 0x00004000
-#  define CMPI_MB_Supports_Extended_Error 0x00008000
+#define CMPI_MB_Supports_MemEnhancements 0x00004000
+#define CMPI_MB_Supports_Extended_Error 0x00008000
 #endif
 
 #define CMPI_MB_BasicRead 0x00000001
@@ -536,16 +536,9 @@ typedef enum _CMPISeverity {
     CMPI_DEV_DEBUG = 4
 } CMPISeverity;
 
-typedef enum _CMPILevel {
-    CMPI_LEV_INFO = 1,
-    CMPI_LEV_WARNING = 2,
-    CMPI_LEV_VERBOSE = 3
-} CMPILevel;
+typedef enum _CMPILevel { CMPI_LEV_INFO = 1, CMPI_LEV_WARNING = 2, CMPI_LEV_VERBOSE = 3 } CMPILevel;
 
-typedef enum _CMPISelectCondType {
-    CMPI_COND_DOC = 0,
-    CMPI_COND_COD = 1
-} CMPISelectCondType;
+typedef enum _CMPISelectCondType { CMPI_COND_DOC = 0, CMPI_COND_COD = 1 } CMPISelectCondType;
 
 /* Opaque handle of an open message file. */
 typedef void *CMPIMsgFileHandle;

@@ -43,13 +43,12 @@ struct _CMPIBrokerFT {
     CMPIContext *(*prepareAttachThread)(const CMPIBroker *mb, const CMPIContext *ctx);
     CMPIStatus (*attachThread)(const CMPIBroker *, const CMPIContext *);
     CMPIStatus (*detachThread)(const CMPIBroker *mb, const CMPIContext *ctx);
-    CMPIStatus (*deliverIndication)(const CMPIBroker *mb, const CMPIContext *ctx,
-                                    const char *ns, const CMPIInstance *ind);
+    CMPIStatus (*deliverIndication)(const CMPIBroker *mb, const CMPIContext *ctx, const char *ns,
+                                    const CMPIInstance *ind);
     CMPIEnumeration *(*enumerateInstanceNames)(const CMPIBroker *mb, const CMPIContext *ctx,
                                                const CMPIObjectPath *op, CMPIStatus *rc);
     CMPIInstance *(*getInstance)(const CMPIBroker *mb, const CMPIContext *ctx,
-                                 const CMPIObjectPath *op, const char **properties,
-                                 CMPIStatus *rc);
+                                 const CMPIObjectPath *op, const char **properties, CMPIStatus *rc);
     CMPIObjectPath *(*createInstance)(const CMPIBroker *mb, const CMPIContext *ctx,
                                       const CMPIObjectPath *op, const CMPIInstance *inst,
                                       CMPIStatus *rc);
@@ -59,8 +58,8 @@ struct _CMPIBrokerFT {
     CMPIStatus (*deleteInstance)(const CMPIBroker *mb, const CMPIContext *ctx,
                                  const CMPIObjectPath *op);
     CMPIEnumeration *(*execQuery)(const CMPIBroker *mb, const CMPIContext *ctx,
-                                  const CMPIObjectPath *op, const char *query,
-                                  const char *lang, CMPIStatus *rc);
+                                  const CMPIObjectPath *op, const char *query, const char *lang,
+                                  CMPIStatus *rc);
     CMPIEnumeration *(*enumerateInstances)(const CMPIBroker *mb, const CMPIContext *ctx,
                                            const CMPIObjectPath *op, const char **properties,
                                            CMPIStatus *rc);
@@ -79,14 +78,13 @@ struct _CMPIBrokerFT {
     CMPIEnumeration *(*referenceNames)(const CMPIBroker *mb, const CMPIContext *ctx,
                                        const CMPIObjectPath *op, const char *resultClass,
                                        const char *role, CMPIStatus *rc);
-    CMPIData (*invokeMethod)(const CMPIBroker *mb, const CMPIContext *ctx,
-                             const CMPIObjectPath *op, const char *method, const CMPIArgs *in,
-                             CMPIArgs *out, CMPIStatus *rc);
+    CMPIData (*invokeMethod)(const CMPIBroker *mb, const CMPIContext *ctx, const CMPIObjectPath *op,
+                             const char *method, const CMPIArgs *in, CMPIArgs *out, CMPIStatus *rc);
     CMPIStatus (*setProperty)(const CMPIBroker *mb, const CMPIContext *ctx,
-                              const CMPIObjectPath *op, const char *name,
-                              const CMPIValue *value, CMPIType type);
-    CMPIData (*getProperty)(const CMPIBroker *mb, const CMPIContext *ctx,
-                            const CMPIObjectPath *op, const char *name, CMPIStatus *rc);
+                              const CMPIObjectPath *op, const char *name, const CMPIValue *value,
+                              CMPIType type);
+    CMPIData (*getProperty)(const CMPIBroker *mb, const CMPIContext *ctx, const CMPIObjectPath *op,
+                            const char *name, CMPIStatus *rc);
 };
 
 /* Factories of encapsulated objects and type services. */
@@ -105,8 +103,8 @@ struct _CMPIBrokerEncFT {
                                           CMPIStatus *rc);
     CMPISelectExp *(*newSelectExp)(const CMPIBroker *mb, const char *query, const char *lang,
                                    CMPIArray **projection, CMPIStatus *st);
-    CMPIBoolean (*classPathIsA)(const CMPIBroker *mb, const CMPIObjectPath *op,
-                                const char *type, CMPIStatus *rc);
+    CMPIBoolean (*classPathIsA)(const CMPIBroker *mb, const CMPIObjectPath *op, const char *type,
+                                CMPIStatus *rc);
     CMPIString *(*toString)(const CMPIBroker *mb, const void *object, CMPIStatus *rc);
     CMPIBoolean (*isOfType)(const CMPIBroker *mb, const void *object, const char *type,
                             CMPIStatus *rc);
@@ -121,13 +119,12 @@ struct _CMPIBrokerEncFT {
     CMPIStatus (*trace)(const CMPIBroker *, CMPILevel level, const char *component,
                         const char *text, const CMPIString *string);
 #else
-    CMPIArray *(*getKeyList)(CMPIBroker *mb, CMPIContext *ctx, CMPIObjectPath *op,
-                             CMPIStatus *rc);
+    CMPIArray *(*getKeyList)(CMPIBroker *mb, CMPIContext *ctx, CMPIObjectPath *op, CMPIStatus *rc);
 #endif
 #ifdef CMPI_VER_200
     CMPIError *(*newCMPIError)(const CMPIBroker *, const char *, const char *, const char *,
-                               const CMPIErrorSeverity, const CMPIErrorProbableCause,
-                               const CMPIrc, CMPIStatus *rc);
+                               const CMPIErrorSeverity, const CMPIErrorProbableCause, const CMPIrc,
+                               CMPIStatus *rc);
     CMPIStatus (*openMessageFile)(const CMPIBroker *mb, const char *msgFile,
                                   CMPIMsgFileHandle *msgFileHandle);
     CMPIStatus (*closeMessageFile)(const CMPIBroker *mb, const CMPIMsgFileHandle msgFileHandle);
@@ -145,8 +142,8 @@ struct timespec;
 struct _CMPIBrokerExtFT {
     int ftVersion;
     char *(*resolveFileName)(const char *filename);
-    CMPI_THREAD_TYPE (*newThread)(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL *start)(void *),
-                                  void *parm, int detached);
+    CMPI_THREAD_TYPE (*newThread)
+    (CMPI_THREAD_RETURN(CMPI_THREAD_CDECL *start)(void *), void *parm, int detached);
     int (*joinThread)(CMPI_THREAD_TYPE thread, CMPI_THREAD_RETURN *retval);
     int (*exitThread)(CMPI_THREAD_RETURN return_code);
     int (*cancelThread)(CMPI_THREAD_TYPE thread);
@@ -331,11 +328,10 @@ struct _CMPIObjectPathFT {
                          CMPIStatus *rc);
     CMPICount (*getKeyCount)(const CMPIObjectPath *op, CMPIStatus *rc);
     CMPIStatus (*setNameSpaceFromObjectPath)(CMPIObjectPath *op, const CMPIObjectPath *src);
-    CMPIStatus (*setHostAndNameSpaceFromObjectPath)(CMPIObjectPath *op,
-                                                    const CMPIObjectPath *src);
+    CMPIStatus (*setHostAndNameSpaceFromObjectPath)(CMPIObjectPath *op, const CMPIObjectPath *src);
     CMPIData (*getClassQualifier)(const CMPIObjectPath *op, const char *qName, CMPIStatus *rc);
-    CMPIData (*getPropertyQualifier)(const CMPIObjectPath *op, const char *pName,
-                                     const char *qName, CMPIStatus *rc);
+    CMPIData (*getPropertyQualifier)(const CMPIObjectPath *op, const char *pName, const char *qName,
+                                     CMPIStatus *rc);
     CMPIData (*getMethodQualifier)(const CMPIObjectPath *op, const char *methodName,
                                    const char *qName, CMPIStatus *rc);
     CMPIData (*getParameterQualifier)(const CMPIObjectPath *op, const char *mName,
@@ -404,8 +400,8 @@ struct _CMPIPredicateFT {
     int ftVersion;
     CMPIStatus (*release)(CMPIPredicate *pr);
     CMPIPredicate *(*clone)(const CMPIPredicate *pr, CMPIStatus *rc);
-    CMPIStatus (*getData)(const CMPIPredicate *pr, CMPIType *type, CMPIPredOp *op,
-                          CMPIString **lhs, CMPIString **rhs);
+    CMPIStatus (*getData)(const CMPIPredicate *pr, CMPIType *type, CMPIPredOp *op, CMPIString **lhs,
+                          CMPIString **rhs);
 #if defined(CMPI_VER_87) && !defined(CMPI_VER_100)
     int (*evaluate)(CMPIPredicate *pr, CMPIValue *value, CMPIType type, CMPIStatus *rc);
 #endif
@@ -517,14 +513,13 @@ struct _CMPIInstanceMIFT {
                                      const char **properties);
     CMPIStatus (*getInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
                               const CMPIObjectPath *op, const char **properties);
-    CMPIStatus (*createInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                 const CMPIResult *rslt, const CMPIObjectPath *op,
-                                 const CMPIInstance *inst);
-    CMPIStatus (*modifyInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                 const CMPIResult *rslt, const CMPIObjectPath *op,
-                                 const CMPIInstance *inst, const char **properties);
-    CMPIStatus (*deleteInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                 const CMPIResult *rslt, const CMPIObjectPath *op);
+    CMPIStatus (*createInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
+                                 const CMPIObjectPath *op, const CMPIInstance *inst);
+    CMPIStatus (*modifyInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
+                                 const CMPIObjectPath *op, const CMPIInstance *inst,
+                                 const char **properties);
+    CMPIStatus (*deleteInstance)(CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
+                                 const CMPIObjectPath *op);
     CMPIStatus (*execQuery)(CMPIInstanceMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
                             const CMPIObjectPath *op, const char *query, const char *lang);
 };
@@ -539,19 +534,17 @@ struct _CMPIAssociationMIFT {
     int ftVersion;
     int miVersion;
     const char *miName;
-    CMPIStatus (*cleanup)(CMPIAssociationMI *mi, const CMPIContext *ctx,
-                          CMPIBoolean terminating);
-    CMPIStatus (*associators)(CMPIAssociationMI *mi, const CMPIContext *ctx,
-                              const CMPIResult *rslt, const CMPIObjectPath *op,
-                              const char *asscClass, const char *resultClass, const char *role,
-                              const char *resultRole, const char **properties);
+    CMPIStatus (*cleanup)(CMPIAssociationMI *mi, const CMPIContext *ctx, CMPIBoolean terminating);
+    CMPIStatus (*associators)(CMPIAssociationMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
+                              const CMPIObjectPath *op, const char *asscClass,
+                              const char *resultClass, const char *role, const char *resultRole,
+                              const char **properties);
     CMPIStatus (*associatorNames)(CMPIAssociationMI *mi, const CMPIContext *ctx,
                                   const CMPIResult *rslt, const CMPIObjectPath *op,
-                                  const char *assocClass, const char *resultClass,
-                                  const char *role, const char *resultRole);
-    CMPIStatus (*references)(CMPIAssociationMI *mi, const CMPIContext *ctx,
-                             const CMPIResult *rslt, const CMPIObjectPath *op,
-                             const char *resultClass, const char *role,
+                                  const char *assocClass, const char *resultClass, const char *role,
+                                  const char *resultRole);
+    CMPIStatus (*references)(CMPIAssociationMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
+                             const CMPIObjectPath *op, const char *resultClass, const char *role,
                              const char **properties);
     CMPIStatus (*referenceNames)(CMPIAssociationMI *mi, const CMPIContext *ctx,
                                  const CMPIResult *rslt, const CMPIObjectPath *op,
@@ -613,8 +606,7 @@ struct _CMPIIndicationMIFT {
                                  const CMPIObjectPath *classPath, CMPIBoolean firstActivation);
     CMPIStatus (*deActivateFilter)(CMPIIndicationMI *mi, const CMPIContext *ctx,
                                    const CMPISelectExp *filter, const char *className,
-                                   const CMPIObjectPath *classPath,
-                                   CMPIBoolean lastActiviation);
+                                   const CMPIObjectPath *classPath, CMPIBoolean lastActiviation);
     CMPIStatus (*enableIndications)(CMPIIndicationMI *mi, const CMPIContext *);
     CMPIStatus (*disableIndications)(CMPIIndicationMI *mi, const CMPIContext *);
 };

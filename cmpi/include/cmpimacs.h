@@ -11,12 +11,12 @@
 #define _CMPIMACS_H_
 
 #ifndef DOC_ONLY
-#  include "cmpidt.h"
-#  include "cmpift.h"
+#include "cmpidt.h"
+#include "cmpift.h"
 #endif
 
 #ifdef DOC_ONLY
-#  define CMPI_INLINE
+#define CMPI_INLINE
 #endif
 
 /* ------------------------------------------------------------------------
@@ -24,53 +24,53 @@
  * ------------------------------------------------------------------------ */
 
 /* Return from the enclosing function with code rc_ and no message. */
-#define CMReturn(rc_) \
-    do { \
+#define CMReturn(rc_)                            \
+    do {                                         \
         CMPIStatus stat = {(CMPIrc)(rc_), NULL}; \
-        return stat; \
+        return stat;                             \
     } while (0)
 
 /* Return from the enclosing function with code rc_ and message str_. */
-#define CMReturnWithString(rc_, str_) \
-    do { \
+#define CMReturnWithString(rc_, str_)              \
+    do {                                           \
         CMPIStatus stat = {(CMPIrc)(rc_), (str_)}; \
-        return stat; \
+        return stat;                               \
     } while (0)
 
 /* Return with code rc_ and a message made from chars_ by broker mb_. */
-#define CMReturnWithChars(mb_, rc_, chars_) \
-    do { \
-        CMPIStatus stat = {(CMPIrc)(rc_), NULL}; \
-        if (mb_) \
+#define CMReturnWithChars(mb_, rc_, chars_)                          \
+    do {                                                             \
+        CMPIStatus stat = {(CMPIrc)(rc_), NULL};                     \
+        if (mb_)                                                     \
             stat.msg = (mb_)->eft->newString((mb_), (chars_), NULL); \
-        return stat; \
+        return stat;                                                 \
     } while (0)
 
-#define CMSetStatus(st_, rcp_) \
-    do { \
-        if (st_) { \
+#define CMSetStatus(st_, rcp_)          \
+    do {                                \
+        if (st_) {                      \
             (st_)->rc = (CMPIrc)(rcp_); \
-            (st_)->msg = NULL; \
-        } \
+            (st_)->msg = NULL;          \
+        }                               \
     } while (0)
 
 #define CMSetStatusWithString(st_, rcp_, string_) \
-    do { \
-        if (st_) { \
-            (st_)->rc = (CMPIrc)(rcp_); \
-            (st_)->msg = (string_); \
-        } \
+    do {                                          \
+        if (st_) {                                \
+            (st_)->rc = (CMPIrc)(rcp_);           \
+            (st_)->msg = (string_);               \
+        }                                         \
     } while (0)
 
-#define CMSetStatusWithChars(mb_, st_, rcp_, chars_) \
-    do { \
-        if (st_) { \
-            (st_)->rc = (CMPIrc)(rcp_); \
-            if (mb_) \
+#define CMSetStatusWithChars(mb_, st_, rcp_, chars_)                       \
+    do {                                                                   \
+        if (st_) {                                                         \
+            (st_)->rc = (CMPIrc)(rcp_);                                    \
+            if (mb_)                                                       \
                 (st_)->msg = (mb_)->eft->newString((mb_), (chars_), NULL); \
-            else \
-                (st_)->msg = NULL; \
-        } \
+            else                                                           \
+                (st_)->msg = NULL;                                         \
+        }                                                                  \
     } while (0)
 
 /* ------------------------------------------------------------------------
@@ -98,8 +98,7 @@
 #define CMNewArgs(b, rc) ((b)->eft->newArgs((b), (rc)))
 #define CMNewArray(b, c, t, rc) ((b)->eft->newArray((b), (c), (t), (rc)))
 #define CMNewDateTime(b, rc) ((b)->eft->newDateTime((b), (rc)))
-#define CMNewDateTimeFromBinary(b, d, i, rc) \
-    ((b)->eft->newDateTimeFromBinary((b), (d), (i), (rc)))
+#define CMNewDateTimeFromBinary(b, d, i, rc) ((b)->eft->newDateTimeFromBinary((b), (d), (i), (rc)))
 #define CMNewDateTimeFromChars(b, d, rc) ((b)->eft->newDateTimeFromChars((b), (d), (rc)))
 #define CMNewSelectExp(b, q, l, p, rc) ((b)->eft->newSelectExp((b), (q), (l), (p), (rc)))
 #define CMClassPathIsA(b, p, pn, rc) ((b)->eft->classPathIsA((b), (p), (pn), (rc)))
@@ -109,47 +108,47 @@
 
 #ifdef CMPI_VER_85
 /* parms is a CMFmtArgsN(...) expansion: the count, then (type, value) pairs. */
-#  define CMGetMessage(b, id, def, rc, parms) ((b)->eft->getMessage((b), (id), (def), (rc), parms))
+#define CMGetMessage(b, id, def, rc, parms) ((b)->eft->getMessage((b), (id), (def), (rc), parms))
 #endif
 
 #ifdef CMPI_VER_100
-#  define CMLogMessage(b, severity, id, text, string) \
+#define CMLogMessage(b, severity, id, text, string) \
     ((b)->eft->logMessage((b), (severity), (id), (text), (string)))
-#  define CMTraceMessage(b, level, component, text, string) \
+#define CMTraceMessage(b, level, component, text, string) \
     ((b)->eft->trace((b), (level), (component), (text), (string)))
 #endif
 
 #ifdef CMPI_VER_200
-#  define CMNewCMPIError(b, owner, msgID, msg, sev, pc, cimStatusCode, rc) \
+#define CMNewCMPIError(b, owner, msgID, msg, sev, pc, cimStatusCode, rc) \
     ((b)->eft->newCMPIError((b), (owner), (msgID), (msg), (sev), (pc), (cimStatusCode), (rc)))
-#  define CMOpenMessageFile(b, mf, mfh) ((b)->eft->openMessageFile((b), (mf), (mfh)))
-#  define CMCloseMessageFile(b, mfh) ((b)->eft->closeMessageFile((b), (mfh)))
-#  define CMGetMessage2(b, id, mfh, def, rc, parms) \
+#define CMOpenMessageFile(b, mf, mfh) ((b)->eft->openMessageFile((b), (mf), (mfh)))
+#define CMCloseMessageFile(b, mfh) ((b)->eft->closeMessageFile((b), (mfh)))
+#define CMGetMessage2(b, id, mfh, def, rc, parms) \
     ((b)->eft->getMessage2((b), (id), (mfh), (def), (rc), parms))
 #endif
 
 /* Message arguments: a type tag followed by the value. */
 #ifdef CMPI_VER_85
-#  define CMFmtSint(v) CMPI_sint32, ((long int)v)
-#  define CMFmtUint(v) CMPI_uint32, ((unsigned long int)v)
-#  define CMFmtSint64(v) CMPI_sint64, ((CMPISint64)v)
-#  define CMFmtUint64(v) CMPI_uint64, ((CMPIUint64)v)
-#  define CMFmtReal(v) CMPI_real64, ((double)v)
-#  define CMFmtBoolean(v) CMPI_boolean, ((int)v)
-#  define CMFmtChars(v) CMPI_chars, ((char *)v)
-#  define CMFmtString(v) CMPI_string, ((CMPIString *)v)
+#define CMFmtSint(v) CMPI_sint32, ((long int)v)
+#define CMFmtUint(v) CMPI_uint32, ((unsigned long int)v)
+#define CMFmtSint64(v) CMPI_sint64, ((CMPISint64)v)
+#define CMFmtUint64(v) CMPI_uint64, ((CMPIUint64)v)
+#define CMFmtReal(v) CMPI_real64, ((double)v)
+#define CMFmtBoolean(v) CMPI_boolean, ((int)v)
+#define CMFmtChars(v) CMPI_chars, ((char *)v)
+#define CMFmtString(v) CMPI_string, ((CMPIString *)v)
 
-#  define CMFmtArgs0() 0
-#  define CMFmtArgs1(v1) 1, v1
-#  define CMFmtArgs2(v1, v2) 2, v1, v2
-#  define CMFmtArgs3(v1, v2, v3) 3, v1, v2, v3
-#  define CMFmtArgs4(v1, v2, v3, v4) 4, v1, v2, v3, v4
-#  define CMFmtArgs5(v1, v2, v3, v4, v5) 5, v1, v2, v3, v4, v5
-#  define CMFmtArgs6(v1, v2, v3, v4, v5, v6) 6, v1, v2, v3, v4, v5, v6
-#  define CMFmtArgs7(v1, v2, v3, v4, v5, v6, v7) 7, v1, v2, v3, v4, v5, v6, v7
-#  define CMFmtArgs8(v1, v2, v3, v4, v5, v6, v7, v8) 8, v1, v2, v3, v4, v5, v6, v7, v8
-#  define CMFmtArgs9(v1, v2, v3, v4, v5, v6, v7, v8, v9) 9, v1, v2, v3, v4, v5, v6, v7, v8, v9
-#  define CMFmtArgs10(v1, v2, v3, v4, v5, v6, v7, v8, v9, v10) \
+#define CMFmtArgs0() 0
+#define CMFmtArgs1(v1) 1, v1
+#define CMFmtArgs2(v1, v2) 2, v1, v2
+#define CMFmtArgs3(v1, v2, v3) 3, v1, v2, v3
+#define CMFmtArgs4(v1, v2, v3, v4) 4, v1, v2, v3, v4
+#define CMFmtArgs5(v1, v2, v3, v4, v5) 5, v1, v2, v3, v4, v5
+#define CMFmtArgs6(v1, v2, v3, v4, v5, v6) 6, v1, v2, v3, v4, v5, v6
+#define CMFmtArgs7(v1, v2, v3, v4, v5, v6, v7) 7, v1, v2, v3, v4, v5, v6, v7
+#define CMFmtArgs8(v1, v2, v3, v4, v5, v6, v7, v8) 8, v1, v2, v3, v4, v5, v6, v7, v8
+#define CMFmtArgs9(v1, v2, v3, v4, v5, v6, v7, v8, v9) 9, v1, v2, v3, v4, v5, v6, v7, v8, v9
+#define CMFmtArgs10(v1, v2, v3, v4, v5, v6, v7, v8, v9, v10) \
     10, v1, v2, v3, v4, v5, v6, v7, v8, v9, v10
 #endif
 
@@ -163,11 +162,11 @@
 #define CMGetPropertyCount(i, rc) ((i)->ft->getPropertyCount((i), (rc)))
 #define CMGetObjectPath(i, rc) ((i)->ft->getObjectPath((i), (rc)))
 #ifdef CMPI_VER_100
-#  define CMSetObjectPath(i, obj) ((i)->ft->setObjectPath((i), (obj)))
+#define CMSetObjectPath(i, obj) ((i)->ft->setObjectPath((i), (obj)))
 #endif
 #define CMSetPropertyFilter(i, pl, k) ((i)->ft->setPropertyFilter((i), (pl), (k)))
 #ifdef CMPI_VER_200
-#  define CMSetPropertyWithOrigin(i, n, v, t, o) \
+#define CMSetPropertyWithOrigin(i, n, v, t, o) \
     ((i)->ft->setPropertyWithOrigin((i), (n), (CMPIValue *)(v), (t), (o)))
 #endif
 
@@ -196,7 +195,7 @@
 #define CMGetParameterQualifier(op, mName, pName, qName, rc) \
     ((op)->ft->getParameterQualifier((op), (mName), (pName), (qName), (rc)))
 #ifdef CMPI_VER_86
-#  define CMObjectPathToString(p, rc) ((p)->ft->toString((p), (rc)))
+#define CMObjectPathToString(p, rc) ((p)->ft->toString((p), (rc)))
 #endif
 
 /* ------------------------------------------------------------------------
@@ -226,30 +225,30 @@
  * ------------------------------------------------------------------------ */
 
 #ifdef CMPI_VER_200
-#  define CMGetErrorType(e, rc) ((e)->ft->getErrorType((e), (rc)))
-#  define CMGetOtherErrorType(e, rc) ((e)->ft->getOtherErrorType((e), (rc)))
-#  define CMGetOwningEntity(e, rc) ((e)->ft->getOwningEntity((e), (rc)))
-#  define CMGetMessageID(e, rc) ((e)->ft->getMessageID((e), (rc)))
-#  define CMGetErrorMessage(e, rc) ((e)->ft->getMessage((e), (rc)))
-#  define CMGetPerceivedSeverity(e, rc) ((e)->ft->getPerceivedSeverity((e), (rc)))
-#  define CMGetProbableCause(e, rc) ((e)->ft->getProbableCause((e), (rc)))
-#  define CMGetProbableCauseDescription(e, rc) ((e)->ft->getProbableCauseDescription((e), (rc)))
-#  define CMGetRecommendedActions(e, rc) ((e)->ft->getRecommendedActions((e), (rc)))
-#  define CMGetErrorSource(e, rc) ((e)->ft->getErrorSource((e), (rc)))
-#  define CMGetErrorSourceFormat(e, rc) ((e)->ft->getErrorSourceFormat((e), (rc)))
-#  define CMGetOtherErrorSourceFormat(e, rc) ((e)->ft->getOtherErrorSourceFormat((e), (rc)))
-#  define CMGetCIMStatusCode(e, rc) ((e)->ft->getCIMStatusCode((e), (rc)))
-#  define CMGetCIMStatusCodeDescription(e, rc) ((e)->ft->getCIMStatusCodeDescription((e), (rc)))
-#  define CMGetMessageArguments(e, rc) ((e)->ft->getMessageArguments((e), (rc)))
-#  define CMSetErrorType(e, et) ((e)->ft->setErrorType((e), (et)))
-#  define CMSetOtherErrorType(e, oet) ((e)->ft->setOtherErrorType((e), (oet)))
-#  define CMSetProbableCauseDescription(e, pcd) ((e)->ft->setProbableCauseDescription((e), (pcd)))
-#  define CMSetRecommendedActions(e, ra) ((e)->ft->setRecommendedActions((e), (ra)))
-#  define CMSetErrorSource(e, es) ((e)->ft->setErrorSource((e), (es)))
-#  define CMSetErrorSourceFormat(e, esf) ((e)->ft->setErrorSourceFormat((e), (esf)))
-#  define CMSetOtherErrorSourceFormat(e, oesf) ((e)->ft->setOtherErrorSourceFormat((e), (oesf)))
-#  define CMSetCIMStatusCodeDescription(e, cd) ((e)->ft->setCIMStatusCodeDescription((e), (cd)))
-#  define CMSetMessageArguments(e, ma) ((e)->ft->setMessageArguments((e), (ma)))
+#define CMGetErrorType(e, rc) ((e)->ft->getErrorType((e), (rc)))
+#define CMGetOtherErrorType(e, rc) ((e)->ft->getOtherErrorType((e), (rc)))
+#define CMGetOwningEntity(e, rc) ((e)->ft->getOwningEntity((e), (rc)))
+#define CMGetMessageID(e, rc) ((e)->ft->getMessageID((e), (rc)))
+#define CMGetErrorMessage(e, rc) ((e)->ft->getMessage((e), (rc)))
+#define CMGetPerceivedSeverity(e, rc) ((e)->ft->getPerceivedSeverity((e), (rc)))
+#define CMGetProbableCause(e, rc) ((e)->ft->getProbableCause((e), (rc)))
+#define CMGetProbableCauseDescription(e, rc) ((e)->ft->getProbableCauseDescription((e), (rc)))
+#define CMGetRecommendedActions(e, rc) ((e)->ft->getRecommendedActions((e), (rc)))
+#define CMGetErrorSource(e, rc) ((e)->ft->getErrorSource((e), (rc)))
+#define CMGetErrorSourceFormat(e, rc) ((e)->ft->getErrorSourceFormat((e), (rc)))
+#define CMGetOtherErrorSourceFormat(e, rc) ((e)->ft->getOtherErrorSourceFormat((e), (rc)))
+#define CMGetCIMStatusCode(e, rc) ((e)->ft->getCIMStatusCode((e), (rc)))
+#define CMGetCIMStatusCodeDescription(e, rc) ((e)->ft->getCIMStatusCodeDescription((e), (rc)))
+#define CMGetMessageArguments(e, rc) ((e)->ft->getMessageArguments((e), (rc)))
+#define CMSetErrorType(e, et) ((e)->ft->setErrorType((e), (et)))
+#define CMSetOtherErrorType(e, oet) ((e)->ft->setOtherErrorType((e), (oet)))
+#define CMSetProbableCauseDescription(e, pcd) ((e)->ft->setProbableCauseDescription((e), (pcd)))
+#define CMSetRecommendedActions(e, ra) ((e)->ft->setRecommendedActions((e), (ra)))
+#define CMSetErrorSource(e, es) ((e)->ft->setErrorSource((e), (es)))
+#define CMSetErrorSourceFormat(e, esf) ((e)->ft->setErrorSourceFormat((e), (esf)))
+#define CMSetOtherErrorSourceFormat(e, oesf) ((e)->ft->setOtherErrorSourceFormat((e), (oesf)))
+#define CMSetCIMStatusCodeDescription(e, cd) ((e)->ft->setCIMStatusCodeDescription((e), (cd)))
+#define CMSetMessageArguments(e, ma) ((e)->ft->setMessageArguments((e), (ma)))
 #endif
 
 /* ------------------------------------------------------------------------
@@ -266,7 +265,7 @@
 #define CMReturnObjectPath(r, o) ((r)->ft->returnObjectPath((r), (o)))
 #define CMReturnDone(r) ((r)->ft->returnDone((r)))
 #ifdef CMPI_VER_200
-#  define CMReturnError(r, e) ((r)->ft->returnError((r), (e)))
+#define CMReturnError(r, e) ((r)->ft->returnError((r), (e)))
 #endif
 
 #define CMGetContextEntry(c, n, rc) ((c)->ft->getEntry((c), (n), (rc)))
@@ -281,7 +280,7 @@
 #define CMGetSelExpString(s, rc) ((s)->ft->getString((s), (rc)))
 #define CMEvaluateSelExp(s, i, r) ((s)->ft->evaluate((s), (i), (r)))
 #ifdef CMPI_VER_87
-#  define CMEvaluateSelExpUsingAccessor(s, i, p, r) \
+#define CMEvaluateSelExpUsingAccessor(s, i, p, r) \
     ((s)->ft->evaluateUsingAccessor((s), (i), (p), (r)))
 #endif
 #define CMGetDoc(s, rc) ((s)->ft->getDOC((s), (rc)))
@@ -296,10 +295,10 @@
 
 #define CMGetPredicateData(p, t, o, n, v) ((p)->ft->getData((p), (t), (o), (n), (v)))
 #if defined(CMPI_VER_87) && !defined(CMPI_VER_100)
-#  define CMEvaluatePredicate(p, v, t, rc) ((p)->ft->evaluate((p), (CMPIValue *)(v), (t), (rc)))
+#define CMEvaluatePredicate(p, v, t, rc) ((p)->ft->evaluate((p), (CMPIValue *)(v), (t), (rc)))
 #endif
 #ifdef CMPI_VER_100
-#  define CMEvaluatePredicateUsingAccessor(p, a, parm, rc) \
+#define CMEvaluatePredicateUsingAccessor(p, a, parm, rc) \
     ((p)->ft->evaluateUsingAccessor((p), (a), (parm), (rc)))
 #endif
 
@@ -318,18 +317,17 @@
 #define CBDeliverIndication(b, c, n, i) ((b)->bft->deliverIndication((b), (c), (n), (i)))
 
 #define CBEnumInstanceNames(b, c, p, rc) ((b)->bft->enumerateInstanceNames((b), (c), (p), (rc)))
-#define CBEnumInstances(b, c, p, pr, rc) \
-    ((b)->bft->enumerateInstances((b), (c), (p), (pr), (rc)))
+#define CBEnumInstances(b, c, p, pr, rc) ((b)->bft->enumerateInstances((b), (c), (p), (pr), (rc)))
 #define CBGetInstance(b, c, p, pr, rc) ((b)->bft->getInstance((b), (c), (p), (pr), (rc)))
 #define CBCreateInstance(b, c, p, i, rc) ((b)->bft->createInstance((b), (c), (p), (i), (rc)))
 #ifdef CMPI_VER_100
-#  define CBModifyInstance(b, c, p, i, pr) ((b)->bft->modifyInstance((b), (c), (p), (i), (pr)))
+#define CBModifyInstance(b, c, p, i, pr) ((b)->bft->modifyInstance((b), (c), (p), (i), (pr)))
 #else
-#  ifdef CMPI_VER_90
-#    define CBSetInstance(b, c, p, i, pr) ((b)->bft->setInstance((b), (c), (p), (i), (pr)))
-#  else
-#    define CBSetInstance(b, c, p, i) ((b)->bft->setInstance((b), (c), (p), (i), NULL))
-#  endif
+#ifdef CMPI_VER_90
+#define CBSetInstance(b, c, p, i, pr) ((b)->bft->setInstance((b), (c), (p), (i), (pr)))
+#else
+#define CBSetInstance(b, c, p, i) ((b)->bft->setInstance((b), (c), (p), (i), NULL))
+#endif
 #endif
 #define CBDeleteInstance(b, c, p) ((b)->bft->deleteInstance((b), (c), (p)))
 #define CBExecQuery(b, c, p, l, q, rc) ((b)->bft->execQuery((b), (c), (p), (l), (q), (rc)))
@@ -358,96 +356,92 @@
 #define CMNoHook
 
 #ifdef CMPI_VER_100
-#  define CMInstanceMIStubChange(pfx) pfx##ModifyInstance
+#define CMInstanceMIStubChange(pfx) pfx##ModifyInstance
 #else
-#  define CMInstanceMIStubChange(pfx) pfx##SetInstance
+#define CMInstanceMIStubChange(pfx) pfx##SetInstance
 #endif
 
-#define CMInstanceMIStub(pfx, pn, broker, hook) \
-    static CMPIInstanceMIFT instMIFT__ = { \
-        CMPICurrentVersion, CMPICurrentVersion, "instance" #pn, pfx##Cleanup, \
-        pfx##EnumInstanceNames, pfx##EnumInstances, pfx##GetInstance, pfx##CreateInstance, \
-        CMInstanceMIStubChange(pfx), pfx##DeleteInstance, pfx##ExecQuery, \
-    }; \
-    CMPI_EXTERN_C CMPIInstanceMI *pn##_Create_InstanceMI(const CMPIBroker *brkr, \
-                                                         const CMPIContext *ctx, CMPIStatus *rc) \
-    { \
-        static CMPIInstanceMI mi = {NULL, &instMIFT__}; \
-        (void)ctx; \
-        (void)rc; \
-        broker = brkr; \
-        hook; \
-        return &mi; \
+#define CMInstanceMIStub(pfx, pn, broker, hook)                                                    \
+    static CMPIInstanceMIFT instMIFT__ = {                                                         \
+        CMPICurrentVersion,          CMPICurrentVersion,  "instance" #pn,   pfx##Cleanup,          \
+        pfx##EnumInstanceNames,      pfx##EnumInstances,  pfx##GetInstance, pfx##CreateInstance,   \
+        CMInstanceMIStubChange(pfx), pfx##DeleteInstance, pfx##ExecQuery,                          \
+    };                                                                                             \
+    CMPI_EXTERN_C CMPIInstanceMI *pn##_Create_InstanceMI(const CMPIBroker *brkr,                   \
+                                                         const CMPIContext *ctx, CMPIStatus *rc) { \
+        static CMPIInstanceMI mi = {NULL, &instMIFT__};                                            \
+        (void)ctx;                                                                                 \
+        (void)rc;                                                                                  \
+        broker = brkr;                                                                             \
+        hook;                                                                                      \
+        return &mi;                                                                                \
     }
 
-#define CMAssociationMIStub(pfx, pn, broker, hook) \
-    static CMPIAssociationMIFT assocMIFT__ = { \
-        CMPICurrentVersion, CMPICurrentVersion, "association" #pn, pfx##AssociationCleanup, \
-        pfx##Associators, pfx##AssociatorNames, pfx##References, pfx##ReferenceNames, \
-    }; \
-    CMPI_EXTERN_C CMPIAssociationMI *pn##_Create_AssociationMI( \
-        const CMPIBroker *brkr, const CMPIContext *ctx, CMPIStatus *rc) \
-    { \
-        static CMPIAssociationMI mi = {NULL, &assocMIFT__}; \
-        (void)ctx; \
-        (void)rc; \
-        broker = brkr; \
-        hook; \
-        return &mi; \
+#define CMAssociationMIStub(pfx, pn, broker, hook)                                            \
+    static CMPIAssociationMIFT assocMIFT__ = {                                                \
+        CMPICurrentVersion, CMPICurrentVersion,   "association" #pn, pfx##AssociationCleanup, \
+        pfx##Associators,   pfx##AssociatorNames, pfx##References,   pfx##ReferenceNames,     \
+    };                                                                                        \
+    CMPI_EXTERN_C CMPIAssociationMI *pn##_Create_AssociationMI(                               \
+        const CMPIBroker *brkr, const CMPIContext *ctx, CMPIStatus *rc) {                     \
+        static CMPIAssociationMI mi = {NULL, &assocMIFT__};                                   \
+        (void)ctx;                                                                            \
+        (void)rc;                                                                             \
+        broker = brkr;                                                                        \
+        hook;                                                                                 \
+        return &mi;                                                                           \
     }
 
-#define CMMethodMIStub(pfx, pn, broker, hook) \
-    static CMPIMethodMIFT methMIFT__ = { \
-        CMPICurrentVersion, CMPICurrentVersion, "method" #pn, pfx##MethodCleanup, \
-        pfx##InvokeMethod, \
-    }; \
-    CMPI_EXTERN_C CMPIMethodMI *pn##_Create_MethodMI(const CMPIBroker *brkr, \
-                                                     const CMPIContext *ctx, CMPIStatus *rc) \
-    { \
-        static CMPIMethodMI mi = {NULL, &methMIFT__}; \
-        (void)ctx; \
-        (void)rc; \
-        broker = brkr; \
-        hook; \
-        return &mi; \
+#define CMMethodMIStub(pfx, pn, broker, hook)                                                  \
+    static CMPIMethodMIFT methMIFT__ =                                                         \
+        {                                                                                      \
+            CMPICurrentVersion, CMPICurrentVersion, "method" #pn,                              \
+            pfx##MethodCleanup, pfx##InvokeMethod,                                             \
+    };                                                                                         \
+    CMPI_EXTERN_C CMPIMethodMI *pn##_Create_MethodMI(const CMPIBroker *brkr,                   \
+                                                     const CMPIContext *ctx, CMPIStatus *rc) { \
+        static CMPIMethodMI mi = {NULL, &methMIFT__};                                          \
+        (void)ctx;                                                                             \
+        (void)rc;                                                                              \
+        broker = brkr;                                                                         \
+        hook;                                                                                  \
+        return &mi;                                                                            \
     }
 
-#define CMPropertyMIStub(pfx, pn, broker, hook) \
-    static CMPIPropertyMIFT propMIFT__ = { \
-        CMPICurrentVersion, CMPICurrentVersion, "property" #pn, pfx##PropertyCleanup, \
-        pfx##SetProperty, pfx##GetProperty, \
-    }; \
-    CMPI_EXTERN_C CMPIPropertyMI *pn##_Create_PropertyMI(const CMPIBroker *brkr, \
-                                                         const CMPIContext *ctx, CMPIStatus *rc) \
-    { \
-        static CMPIPropertyMI mi = {NULL, &propMIFT__}; \
-        (void)ctx; \
-        (void)rc; \
-        broker = brkr; \
-        hook; \
-        return &mi; \
+#define CMPropertyMIStub(pfx, pn, broker, hook)                                                    \
+    static CMPIPropertyMIFT propMIFT__ = {                                                         \
+        CMPICurrentVersion,   CMPICurrentVersion, "property" #pn,                                  \
+        pfx##PropertyCleanup, pfx##SetProperty,   pfx##GetProperty,                                \
+    };                                                                                             \
+    CMPI_EXTERN_C CMPIPropertyMI *pn##_Create_PropertyMI(const CMPIBroker *brkr,                   \
+                                                         const CMPIContext *ctx, CMPIStatus *rc) { \
+        static CMPIPropertyMI mi = {NULL, &propMIFT__};                                            \
+        (void)ctx;                                                                                 \
+        (void)rc;                                                                                  \
+        broker = brkr;                                                                             \
+        hook;                                                                                      \
+        return &mi;                                                                                \
     }
 
 #ifdef CMPI_VER_86
-#  define CMIndicationMIStubExtensions(pfx) pfx##EnableIndications, pfx##DisableIndications,
+#define CMIndicationMIStubExtensions(pfx) pfx##EnableIndications, pfx##DisableIndications,
 #else
-#  define CMIndicationMIStubExtensions(pfx)
+#define CMIndicationMIStubExtensions(pfx)
 #endif
 
-#define CMIndicationMIStub(pfx, pn, broker, hook) \
-    static CMPIIndicationMIFT indMIFT__ = { \
-        CMPICurrentVersion, CMPICurrentVersion, "Indication" #pn, pfx##IndicationCleanup, \
-        pfx##AuthorizeFilter, pfx##MustPoll, pfx##ActivateFilter, pfx##DeActivateFilter, \
-        CMIndicationMIStubExtensions(pfx)}; \
-    CMPI_EXTERN_C CMPIIndicationMI *pn##_Create_IndicationMI( \
-        const CMPIBroker *brkr, const CMPIContext *ctx, CMPIStatus *rc) \
-    { \
-        static CMPIIndicationMI mi = {NULL, &indMIFT__}; \
-        (void)ctx; \
-        (void)rc; \
-        broker = brkr; \
-        hook; \
-        return &mi; \
+#define CMIndicationMIStub(pfx, pn, broker, hook)                                          \
+    static CMPIIndicationMIFT indMIFT__ = {                                                \
+        CMPICurrentVersion,     CMPICurrentVersion,    "Indication" #pn,                   \
+        pfx##IndicationCleanup, pfx##AuthorizeFilter,  pfx##MustPoll,                      \
+        pfx##ActivateFilter,    pfx##DeActivateFilter, CMIndicationMIStubExtensions(pfx)}; \
+    CMPI_EXTERN_C CMPIIndicationMI *pn##_Create_IndicationMI(                              \
+        const CMPIBroker *brkr, const CMPIContext *ctx, CMPIStatus *rc) {                  \
+        static CMPIIndicationMI mi = {NULL, &indMIFT__};                                   \
+        (void)ctx;                                                                         \
+        (void)rc;                                                                          \
+        broker = brkr;                                                                     \
+        hook;                                                                              \
+        return &mi;                                                                        \
     }
 
 /* ------------------------------------------------------------------------
@@ -469,108 +463,119 @@
 
 #define CMProviderBase(pn) CmpiProviderBase base##pn;
 
-#define CMMIFactoryBody__(cn, pn, miType, ftVar) \
-    static miType mi; \
-    mi.ft = &ftVar; \
-    try { \
-        CmpiContext ctx((CMPIContext *)ctxp); \
-        CmpiBaseMI *provider = base##pn.getBaseMI(); \
-        if (provider == 0) { \
+#define CMMIFactoryBody__(cn, pn, miType, ftVar)                      \
+    static miType mi;                                                 \
+    mi.ft = &ftVar;                                                   \
+    try {                                                             \
+        CmpiContext ctx((CMPIContext *)ctxp);                         \
+        CmpiBaseMI *provider = base##pn.getBaseMI();                  \
+        if (provider == 0) {                                          \
             provider = new cn(CmpiBroker((CMPIBroker *)broker), ctx); \
-            provider->setProviderBase(&base##pn); \
-            CmpiStatus st = provider->initialize(ctx); \
-            if (st.rc() != CMPI_RC_OK) { \
-                delete provider; \
-                if (rc) { \
-                    rc->rc = st.rc(); \
-                    rc->msg = CMNewString(broker, st.msg(), NULL); \
-                } \
-                return NULL; \
-            } \
-            base##pn.setBaseMI(provider); \
-        } \
-        mi.hdl = provider; \
-    } catch (...) { \
-        if (rc) { \
-            rc->rc = CMPI_RC_ERR_FAILED; \
-            rc->msg = NULL; \
-        } \
-        return NULL; \
-    } \
-    base##pn.incUseCount(); \
+            provider->setProviderBase(&base##pn);                     \
+            CmpiStatus st = provider->initialize(ctx);                \
+            if (st.rc() != CMPI_RC_OK) {                              \
+                delete provider;                                      \
+                if (rc) {                                             \
+                    rc->rc = st.rc();                                 \
+                    rc->msg = CMNewString(broker, st.msg(), NULL);    \
+                }                                                     \
+                return NULL;                                          \
+            }                                                         \
+            base##pn.setBaseMI(provider);                             \
+        }                                                             \
+        mi.hdl = provider;                                            \
+    } catch (...) {                                                   \
+        if (rc) {                                                     \
+            rc->rc = CMPI_RC_ERR_FAILED;                              \
+            rc->msg = NULL;                                           \
+        }                                                             \
+        return NULL;                                                  \
+    }                                                                 \
+    base##pn.incUseCount();                                           \
     return &mi;
 
-#define CMInstanceMIFactory(cn, pn) \
-    CMPI_EXTERN_C CMPIInstanceMI *pn##_Create_InstanceMI( \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) \
-    { \
-        static CMPIInstanceMIFT instMIFT = { \
-            CMPICurrentVersion, CMPICurrentVersion, "instance" #pn, \
-            (CMPIStatus(*)(CMPIInstanceMI *, const CMPIContext *, \
-                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup, \
-            CmpiInstanceMI::driveEnumInstanceNames, CmpiInstanceMI::driveEnumInstances, \
-            CmpiInstanceMI::driveGetInstance, CmpiInstanceMI::driveCreateInstance, \
-            CmpiInstanceMI::driveSetInstance, CmpiInstanceMI::driveDeleteInstance, \
-            CmpiInstanceMI::driveExecQuery}; \
-        CMMIFactoryBody__(cn, pn, CMPIInstanceMI, instMIFT) \
+#define CMInstanceMIFactory(cn, pn)                                          \
+    CMPI_EXTERN_C CMPIInstanceMI *pn##_Create_InstanceMI(                    \
+        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+        static CMPIInstanceMIFT instMIFT = {                                 \
+            CMPICurrentVersion,                                              \
+            CMPICurrentVersion,                                              \
+            "instance" #pn,                                                  \
+            (CMPIStatus(*)(CMPIInstanceMI *, const CMPIContext *,            \
+                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
+            CmpiInstanceMI::driveEnumInstanceNames,                          \
+            CmpiInstanceMI::driveEnumInstances,                              \
+            CmpiInstanceMI::driveGetInstance,                                \
+            CmpiInstanceMI::driveCreateInstance,                             \
+            CmpiInstanceMI::driveSetInstance,                                \
+            CmpiInstanceMI::driveDeleteInstance,                             \
+            CmpiInstanceMI::driveExecQuery};                                 \
+        CMMIFactoryBody__(cn, pn, CMPIInstanceMI, instMIFT)                  \
     }
 
-#define CMAssociationMIFactory(cn, pn) \
-    CMPI_EXTERN_C CMPIAssociationMI *pn##_Create_AssociationMI( \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) \
-    { \
-        static CMPIAssociationMIFT assocMIFT = { \
-            CMPICurrentVersion, CMPICurrentVersion, "association" #pn, \
-            (CMPIStatus(*)(CMPIAssociationMI *, const CMPIContext *, \
-                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup, \
-            CmpiAssociationMI::driveAssociators, CmpiAssociationMI::driveAssociatorNames, \
-            CmpiAssociationMI::driveReferences, CmpiAssociationMI::driveReferenceNames}; \
-        CMMIFactoryBody__(cn, pn, CMPIAssociationMI, assocMIFT) \
+#define CMAssociationMIFactory(cn, pn)                                       \
+    CMPI_EXTERN_C CMPIAssociationMI *pn##_Create_AssociationMI(              \
+        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+        static CMPIAssociationMIFT assocMIFT = {                             \
+            CMPICurrentVersion,                                              \
+            CMPICurrentVersion,                                              \
+            "association" #pn,                                               \
+            (CMPIStatus(*)(CMPIAssociationMI *, const CMPIContext *,         \
+                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
+            CmpiAssociationMI::driveAssociators,                             \
+            CmpiAssociationMI::driveAssociatorNames,                         \
+            CmpiAssociationMI::driveReferences,                              \
+            CmpiAssociationMI::driveReferenceNames};                         \
+        CMMIFactoryBody__(cn, pn, CMPIAssociationMI, assocMIFT)              \
     }
 
-#define CMMethodMIFactory(cn, pn) \
-    CMPI_EXTERN_C CMPIMethodMI *pn##_Create_MethodMI( \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) \
-    { \
-        static CMPIMethodMIFT methMIFT = { \
-            CMPICurrentVersion, CMPICurrentVersion, "method" #pn, \
-            (CMPIStatus(*)(CMPIMethodMI *, const CMPIContext *, \
-                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup, \
-            CmpiMethodMI::driveInvokeMethod}; \
-        CMMIFactoryBody__(cn, pn, CMPIMethodMI, methMIFT) \
+#define CMMethodMIFactory(cn, pn)                                                               \
+    CMPI_EXTERN_C CMPIMethodMI *pn##_Create_MethodMI(const CMPIBroker *broker,                  \
+                                                     const CMPIContext *ctxp, CMPIStatus *rc) { \
+        static CMPIMethodMIFT methMIFT = {                                                      \
+            CMPICurrentVersion, CMPICurrentVersion, "method" #pn,                               \
+            (CMPIStatus(*)(CMPIMethodMI *, const CMPIContext *,                                 \
+                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup,                           \
+            CmpiMethodMI::driveInvokeMethod};                                                   \
+        CMMIFactoryBody__(cn, pn, CMPIMethodMI, methMIFT)                                       \
     }
 
-#define CMPropertyMIFactory(cn, pn) \
-    CMPI_EXTERN_C CMPIPropertyMI *pn##_Create_PropertyMI( \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) \
-    { \
-        static CMPIPropertyMIFT propMIFT = { \
-            CMPICurrentVersion, CMPICurrentVersion, "property" #pn, \
-            (CMPIStatus(*)(CMPIPropertyMI *, const CMPIContext *, \
-                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup, \
-            CmpiPropertyMI::driveSetProperty, CmpiPropertyMI::driveGetProperty}; \
-        CMMIFactoryBody__(cn, pn, CMPIPropertyMI, propMIFT) \
+#define CMPropertyMIFactory(cn, pn)                                          \
+    CMPI_EXTERN_C CMPIPropertyMI *pn##_Create_PropertyMI(                    \
+        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+        static CMPIPropertyMIFT propMIFT = {                                 \
+            CMPICurrentVersion,                                              \
+            CMPICurrentVersion,                                              \
+            "property" #pn,                                                  \
+            (CMPIStatus(*)(CMPIPropertyMI *, const CMPIContext *,            \
+                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
+            CmpiPropertyMI::driveSetProperty,                                \
+            CmpiPropertyMI::driveGetProperty};                               \
+        CMMIFactoryBody__(cn, pn, CMPIPropertyMI, propMIFT)                  \
     }
 
 #ifdef CMPI_VER_86
-#  define CMIndicationMIFactoryExtensions \
+#define CMIndicationMIFactoryExtensions \
     CmpiIndicationMI::driveEnableIndications, CmpiIndicationMI::driveDisableIndications
 #else
-#  define CMIndicationMIFactoryExtensions
+#define CMIndicationMIFactoryExtensions
 #endif
 
-#define CMIndicationMIFactory(cn, pn) \
-    CMPI_EXTERN_C CMPIIndicationMI *pn##_Create_IndicationMI( \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) \
-    { \
-        static CMPIIndicationMIFT indMIFT = { \
-            CMPICurrentVersion, CMPICurrentVersion, "indication" #pn, \
-            (CMPIStatus(*)(CMPIIndicationMI *, const CMPIContext *, \
-                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup, \
-            CmpiIndicationMI::driveAuthorizeFilter, CmpiIndicationMI::driveMustPoll, \
-            CmpiIndicationMI::driveActivateFilter, CmpiIndicationMI::driveDeActivateFilter, \
-            CMIndicationMIFactoryExtensions}; \
-        CMMIFactoryBody__(cn, pn, CMPIIndicationMI, indMIFT) \
+#define CMIndicationMIFactory(cn, pn)                                        \
+    CMPI_EXTERN_C CMPIIndicationMI *pn##_Create_IndicationMI(                \
+        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+        static CMPIIndicationMIFT indMIFT = {                                \
+            CMPICurrentVersion,                                              \
+            CMPICurrentVersion,                                              \
+            "indication" #pn,                                                \
+            (CMPIStatus(*)(CMPIIndicationMI *, const CMPIContext *,          \
+                           CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
+            CmpiIndicationMI::driveAuthorizeFilter,                          \
+            CmpiIndicationMI::driveMustPoll,                                 \
+            CmpiIndicationMI::driveActivateFilter,                           \
+            CmpiIndicationMI::driveDeActivateFilter,                         \
+            CMIndicationMIFactoryExtensions};                                \
+        CMMIFactoryBody__(cn, pn, CMPIIndicationMI, indMIFT)                 \
     }
 
 #endif /* _CMPIMACS_H_ */

@@ -42,8 +42,9 @@ std::vector<std::string> ends(const std::vector<Instance>& associations,
         std::string line;
         for (const char* role : roles) {
             const tvrnhost::Value* v = a.get(role);
-            line += (line.empty() ? "" : " ") +
-                    (v == nullptr || v->isNull() ? std::string(role) + ":NULL" : shortName(v->asReference()));
+            line += (line.empty() ? "" : " ") + (v == nullptr || v->isNull()
+                                                     ? std::string(role) + ":NULL"
+                                                     : shortName(v->asReference()));
         }
         out.push_back(line);
     }
@@ -134,13 +135,13 @@ const Mismatch_Case kMismatches[] = {
     // An adapter gone between the two readings of the adapter list.
     {"TAVRIN_ProductElementComponent", "getAllAdaptersIndexString", "", TVRN_SIM_FAULT_DROP_MEMBER,
      "indexStrings.2", 1, "Invalid mapping information."},
-    {"TAVRIN_ProductPhysicalComponent", "getAllAdaptersIndexString", "",
-     TVRN_SIM_FAULT_DROP_MEMBER, "indexStrings.2", 1, "Error: Improper Product Information!"},
+    {"TAVRIN_ProductPhysicalComponent", "getAllAdaptersIndexString", "", TVRN_SIM_FAULT_DROP_MEMBER,
+     "indexStrings.2", 1, "Error: Improper Product Information!"},
     {"TAVRIN_Realizes", "getAllAdaptersIndexString", "", TVRN_SIM_FAULT_DROP_MEMBER,
      "indexStrings.2", 1, "Error: Invalid number of instances returned!"},
     // No adapters left for the port groups.
-    {"TAVRIN_MemberOfCollection", "getAllAdaptersIndexString", "", TVRN_SIM_FAULT_NULL_ANSWER,
-     "", 1, "Error: Invalid number of instances returned!"},
+    {"TAVRIN_MemberOfCollection", "getAllAdaptersIndexString", "", TVRN_SIM_FAULT_NULL_ANSWER, "",
+     1, "Error: Invalid number of instances returned!"},
     // An Ethernet port that cannot be read while the ports are fetched.
     {"TAVRIN_LANEndpointDeviceSAPImplementation", "getEthPortByEthMac", "00:05:1e:8a:4b:01",
      TVRN_SIM_FAULT_NULL_ANSWER, "", 0, "Error: Invalid mapping information!"},
@@ -163,15 +164,16 @@ TEST(Associations, FailWhenTheirSetsDoNotAgree) {
 TEST(Associations, RealizesPairsOnlyByPosition) {
     Module_Session& s = Module_Session::open();
     // The packages see the first adapter without a serial number.
-    ASSERT_EQ(0, tvrn_sim_set_fault_after("getHbaByWwn", "20:00:00:05:1e:0a:0b:0c",
-                                          TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.serialNumber",
-                                          1, 1));
+    ASSERT_EQ(
+        0, tvrn_sim_set_fault_after("getHbaByWwn", "20:00:00:05:1e:0a:0b:0c",
+                                    TVRN_SIM_FAULT_DROP_MEMBER, 0, "hbaData.serialNumber", 1, 1));
     Result<Instance> r = s.enumerate("TAVRIN_Realizes");
     ASSERT_TRUE(r.ok()) << r.toString();
-    EXPECT_EQ(ends(r.items, {"Dependent", "Antecedent"}),
-              (std::vector<std::string>{
-                  "PortController:200000051e5c6d70 PhysicalPackage:5f3c9e2a1b4d4e6f8a9b0c1d2e3f4a5b",
-                  "PortController:00051e8a4b00 PhysicalPackage:a1b2c3d4e5f60718293a4b5c6d7e8f90"}));
+    EXPECT_EQ(
+        ends(r.items, {"Dependent", "Antecedent"}),
+        (std::vector<std::string>{
+            "PortController:200000051e5c6d70 PhysicalPackage:5f3c9e2a1b4d4e6f8a9b0c1d2e3f4a5b",
+            "PortController:00051e8a4b00 PhysicalPackage:a1b2c3d4e5f60718293a4b5c6d7e8f90"}));
 }
 
 // ---- adapters of other hosts ---------------------------------------------------------
@@ -188,7 +190,8 @@ TEST(Associations, DriversGoWithTheControllersTheyDrive) {
         ASSERT_TRUE(r.ok()) << r.toString();
         std::set<std::string> withStorageDriver, withNetworkDriver;
         for (const Instance& a : r.items) {
-            const std::string controller = a.get("Dependent")->asReference().key("DeviceID")->asString();
+            const std::string controller =
+                a.get("Dependent")->asReference().key("DeviceID")->asString();
             const std::string identity =
                 a.get("Antecedent")->asReference().key("InstanceID")->asString();
             if (identity == "tvfc")
@@ -198,9 +201,9 @@ TEST(Associations, DriversGoWithTheControllersTheyDrive) {
             else  // firmware or BIOS: its own adapter's only
                 EXPECT_EQ(identity.substr(0, identity.find('_')), controller);
         }
-        EXPECT_EQ(withStorageDriver, (std::set<std::string>{"200000051e0a0b0c", "200000051e5c6d70",
-                                                             "200000051e7e8f90", "00051e8a4b00",
-                                                             "00051e9c5d00"}));
+        EXPECT_EQ(withStorageDriver,
+                  (std::set<std::string>{"200000051e0a0b0c", "200000051e5c6d70", "200000051e7e8f90",
+                                         "00051e8a4b00", "00051e9c5d00"}));
         EXPECT_EQ(withNetworkDriver, (std::set<std::string>{"00051e8a4b00", "00051e9c5d00"}));
     }
 }
@@ -256,13 +259,14 @@ TEST(Associations, TwoLunsBehindOneTargetGiveTwoPathsThatShareItsEnds) {
     for (const std::string& path : ends(r.items, {"Initiator", "Target", "LogicalUnit"}))
         if (path.find("SCSIProtocolEndpoint:100000051e8a4b01 ") == 0)
             cna.push_back(path);
-    EXPECT_EQ(cna, (std::vector<std::string>{
-                       "SCSIProtocolEndpoint:100000051e8a4b01 "
-                       "SCSIProtocolEndpoint:100000051e8a4b01_500a09818628b20c "
-                       "StorageExtent:100000051e8a4b01_500a09818628b20c_NETSTOR_LUN-C-MODE_LUN_0",
-                       "SCSIProtocolEndpoint:100000051e8a4b01 "
-                       "SCSIProtocolEndpoint:100000051e8a4b01_500a09818628b20c "
-                       "StorageExtent:100000051e8a4b01_500a09818628b20c_NETSTOR_LUN-C-MODE_LUN_1"}));
+    EXPECT_EQ(cna,
+              (std::vector<std::string>{
+                  "SCSIProtocolEndpoint:100000051e8a4b01 "
+                  "SCSIProtocolEndpoint:100000051e8a4b01_500a09818628b20c "
+                  "StorageExtent:100000051e8a4b01_500a09818628b20c_NETSTOR_LUN-C-MODE_LUN_0",
+                  "SCSIProtocolEndpoint:100000051e8a4b01 "
+                  "SCSIProtocolEndpoint:100000051e8a4b01_500a09818628b20c "
+                  "StorageExtent:100000051e8a4b01_500a09818628b20c_NETSTOR_LUN-C-MODE_LUN_1"}));
 }
 
 TEST(Associations, EveryPathOfAGeneratedSan) {
@@ -321,9 +325,9 @@ TEST(Associations, ALibraryExceptionFailsTheRequest) {
         callsOf(s, "TAVRIN_PhysicalConnector", "getAllAdaptersIndexString") +
         callsOf(s, "TAVRIN_PhysicalPackage", "getAllAdaptersIndexString");
     Module_Session::open();
-    ASSERT_EQ(0, tvrn_sim_set_fault_after("getAllAdaptersIndexString", "",
-                                          TVRN_SIM_FAULT_HBA_AGENT_ERROR, 42, "bus reset",
-                                          int(fetches), 1));
+    ASSERT_EQ(
+        0, tvrn_sim_set_fault_after("getAllAdaptersIndexString", "", TVRN_SIM_FAULT_HBA_AGENT_ERROR,
+                                    42, "bus reset", int(fetches), 1));
     Result<Instance> r = s.enumerate("TAVRIN_PhysicalConnectorContainer");
     EXPECT_EQ(r.rc, CMPI_RC_ERR_FAILED) << r.toString();
     EXPECT_TRUE(r.items.empty());

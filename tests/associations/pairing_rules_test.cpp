@@ -19,12 +19,10 @@ protected:
     // The associations a rule delivers (destroyed again), or -1 for a failure.
     static int run(const Pairing& rule) {
         std::vector<Instance*> delivered;
-        Enum_Instances_Status status =
-            enumerate_pairs(rule, &TAVRIN_FCPortSystemDevice::static_meta_class,
-                            [](Instance* a, void* out) {
-                                static_cast<std::vector<Instance*>*>(out)->push_back(a);
-                            },
-                            &delivered);
+        Enum_Instances_Status status = enumerate_pairs(
+            rule, &TAVRIN_FCPortSystemDevice::static_meta_class,
+            [](Instance* a, void* out) { static_cast<std::vector<Instance*>*>(out)->push_back(a); },
+            &delivered);
         for (Instance* a : delivered)
             destroy(a);
         return status == ENUM_INSTANCES_OK ? int(delivered.size()) : -1;

@@ -95,15 +95,27 @@ TEST_F(Conversion, EveryTypeOfValueSurvivesTheWayThereAndBack) {
     const String strings[] = {"x", ""};
     const Datetime times[] = {Datetime("20240131235959.123456+000")};
     std::vector<std::pair<Value, uint32>> values;
-    for (const Value& v :
-         {value_of(true), value_of(uint8(200)), value_of(sint8(-100)), value_of(uint16(65000)),
-          value_of(sint16(-32000)), value_of(uint32(4000000000u)), value_of(sint32(-2000000000)),
-          value_of(uint64(1ull << 63)), value_of(sint64(-(1ll << 62))), value_of(real32(1.5f)),
-          value_of(real64(-2.25)), value_of(char16(0x263A)), value_of("text"),
-          value_of(Datetime("00000001020304.000005:000")),
-          value_of(Datetime("20240131235959.123456-300")), value_of(Array<uint16>(numbers, 2)),
-          value_of(Array<String>(strings, 2)), value_of(Array<Datetime>(times, 1)),
-          value_of(Array<real64>()), value_of(uint32(0), true), value_of(Array<String>(), true)})
+    for (const Value& v : {value_of(true),
+                           value_of(uint8(200)),
+                           value_of(sint8(-100)),
+                           value_of(uint16(65000)),
+                           value_of(sint16(-32000)),
+                           value_of(uint32(4000000000u)),
+                           value_of(sint32(-2000000000)),
+                           value_of(uint64(1ull << 63)),
+                           value_of(sint64(-(1ll << 62))),
+                           value_of(real32(1.5f)),
+                           value_of(real64(-2.25)),
+                           value_of(char16(0x263A)),
+                           value_of("text"),
+                           value_of(Datetime("00000001020304.000005:000")),
+                           value_of(Datetime("20240131235959.123456-300")),
+                           value_of(Array<uint16>(numbers, 2)),
+                           value_of(Array<String>(strings, 2)),
+                           value_of(Array<Datetime>(times, 1)),
+                           value_of(Array<real64>()),
+                           value_of(uint32(0), true),
+                           value_of(Array<String>(), true)})
         values.push_back({v, 0});
 
     Ref<TVRNTEST_Gadget> gadget(make_gadget());
@@ -381,8 +393,7 @@ struct Spy_Broker {
     static CMPIInstanceFT original, spied;
     static std::vector<std::string> filters;
 
-    static CMPIInstance* new_instance(const CMPIBroker*, const CMPIObjectPath* op,
-                                      CMPIStatus* rc) {
+    static CMPIInstance* new_instance(const CMPIBroker*, const CMPIObjectPath* op, CMPIStatus* rc) {
         CMPIInstance* i = CMNewInstance(real, op, rc);
         original = spied = *i->ft;
         spied.setPropertyFilter = set_filter;
@@ -428,7 +439,8 @@ TEST_F(Conversion, ThePropertyFilterIsSetBeforeAnyProperty) {
 TEST_F(Conversion, MethodOutputsLeaveTheReturnValueApart) {
     Ref<> meth(create(&TVRNTEST_Gadget_Configure_method::static_meta_class));
     __set_null_flags(meth.ptr(), true, true, true);
-    TVRNTEST_Gadget_Configure_method* r = static_cast<TVRNTEST_Gadget_Configure_method*>(meth.ptr());
+    TVRNTEST_Gadget_Configure_method* r =
+        static_cast<TVRNTEST_Gadget_Configure_method*>(meth.ptr());
     r->Level.set(3);  // an input: not sent back
     r->Report.set("done");
     TVRNTEST_Owner* owner = create<TVRNTEST_Owner>(false);

@@ -232,8 +232,8 @@ TEST_F(Dispatch, ModelsSayWhichPropertiesAreWanted) {
     ASSERT_TRUE(host.enumerateInstanceNames(NS, "TVRNTEST_Gadget").ok());
     EXPECT_EQ(text("model"), "");
 
-    Result<Instance> all = host.enumerateInstances(NS, "TVRNTEST_Gadget",
-                                                   std::vector<std::string>{"Label"});
+    Result<Instance> all =
+        host.enumerateInstances(NS, "TVRNTEST_Gadget", std::vector<std::string>{"Label"});
     EXPECT_EQ(text("model"), "Label");
     ASSERT_EQ(all.items.size(), 1u);
     EXPECT_TRUE(all.items[0].get("Label"));
@@ -402,8 +402,7 @@ TEST_F(Dispatch, ReferencesAreTheAssociationsThatHoldTheSource) {
     EXPECT_FALSE(r.items[0].get("Note"));
     ASSERT_TRUE(r.items[0].get("Left"));
 
-    r = host.references(owner_path("o2"), "TVRNTEST_Link", "",
-                        std::vector<std::string>{"Note"});
+    r = host.references(owner_path("o2"), "TVRNTEST_Link", "", std::vector<std::string>{"Note"});
     ASSERT_EQ(r.items.size(), 1u);
     ASSERT_TRUE(r.items[0].get("Note"));
     EXPECT_EQ(r.items[0].get("Note")->asString(), "n2");
@@ -579,10 +578,8 @@ TEST_F(Dispatch, BadRequestsFailCleanly) {
 
     EXPECT_EQ(mi->ft->enumerateInstances(mi, nullptr, nullptr, nullptr, nullptr).rc,
               CMPI_RC_ERR_FAILED);
-    EXPECT_EQ(mi->ft->getInstance(mi, nullptr, nullptr, nullptr, nullptr).rc,
-              CMPI_RC_ERR_FAILED);
-    EXPECT_EQ(mi->ft->createInstance(mi, nullptr, nullptr, gadget, nullptr).rc,
-              CMPI_RC_ERR_FAILED);
+    EXPECT_EQ(mi->ft->getInstance(mi, nullptr, nullptr, nullptr, nullptr).rc, CMPI_RC_ERR_FAILED);
+    EXPECT_EQ(mi->ft->createInstance(mi, nullptr, nullptr, gadget, nullptr).rc, CMPI_RC_ERR_FAILED);
     EXPECT_EQ(mi->ft->modifyInstance(mi, nullptr, nullptr, gadget, nullptr, nullptr).rc,
               CMPI_RC_ERR_FAILED);
     EXPECT_EQ(mi->ft->deleteInstance(mi, nullptr, nullptr, nullptr).rc, CMPI_RC_ERR_FAILED);

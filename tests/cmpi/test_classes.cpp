@@ -9,20 +9,34 @@ namespace {
 
 #define MF(x) reinterpret_cast<const Meta_Feature*>(&(x))
 
-#define PROP(CLS, NAME, TYPE, SUB, FLAGS)                                                  \
-    const Meta_Property CLS##_##NAME = {0,    FLAG_PROPERTY | (FLAGS), #NAME, nullptr, 0,  \
-                                        TYPE, SUB, CPTA_SLOT_OFFSET(CLS, NAME), nullptr}
+#define PROP(CLS, NAME, TYPE, SUB, FLAGS)                           \
+    const Meta_Property CLS##_##NAME = {                            \
+        0,   FLAG_PROPERTY | (FLAGS),     #NAME,  nullptr, 0, TYPE, \
+        SUB, CPTA_SLOT_OFFSET(CLS, NAME), nullptr}
 
-#define REF(CLS, NAME, SUB, FLAGS, TARGET)                                                   \
-    const Meta_Reference CLS##_##NAME = {0,   FLAG_REFERENCE | (FLAGS), #NAME, nullptr, 0,  \
-                                         SUB, &TARGET::static_meta_class,                    \
+#define REF(CLS, NAME, SUB, FLAGS, TARGET)                           \
+    const Meta_Reference CLS##_##NAME = {0,                          \
+                                         FLAG_REFERENCE | (FLAGS),   \
+                                         #NAME,                      \
+                                         nullptr,                    \
+                                         0,                          \
+                                         SUB,                        \
+                                         &TARGET::static_meta_class, \
                                          CPTA_SLOT_OFFSET(CLS, NAME)}
 
-#define CLASS(CLS, FLAGS, SUPER, NUM_KEYS)                                                  \
-    const Meta_Class CLS::static_meta_class = {                                             \
-        0,           FLAGS,        #CLS,  nullptr, 0,       CLS##_features,                 \
-        sizeof(CLS##_features) / sizeof(CLS##_features[0]), sizeof(CLS), CLS##_locals,      \
-        SUPER,       NUM_KEYS,     &tvrntest_repository}
+#define CLASS(CLS, FLAGS, SUPER, NUM_KEYS)                                                         \
+    const Meta_Class CLS::static_meta_class = {0,                                                  \
+                                               FLAGS,                                              \
+                                               #CLS,                                               \
+                                               nullptr,                                            \
+                                               0,                                                  \
+                                               CLS##_features,                                     \
+                                               sizeof(CLS##_features) / sizeof(CLS##_features[0]), \
+                                               sizeof(CLS),                                        \
+                                               CLS##_locals,                                       \
+                                               SUPER,                                              \
+                                               NUM_KEYS,                                           \
+                                               &tvrntest_repository}
 
 // TVRNTEST_Owner
 PROP(TVRNTEST_Owner, Id, STRING, 0, FLAG_KEY);
@@ -57,29 +71,38 @@ const Meta_Feature* const TVRNTEST_Gadget_Configure_method_features[] = {
 }  // namespace
 
 const Meta_Method TVRNTEST_Gadget_Configure_method::static_meta_class = {
-    0, FLAG_METHOD, "Configure", nullptr, 0, TVRNTEST_Gadget_Configure_method_features,
+    0,
+    FLAG_METHOD,
+    "Configure",
+    nullptr,
+    0,
+    TVRNTEST_Gadget_Configure_method_features,
     sizeof(TVRNTEST_Gadget_Configure_method_features) / sizeof(void*),
-    sizeof(TVRNTEST_Gadget_Configure_method), UINT32};
+    sizeof(TVRNTEST_Gadget_Configure_method),
+    UINT32};
 
 namespace {
 
 const Meta_Feature* const TVRNTEST_Gadget_features[] = {
-    MF(TVRNTEST_Gadget_Name),  MF(TVRNTEST_Gadget_Port),   MF(TVRNTEST_Gadget_Index),
-    MF(TVRNTEST_Gadget_Label), MF(TVRNTEST_Gadget_When),   MF(TVRNTEST_Gadget_Tags),
-    MF(TVRNTEST_Gadget_Ratio), MF(TVRNTEST_Gadget_Flag),   MF(TVRNTEST_Gadget_Initial),
-    MF(TVRNTEST_Gadget_Owner), MF(TVRNTEST_Gadget_Detail),
-    MF(TVRNTEST_Gadget_Configure_method::static_meta_class)};
+    MF(TVRNTEST_Gadget_Name),    MF(TVRNTEST_Gadget_Port),
+    MF(TVRNTEST_Gadget_Index),   MF(TVRNTEST_Gadget_Label),
+    MF(TVRNTEST_Gadget_When),    MF(TVRNTEST_Gadget_Tags),
+    MF(TVRNTEST_Gadget_Ratio),   MF(TVRNTEST_Gadget_Flag),
+    MF(TVRNTEST_Gadget_Initial), MF(TVRNTEST_Gadget_Owner),
+    MF(TVRNTEST_Gadget_Detail),  MF(TVRNTEST_Gadget_Configure_method::static_meta_class)};
 const bool TVRNTEST_Gadget_locals[] = {true, true, true, true, true, true,
                                        true, true, true, true, true, true};
 
 // TVRNTEST_Special_Gadget
 PROP(TVRNTEST_Special_Gadget, Extra, STRING, 0, 0);
 const Meta_Feature* const TVRNTEST_Special_Gadget_features[] = {
-    MF(TVRNTEST_Gadget_Name),  MF(TVRNTEST_Gadget_Port),   MF(TVRNTEST_Gadget_Index),
-    MF(TVRNTEST_Gadget_Label), MF(TVRNTEST_Gadget_When),   MF(TVRNTEST_Gadget_Tags),
-    MF(TVRNTEST_Gadget_Ratio), MF(TVRNTEST_Gadget_Flag),   MF(TVRNTEST_Gadget_Initial),
-    MF(TVRNTEST_Gadget_Owner), MF(TVRNTEST_Gadget_Detail),
-    MF(TVRNTEST_Gadget_Configure_method::static_meta_class), MF(TVRNTEST_Special_Gadget_Extra)};
+    MF(TVRNTEST_Gadget_Name),         MF(TVRNTEST_Gadget_Port),
+    MF(TVRNTEST_Gadget_Index),        MF(TVRNTEST_Gadget_Label),
+    MF(TVRNTEST_Gadget_When),         MF(TVRNTEST_Gadget_Tags),
+    MF(TVRNTEST_Gadget_Ratio),        MF(TVRNTEST_Gadget_Flag),
+    MF(TVRNTEST_Gadget_Initial),      MF(TVRNTEST_Gadget_Owner),
+    MF(TVRNTEST_Gadget_Detail),       MF(TVRNTEST_Gadget_Configure_method::static_meta_class),
+    MF(TVRNTEST_Special_Gadget_Extra)};
 const bool TVRNTEST_Special_Gadget_locals[] = {false, false, false, false, false, false, false,
                                                false, false, false, false, false, true};
 

@@ -45,7 +45,7 @@ struct Test_State {
     std::map<std::string, long> counters;
     std::string model;    // non-null properties of the last model seen
     std::string created;  // the last instance created, printed
-    long flood = -1;  // pause between flooded indications in microseconds; -1: no flood
+    long flood = -1;      // pause between flooded indications in microseconds; -1: no flood
 
     void clear() {
         for (Instance* i : gadgets)
@@ -233,8 +233,8 @@ public:
         bool has_user = cimom::get_username(user);
         char text[256];
         snprintf(text, sizeof(text), "level=%u targets=%zu null=%d user=%s",
-                 Level.null ? 0u : unsigned(Level.value), Targets.value.size(),
-                 int(Targets.null), has_user ? user.c_str() : "?");
+                 Level.null ? 0u : unsigned(Level.value), Targets.value.size(), int(Targets.null),
+                 has_user ? user.c_str() : "?");
         Report.set(String(text));
         TVRNTEST_Owner* owner = create<TVRNTEST_Owner>(false);
         owner->Id.set("result");
@@ -264,7 +264,8 @@ std::string _call_back(const TVRNTEST_Gadget* self) {
     int created = cimom::create_instance("root/test", model.ptr());
     model->Name.set("renamed");
     int modified = cimom::modify_instance("root/test", model.ptr());
-    Ref<TVRNTEST_Owner> got(static_cast<TVRNTEST_Owner*>(cimom::get_instance("root/test", model.ptr())));
+    Ref<TVRNTEST_Owner> got(
+        static_cast<TVRNTEST_Owner*>(cimom::get_instance("root/test", model.ptr())));
     int deleted = cimom::delete_instance("root/test", model.ptr());
 
     Ref<TVRNTEST_Gadget_Configure_method> meth(static_cast<TVRNTEST_Gadget_Configure_method*>(
@@ -289,8 +290,7 @@ int TVRNTEST_Gadget_invoke_method(P* provider, const TVRNTEST_Gadget* self, Inst
     if (strcasecmp(record->meta_class->name, "Configure") != 0)
         return -1;
     TVRNTEST_Gadget_Configure_method* r = static_cast<TVRNTEST_Gadget_Configure_method*>(record);
-    return provider->Configure(self, r->Level, r->Targets, r->Report, r->Result,
-                               r->return_value);
+    return provider->Configure(self, r->Level, r->Targets, r->Report, r->Result, r->return_value);
 }
 
 //------------------------------------------------------------------------------
@@ -319,9 +319,9 @@ public:
         return CREATE_INSTANCE_OK;
     }
 
-    Enum_Associator_Names_Status enum_associator_names(
-        const Instance*, const String&, const String&, const String&,
-        Enum_Associator_Names_Handler<Instance>*) {
+    Enum_Associator_Names_Status enum_associator_names(const Instance*, const String&,
+                                                       const String&, const String&,
+                                                       Enum_Associator_Names_Handler<Instance>*) {
         long f = forced("associator_names");
         return f >= 0 ? Enum_Associator_Names_Status(f) : ENUM_ASSOCIATOR_NAMES_UNSUPPORTED;
     }
@@ -412,9 +412,8 @@ private:
             {
                 std::unique_lock<std::mutex> lock(self->_mutex);
                 if (flood < 0)
-                    self->_wake.wait_for(lock, std::chrono::milliseconds(20), [self] {
-                        return self->_stop || self->_pending > 0;
-                    });
+                    self->_wake.wait_for(lock, std::chrono::milliseconds(20),
+                                         [self] { return self->_stop || self->_pending > 0; });
                 if (self->_stop)
                     break;
                 if (flood < 0 && self->_pending == 0)

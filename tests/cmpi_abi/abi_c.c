@@ -15,10 +15,14 @@
 
 /* ---- stub macros: every slot function the stubs name, doing nothing ---- */
 #pragma GCC diagnostic ignored "-Wunused-parameter"
-#define PROBE(name, ...) static CMPIStatus Probe##name(__VA_ARGS__) { CMReturn(CMPI_RC_OK); }
+#define PROBE(name, ...)                         \
+    static CMPIStatus Probe##name(__VA_ARGS__) { \
+        CMReturn(CMPI_RC_OK);                    \
+    }
 #define MI_ARGS(MI) MI *mi, const CMPIContext *ctx, const CMPIResult *rslt, const CMPIObjectPath *op
-#define IND_ARGS CMPIIndicationMI *mi, const CMPIContext *ctx, const CMPISelectExp *f, const char *cn, \
-                 const CMPIObjectPath *op
+#define IND_ARGS                                                                          \
+    CMPIIndicationMI *mi, const CMPIContext *ctx, const CMPISelectExp *f, const char *cn, \
+        const CMPIObjectPath *op
 
 static const CMPIBroker *stubBroker;
 static int hookRuns;
@@ -33,21 +37,20 @@ PROBE(DeleteInstance, MI_ARGS(CMPIInstanceMI))
 PROBE(ExecQuery, MI_ARGS(CMPIInstanceMI), const char *q, const char *l)
 CMInstanceMIStub(Probe, TvrnProbe, stubBroker, hookRuns++)
 
-PROBE(MethodCleanup, CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBoolean t)
-PROBE(InvokeMethod, MI_ARGS(CMPIMethodMI), const char *m, const CMPIArgs *in, CMPIArgs *out)
-CMMethodMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
+    PROBE(MethodCleanup, CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBoolean t)
+        PROBE(InvokeMethod, MI_ARGS(CMPIMethodMI), const char *m, const CMPIArgs *in,
+              CMPIArgs *out) CMMethodMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
 
-PROBE(IndicationCleanup, CMPIIndicationMI *mi, const CMPIContext *ctx, CMPIBoolean t)
-PROBE(AuthorizeFilter, IND_ARGS, const char *owner)
-PROBE(MustPoll, IND_ARGS)
-PROBE(ActivateFilter, IND_ARGS, CMPIBoolean first)
-PROBE(DeActivateFilter, IND_ARGS, CMPIBoolean last)
-PROBE(EnableIndications, CMPIIndicationMI *mi, const CMPIContext *ctx)
-PROBE(DisableIndications, CMPIIndicationMI *mi, const CMPIContext *ctx)
-CMIndicationMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
+            PROBE(IndicationCleanup, CMPIIndicationMI *mi, const CMPIContext *ctx,
+                  CMPIBoolean t) PROBE(AuthorizeFilter, IND_ARGS, const char *owner)
+                PROBE(MustPoll, IND_ARGS) PROBE(ActivateFilter, IND_ARGS, CMPIBoolean first)
+                    PROBE(DeActivateFilter, IND_ARGS, CMPIBoolean last)
+                        PROBE(EnableIndications, CMPIIndicationMI *mi, const CMPIContext *ctx)
+                            PROBE(DisableIndications, CMPIIndicationMI *mi, const CMPIContext *ctx)
+                                CMIndicationMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
 
-struct tvrn_abi_stub_probe tvrn_abi_run_c_stubs(const void *broker)
-{
+                                    struct tvrn_abi_stub_probe
+    tvrn_abi_run_c_stubs(const void *broker) {
     struct tvrn_abi_stub_probe probe;
     hookRuns = 0;
     stubBroker = NULL;

@@ -52,7 +52,9 @@ const std::string& home() {
     return dir;
 }
 
-std::string logFile() { return home() + "/.cimple/messages"; }
+std::string logFile() {
+    return home() + "/.cimple/messages";
+}
 
 std::size_t logSize() {
     std::ifstream is(logFile(), std::ios::ate);
@@ -131,7 +133,9 @@ void Module_Session::close() {
 
 Module_Session::Module_Session() = default;
 
-Module_Session::~Module_Session() { stop(); }
+Module_Session::~Module_Session() {
+    stop();
+}
 
 bool Module_Session::start(const std::string& fixture, const std::string& logLevel) {
     _fixture = fixture;
@@ -171,7 +175,9 @@ void Module_Session::resetSimulator() {
     clearRecording();
 }
 
-bool Module_Session::loaded() const { return _host != nullptr; }
+bool Module_Session::loaded() const {
+    return _host != nullptr;
+}
 
 tvrnhost::Host& Module_Session::host() {
     if (!_host)
@@ -187,7 +193,9 @@ Result<ObjectPath> Module_Session::enumerateNames(const std::string& className) 
     return host().enumerateInstanceNames(kNameSpace, className);
 }
 
-InstanceResult Module_Session::get(const ObjectPath& path) { return host().getInstance(path); }
+InstanceResult Module_Session::get(const ObjectPath& path) {
+    return host().getInstance(path);
+}
 
 MethodResult Module_Session::invoke(const ObjectPath& path, const std::string& method,
                                     const PropertyVector& in) {
@@ -241,7 +249,9 @@ std::string Module_Session::masked(const std::string& text) const {
     return out;
 }
 
-void Module_Session::markLog() { _logMark = logSize(); }
+void Module_Session::markLog() {
+    _logMark = logSize();
+}
 
 std::vector<std::string> Module_Session::logLines() const {
     std::ifstream is(logFile());
@@ -264,9 +274,13 @@ unsigned long long Module_Session::calls(const std::string& entryPoint) const {
     return tvrn_sim_call_count(entryPoint.c_str());
 }
 
-unsigned long long Module_Session::totalCalls() const { return tvrn_sim_total_calls(); }
+unsigned long long Module_Session::totalCalls() const {
+    return tvrn_sim_total_calls();
+}
 
-void Module_Session::resetCounters() { tvrn_sim_reset_counters(); }
+void Module_Session::resetCounters() {
+    tvrn_sim_reset_counters();
+}
 
 std::vector<std::string> Module_Session::recordedEntries() const {
     Json::Value calls;
@@ -280,11 +294,12 @@ std::vector<std::string> Module_Session::recordedEntries() const {
     return entries;
 }
 
-void Module_Session::clearRecording() { tvrn_sim_clear_recording(); }
+void Module_Session::clearRecording() {
+    tvrn_sim_clear_recording();
+}
 
 bool Module_Session::fault(const std::string& entryPoint, const std::string& key,
-                           tvrn_sim_fault_kind kind, const std::string& text, int times,
-                           int code) {
+                           tvrn_sim_fault_kind kind, const std::string& text, int times, int code) {
     return tvrn_sim_set_fault(entryPoint.c_str(), key.empty() ? nullptr : key.c_str(), int(kind),
                               code, text.empty() ? nullptr : text.c_str(), times) == 0;
 }

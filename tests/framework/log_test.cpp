@@ -211,8 +211,8 @@ TEST_F(Log_Test, ConcurrentMessagesStayWhole) {
         int t = -1, i = -1, end = 0;
         char z[128] = "";
         ASSERT_TRUE(stamped(line)) << line;
-        sscanf(line.c_str() + 20, "DBG: log_test.cpp(%*d): thread %d message %d %127s%n", &t, &i,
-               z, &end);
+        sscanf(line.c_str() + 20, "DBG: log_test.cpp(%*d): thread %d message %d %127s%n", &t, &i, z,
+               &end);
         ASSERT_TRUE(std::string(z) == std::string(100, 'z') && line[20 + end] == 0) << line;
         seen.insert({t, i});
     }

@@ -338,7 +338,7 @@ TEST(Association, ReferencesAndAssociators) {
     Ref<Test_Assoc> a(make_assoc(make_base("b", 1), make_other("o")));
     a->Owner = make_other("owner");
     a->Members.value.append(make_other("member"));  // arrays are not ends
-    Ref<Test_Sub> source(create<Test_Sub>(false));   // a subclass with the same keys
+    Ref<Test_Sub> source(create<Test_Sub>(false));  // a subclass with the same keys
     source->InstanceID.set("b");
     source->Number.set(1);
     Ref<Test_Base> stranger(make_base("c", 1));

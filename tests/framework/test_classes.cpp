@@ -10,18 +10,33 @@ namespace {
 #define MV(x) reinterpret_cast<const Meta_Value*>(&(x))
 #define MF(x) reinterpret_cast<const Meta_Feature*>(&(x))
 
-#define PROP(CLS, NAME, TYPE, SUB, FLAGS, DEF)                                                 \
-    const Meta_Property CLS##_##NAME = {0,    FLAG_PROPERTY | (FLAGS), #NAME, nullptr, 0, TYPE, \
+#define PROP(CLS, NAME, TYPE, SUB, FLAGS, DEF)                                                     \
+    const Meta_Property CLS##_##NAME = {0,   FLAG_PROPERTY | (FLAGS),     #NAME, nullptr, 0, TYPE, \
                                         SUB, CPTA_SLOT_OFFSET(CLS, NAME), DEF}
 
-#define REF(CLS, NAME, SUB, FLAGS, TARGET)                                                    \
-    const Meta_Reference CLS##_##NAME = {0,   FLAG_REFERENCE | (FLAGS),  #NAME, nullptr, 0, \
-                                         SUB, &TARGET::static_meta_class, CPTA_SLOT_OFFSET(CLS, NAME)}
+#define REF(CLS, NAME, SUB, FLAGS, TARGET)                           \
+    const Meta_Reference CLS##_##NAME = {0,                          \
+                                         FLAG_REFERENCE | (FLAGS),   \
+                                         #NAME,                      \
+                                         nullptr,                    \
+                                         0,                          \
+                                         SUB,                        \
+                                         &TARGET::static_meta_class, \
+                                         CPTA_SLOT_OFFSET(CLS, NAME)}
 
-#define CLASS(CLS, FLAGS, SUPER, NUM_KEYS)                                                     \
-    const Meta_Class CLS::static_meta_class = {                                                \
-        0,       FLAGS, #CLS, nullptr, 0, CLS##_features, sizeof(CLS##_features) / sizeof(void*), \
-        sizeof(CLS), CLS##_locals, SUPER, NUM_KEYS, &test_repository}
+#define CLASS(CLS, FLAGS, SUPER, NUM_KEYS)                                             \
+    const Meta_Class CLS::static_meta_class = {0,                                      \
+                                               FLAGS,                                  \
+                                               #CLS,                                   \
+                                               nullptr,                                \
+                                               0,                                      \
+                                               CLS##_features,                         \
+                                               sizeof(CLS##_features) / sizeof(void*), \
+                                               sizeof(CLS),                            \
+                                               CLS##_locals,                           \
+                                               SUPER,                                  \
+                                               NUM_KEYS,                               \
+                                               &test_repository}
 
 // Defaults.
 const Meta_Value_Scalar<uint16> _enabled_state = {5};
@@ -55,16 +70,20 @@ const Meta_Feature* const Test_Base_Reset_method_features[] = {
 }  // namespace
 
 const Meta_Method Test_Base_Reset_method::static_meta_class = {
-    0, FLAG_METHOD, "Reset", nullptr, 0, Test_Base_Reset_method_features, 2,
-    sizeof(Test_Base_Reset_method), UINT32};
+    0,       FLAG_METHOD,
+    "Reset", nullptr,
+    0,       Test_Base_Reset_method_features,
+    2,       sizeof(Test_Base_Reset_method),
+    UINT32};
 
 namespace {
 
 const Meta_Feature* const Test_Base_features[] = {
-    MF(Test_Base_InstanceID), MF(Test_Base_Number),  MF(Test_Base_ElementName),
-    MF(Test_Base_EnabledState), MF(Test_Base_Caption), MF(Test_Base_Codes),
-    MF(Test_Base_Names),      MF(Test_Base_Removal), MF(Test_Base_Counts),
-    MF(Test_Base_Reset_method::static_meta_class),
+    MF(Test_Base_InstanceID),  MF(Test_Base_Number),
+    MF(Test_Base_ElementName), MF(Test_Base_EnabledState),
+    MF(Test_Base_Caption),     MF(Test_Base_Codes),
+    MF(Test_Base_Names),       MF(Test_Base_Removal),
+    MF(Test_Base_Counts),      MF(Test_Base_Reset_method::static_meta_class),
 };
 const bool Test_Base_locals[] = {true, true, true, true, true, true, true, true, true, true};
 
@@ -73,10 +92,12 @@ PROP(Test_Sub, Caption, STRING, 0, 0, MV(_sub_caption));
 PROP(Test_Sub, Extra, UINT32, 0, 0, nullptr);
 
 const Meta_Feature* const Test_Sub_features[] = {
-    MF(Test_Base_InstanceID), MF(Test_Base_Number),  MF(Test_Base_ElementName),
-    MF(Test_Base_EnabledState), MF(Test_Sub_Caption), MF(Test_Base_Codes),
-    MF(Test_Base_Names),      MF(Test_Base_Removal), MF(Test_Base_Counts),
-    MF(Test_Base_Reset_method::static_meta_class), MF(Test_Sub_Extra),
+    MF(Test_Base_InstanceID),  MF(Test_Base_Number),
+    MF(Test_Base_ElementName), MF(Test_Base_EnabledState),
+    MF(Test_Sub_Caption),      MF(Test_Base_Codes),
+    MF(Test_Base_Names),       MF(Test_Base_Removal),
+    MF(Test_Base_Counts),      MF(Test_Base_Reset_method::static_meta_class),
+    MF(Test_Sub_Extra),
 };
 const bool Test_Sub_locals[] = {false, false, false, false, true, false,
                                 false, false, false, false, true};
@@ -90,9 +111,9 @@ REF(Test_Assoc, Dependent, 0, FLAG_KEY, Test_Other);
 REF(Test_Assoc, Owner, 0, 0, Test_Other);
 REF(Test_Assoc, Members, -1, 0, Test_Other);
 PROP(Test_Assoc, Note, STRING, 0, 0, nullptr);
-const Meta_Feature* const Test_Assoc_features[] = {
-    MF(Test_Assoc_Antecedent), MF(Test_Assoc_Dependent), MF(Test_Assoc_Owner),
-    MF(Test_Assoc_Members), MF(Test_Assoc_Note)};
+const Meta_Feature* const Test_Assoc_features[] = {MF(Test_Assoc_Antecedent),
+                                                   MF(Test_Assoc_Dependent), MF(Test_Assoc_Owner),
+                                                   MF(Test_Assoc_Members), MF(Test_Assoc_Note)};
 const bool Test_Assoc_locals[] = {true, true, true, true, true};
 
 PROP(Test_Typed, B, BOOLEAN, 0, FLAG_KEY, nullptr);
@@ -101,9 +122,9 @@ PROP(Test_Typed, S64, SINT64, 0, FLAG_KEY, nullptr);
 PROP(Test_Typed, C, CHAR16, 0, FLAG_KEY, nullptr);
 PROP(Test_Typed, When, DATETIME, 0, FLAG_KEY, nullptr);
 PROP(Test_Typed, R, REAL32, 0, FLAG_KEY, nullptr);
-const Meta_Feature* const Test_Typed_features[] = {
-    MF(Test_Typed_B), MF(Test_Typed_U8),   MF(Test_Typed_S64),
-    MF(Test_Typed_C), MF(Test_Typed_When), MF(Test_Typed_R)};
+const Meta_Feature* const Test_Typed_features[] = {MF(Test_Typed_B),    MF(Test_Typed_U8),
+                                                   MF(Test_Typed_S64),  MF(Test_Typed_C),
+                                                   MF(Test_Typed_When), MF(Test_Typed_R)};
 const bool Test_Typed_locals[] = {true, true, true, true, true, true};
 
 PROP(Test_Keyless, Text, STRING, 0, 0, nullptr);

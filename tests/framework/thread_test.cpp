@@ -124,11 +124,17 @@ TEST(Thread, NewThreadsGetAContextFromTheCreator) {
         std::vector<std::string> events;
     } cases[] = {
         {"bare", note_context, true, {"proc without context"}},
-        {"work", note_context, true,
+        {"work",
+         note_context,
+         true,
          {"parent create work", "child start", "proc in child", "child exit", "child destroyed"}},
-        {"exit", note_context, true,
+        {"exit",
+         note_context,
+         true,
          {"parent create exit", "child start", "proc in child", "child exit", "child destroyed"}},
-        {"throw", [](void*) -> void* { throw std::runtime_error("boom"); }, false,
+        {"throw",
+         [](void*) -> void* { throw std::runtime_error("boom"); },
+         false,
          {"parent create throw", "child start", "child exit", "child destroyed"}},
     };
     for (const auto& c : cases) {
@@ -157,7 +163,8 @@ TEST(Thread, Detached) {
     static std::atomic<bool> done(false);
     Thread t;
     ASSERT_EQ(0, Thread::create_detached(
-                     t, [](void*) -> void* {
+                     t,
+                     [](void*) -> void* {
                          done = true;
                          return nullptr;
                      },

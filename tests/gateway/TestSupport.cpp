@@ -25,8 +25,8 @@ namespace {
 
 std::string makeTempDir(const char* prefix) {
     const char* tmp = std::getenv("TMPDIR");
-    std::string pattern = std::string(tmp != nullptr && *tmp != '\0' ? tmp : "/tmp") + "/" + prefix +
-                          "XXXXXX";
+    std::string pattern =
+        std::string(tmp != nullptr && *tmp != '\0' ? tmp : "/tmp") + "/" + prefix + "XXXXXX";
     if (mkdtemp(&pattern[0]) == nullptr)
         throw std::runtime_error("mkdtemp failed");
     return pattern;
@@ -87,7 +87,8 @@ int LogCapture::count(const std::string& level, const std::string& text, bool an
         size_t body = line.find("): ");
         if (line.compare(0, level.size() + 2, level + ": ") != 0 || body == std::string::npos)
             continue;
-        n += anywhere ? line.find(text, body + 3) != std::string::npos : line.compare(body + 3, text.size(), text) == 0;
+        n += anywhere ? line.find(text, body + 3) != std::string::npos
+                      : line.compare(body + 3, text.size(), text) == 0;
     }
     return n;
 }
@@ -158,20 +159,32 @@ void* SimLibrary::resolve(const char* name) const {
     if ((rc) != 0)          \
         throw std::runtime_error(std::string(what) + SIM_CONTROL(tvrn_sim_last_error)());
 
-void SimLibrary::reset() { SIM_CHECK(SIM_CONTROL(tvrn_sim_reset)(), "simulator reset: ") }
+void SimLibrary::reset() {
+    SIM_CHECK(SIM_CONTROL(tvrn_sim_reset)(), "simulator reset: ")
+}
 void SimLibrary::loadFixture(const char* nameOrPath) {
     SIM_CHECK(SIM_CONTROL(tvrn_sim_load_fixture)(nameOrPath), "simulator fixture: ")
 }
 void SimLibrary::loadFixtureText(const std::string& json) {
     SIM_CHECK(SIM_CONTROL(tvrn_sim_load_fixture_text)(json.c_str()), "simulator fixture: ")
 }
-void SimLibrary::setVersion(const char* version) { SIM_CONTROL(tvrn_sim_set_version)(version); }
-void SimLibrary::setInitResult(int result) { SIM_CONTROL(tvrn_sim_set_init_result)(result); }
-void SimLibrary::setFault(const char* entry, const char* key, int kind, int code, const char* text, int times) {
-    SIM_CHECK(SIM_CONTROL(tvrn_sim_set_fault)(entry, key, kind, code, text, times), std::string("simulator refused a fault for ") + entry + ": ")
+void SimLibrary::setVersion(const char* version) {
+    SIM_CONTROL(tvrn_sim_set_version)(version);
 }
-unsigned long long SimLibrary::calls(const char* entry) const { return SIM_CONTROL(tvrn_sim_call_count)(entry); }
-Json::Value SimLibrary::recorded() const { return parseJson(SIM_CONTROL(tvrn_sim_recorded_calls)()); }
+void SimLibrary::setInitResult(int result) {
+    SIM_CONTROL(tvrn_sim_set_init_result)(result);
+}
+void SimLibrary::setFault(const char* entry, const char* key, int kind, int code, const char* text,
+                          int times) {
+    SIM_CHECK(SIM_CONTROL(tvrn_sim_set_fault)(entry, key, kind, code, text, times),
+              std::string("simulator refused a fault for ") + entry + ": ")
+}
+unsigned long long SimLibrary::calls(const char* entry) const {
+    return SIM_CONTROL(tvrn_sim_call_count)(entry);
+}
+Json::Value SimLibrary::recorded() const {
+    return parseJson(SIM_CONTROL(tvrn_sim_recorded_calls)());
+}
 
 #undef SIM_CHECK
 #undef SIM_CONTROL
@@ -219,7 +232,8 @@ void inFreshProcess(const std::function<void()>& scenario) {
     int status = 0;
     ASSERT_EQ(waitpid(child, &status, 0), child);
     const bool passed = WIFEXITED(status) && WEXITSTATUS(status) == 0;
-    EXPECT_TRUE(passed) << "the scenario failed in its own process (see above); wait status " << status;
+    EXPECT_TRUE(passed) << "the scenario failed in its own process (see above); wait status "
+                        << status;
 }
 
 }  // namespace gwtest

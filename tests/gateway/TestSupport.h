@@ -25,7 +25,9 @@ public:
     // Number of lines since the mark at this level whose message begins with
     // (or, with `anywhere`, contains) `text`.
     int count(const std::string& level, const std::string& text, bool anywhere = false) const;
-    bool has(const std::string& level, const std::string& message) const { return count(level, message) > 0; }
+    bool has(const std::string& level, const std::string& message) const {
+        return count(level, message) > 0;
+    }
     // All text since the mark, for failure messages.
     std::string text() const;
 
@@ -70,8 +72,8 @@ public:
     void loadFixtureText(const std::string& json);
     void setVersion(const char* version);
     void setInitResult(int result);
-    void setFault(const char* entry, const char* key, int kind, int code = 0, const char* text = nullptr,
-                  int times = 0);
+    void setFault(const char* entry, const char* key, int kind, int code = 0,
+                  const char* text = nullptr, int times = 0);
     unsigned long long calls(const char* entry) const;
     // The recorded calls: entry point names in order, and the requests of one
     // entry point in order.

@@ -33,7 +33,9 @@ std::string packet(unsigned op, unsigned number, const std::string& payload) {
     return std::string(head, 4) + payload;
 }
 
-unsigned get16(const unsigned char* p) { return unsigned(p[0]) << 8 | p[1]; }
+unsigned get16(const unsigned char* p) {
+    return unsigned(p[0]) << 8 | p[1];
+}
 
 // Waits up to `ms` for a packet; its length, or -1 on time-out.
 ssize_t receive(int fd, unsigned char (&buffer)[1024], int ms, sockaddr_in* from = nullptr) {
@@ -41,7 +43,8 @@ ssize_t receive(int fd, unsigned char (&buffer)[1024], int ms, sockaddr_in* from
     if (poll(&pfd, 1, ms) <= 0)
         return -1;
     socklen_t length = sizeof(*from);
-    return recvfrom(fd, buffer, sizeof buffer, 0, reinterpret_cast<sockaddr*>(from), from ? &length : nullptr);
+    return recvfrom(fd, buffer, sizeof buffer, 0, reinterpret_cast<sockaddr*>(from),
+                    from ? &length : nullptr);
 }
 
 void sendTo(int fd, const std::string& packet, const sockaddr_in& to) {
@@ -97,7 +100,9 @@ void TftpTestServer::run() {
         const char* text = reinterpret_cast<const char*>(buffer + 2);
         std::string name(text, strnlen(text, n - 2));
         size_t modeAt = name.size() + 1;
-        std::string mode = modeAt + 2 < size_t(n) ? std::string(text + modeAt, strnlen(text + modeAt, n - 2 - modeAt)) : "";
+        std::string mode = modeAt + 2 < size_t(n)
+                               ? std::string(text + modeAt, strnlen(text + modeAt, n - 2 - modeAt))
+                               : "";
         bool answer;
         {
             std::lock_guard<std::mutex> lock(_mutex);

@@ -31,19 +31,25 @@ void Tftpd::addFile(const std::string& name, const std::string& content) {
 
 bool Tftpd::start(std::string& why) {
     // Servers live in sbin, which an ordinary PATH may leave out.
-    const char* const candidates[] = {"/usr/sbin/in.tftpd", "/sbin/in.tftpd", "/usr/local/sbin/in.tftpd"};
+    const char* const candidates[] = {"/usr/sbin/in.tftpd", "/sbin/in.tftpd",
+                                      "/usr/local/sbin/in.tftpd"};
     const char* server = nullptr;
     for (const char* c : candidates)
         if (server == nullptr && access(c, X_OK) == 0)
             server = c;
     const char* skip = ", or set TVRN_TEST_NO_TFTPD=1 to skip the tests that need it";
     if (server == nullptr) {
-        why = std::string("in.tftpd is not installed: install the tftpd-hpa package (tools/dev.sh lists it)") + skip;
+        why = std::string(
+                  "in.tftpd is not installed: install the tftpd-hpa package (tools/dev.sh lists "
+                  "it)") +
+              skip;
         return false;
     }
     if (geteuid() != 0) {
-        why = std::string("in.tftpd gives up its privileges for every transfer, which only root may do: "
-                          "run the tests as root") + skip;
+        why = std::string(
+                  "in.tftpd gives up its privileges for every transfer, which only root may do: "
+                  "run the tests as root") +
+              skip;
         return false;
     }
     // The socket is bound before the server starts, so requests wait for it
@@ -65,8 +71,8 @@ bool Tftpd::start(std::string& why) {
     _pid = fork();
     if (_pid == 0) {
         dup2(s, STDIN_FILENO);  // inetd mode: the socket is standard input
-        execl(server, server, "--secure", "--user", "nobody", "--timeout", "600", _dir.path().c_str(),
-              static_cast<char*>(nullptr));
+        execl(server, server, "--secure", "--user", "nobody", "--timeout", "600",
+              _dir.path().c_str(), static_cast<char*>(nullptr));
         _exit(127);
     }
     close(s);

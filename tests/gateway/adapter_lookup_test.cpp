@@ -33,7 +33,9 @@ protected:
         sim = &gwtest::boundSimulator();
         LogCapture::get().mark();
     }
-    static bool logged(const char* level, const std::string& text) { return LogCapture::get().has(level, text); }
+    static bool logged(const char* level, const std::string& text) {
+        return LogCapture::get().has(level, text);
+    }
 
     gwtest::SimLibrary* sim = nullptr;
 };
@@ -42,12 +44,12 @@ TEST(Binding, EveryEntryPointResolvesIntoTheLibraryOnce) {
     gwtest::SimLibrary& sim = gwtest::boundSimulator();
     setupDLLEntryPoints();  // a second call changes nothing
     EXPECT_EQ(libHandle, sim.handle());
-#define ENTRY_POINT(kind, symbol, pointer)                                               \
-    {                                                                                    \
-        Dl_info info;                                                                    \
+#define ENTRY_POINT(kind, symbol, pointer)                                              \
+    {                                                                                   \
+        Dl_info info;                                                                   \
         ASSERT_NE(dladdr(reinterpret_cast<const void*>(pointer), &info), 0) << #symbol; \
-        EXPECT_EQ(sim.path(), info.dli_fname) << #symbol;                                \
-        EXPECT_STREQ(info.dli_sname, #symbol);                                           \
+        EXPECT_EQ(sim.path(), info.dli_fname) << #symbol;                               \
+        EXPECT_STREQ(info.dli_sname, #symbol);                                          \
     }
 #include "gateway/EntryPoints.def"
 #undef ENTRY_POINT
@@ -70,7 +72,8 @@ TEST_F(AdapterLookup, AdapterListAndNumbers) {
         LogCapture::get().mark();
         EXPECT_EQ(ProviderUtil::getNumberOfAdapters(list), -1) << f.first;
         EXPECT_STREQ(ProviderUtil::getAddrByAdapterId(1).c_str(), "") << f.first;
-        EXPECT_EQ(LogCapture::get().count("ERR", "libGetAllAdaptersIndexString returns NULL."), 2) << f.first;
+        EXPECT_EQ(LogCapture::get().count("ERR", "libGetAllAdaptersIndexString returns NULL."), 2)
+            << f.first;
     }
 }
 
@@ -84,7 +87,8 @@ TEST_F(AdapterLookup, DetailsAskByMacOrWwnAndNeedBothParts) {
 
     sim->setFault("getHbaByWwn", kFc, TVRN_SIM_FAULT_DROP_MEMBER, 0, "driver");
     sim->setFault("getHbaByWwn", kHp, TVRN_SIM_FAULT_WRONG_TYPE, 0, "hbaData");
-    for (const char* key : {kFc, kHp, "20:00:00:05:1e:ff:ff:ff"}) {  // the last unknown: an error answer
+    for (const char* key :
+         {kFc, kHp, "20:00:00:05:1e:ff:ff:ff"}) {  // the last unknown: an error answer
         EXPECT_EQ(ProviderUtil::getAdapterDetails(key, details), -1) << key;
         EXPECT_TRUE(logged("ERR", std::string("Unable to get adapater details for ") + key));
     }
@@ -113,8 +117,9 @@ TEST_F(AdapterLookup, LibraryExceptionsStopAtTheDetails) {
 TEST_F(AdapterLookup, ModelPresence) {
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-825"));
     EXPECT_EQ(sim->requests("getHbaByWwn").size(), 1u);  // stops at the first match
-    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("tavrin-1860"));    // any case
-    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1020-2P"));  // adapter model is a prefix
+    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("tavrin-1860"));  // any case
+    EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent(
+        "Tavrin-1020-2P"));  // adapter model is a prefix
     EXPECT_FALSE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-82"));
     sim->setFault("getHbaByWwn", kFc, TVRN_SIM_FAULT_NULL_ANSWER);  // an unreadable first adapter
     EXPECT_TRUE(ProviderUtil::checkIfThisAdapterModelPresent("Tavrin-1860"));
@@ -126,15 +131,19 @@ TEST_F(AdapterLookup, ModelPresence) {
 TEST_F(AdapterLookup, DriverVersionOfTheFirstAdapter) {
     EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "3.2.1.0");  // " 3.2.1.0 " trimmed
     EXPECT_EQ(sim->requests("getHbaByWwn"), std::vector<Json::Value>{keyed("wwn", kFc)});
-    sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0, "driver.storageDriverVersion");
+    sim->setFault("getHbaByWwn", nullptr, TVRN_SIM_FAULT_DROP_MEMBER, 0,
+                  "driver.storageDriverVersion");
     EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "");  // an FC HBA has no network driver
 
     // A first adapter with only a network driver, or an overlong version.
-    sim->loadFixtureText(R"({"adapters": [{"hbaData": {"model": "Tavrin-1020", "hbaMAC": "00:05:1e:00:00:01"},
+    sim->loadFixtureText(
+        R"({"adapters": [{"hbaData": {"model": "Tavrin-1020", "hbaMAC": "00:05:1e:00:00:01"},
                                            "driver": {"networkDriverVersion": " 2.0 "}}]})");
     EXPECT_STREQ(ProviderUtil::getDriverVersion().c_str(), "2.0");
-    sim->loadFixtureText(R"({"adapters": [{"hbaData": {"model": "Tavrin-825", "wwn": "20:00:00:05:1e:00:00:01"},
-                                           "driver": {"storageDriverVersion": ")" + std::string(99, '7') + "\"}}]}");
+    sim->loadFixtureText(
+        R"({"adapters": [{"hbaData": {"model": "Tavrin-825", "wwn": "20:00:00:05:1e:00:00:01"},
+                                           "driver": {"storageDriverVersion": ")" +
+        std::string(99, '7') + "\"}}]}");
     EXPECT_EQ(ProviderUtil::getDriverVersion().size(), 63u);
 }
 

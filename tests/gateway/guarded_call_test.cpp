@@ -11,8 +11,12 @@ using gwtest::LogCapture;
 
 namespace {
 
-Json::Value answers(const Json::Value&) { return Json::Value(7); }
-Json::Value throws(const Json::Value&) { throw 0; }
+Json::Value answers(const Json::Value&) {
+    return Json::Value(7);
+}
+Json::Value throws(const Json::Value&) {
+    throw 0;
+}
 
 TEST(GuardedCall, AnswerPassesThroughAndFailureIsLoggedAtTheCallSite) {
     LogCapture::get().mark();
@@ -26,7 +30,8 @@ TEST(GuardedCall, AnswerPassesThroughAndFailureIsLoggedAtTheCallSite) {
     EXPECT_EQ(answer.asInt(), 7);  // left alone
     std::vector<std::string> lines = LogCapture::get().lines();
     ASSERT_EQ(lines.size(), 1u);
-    EXPECT_NE(lines[0].find("guarded_call_test.cpp(" + std::to_string(line) + "): "), std::string::npos)
+    EXPECT_NE(lines[0].find("guarded_call_test.cpp(" + std::to_string(line) + "): "),
+              std::string::npos)
         << lines[0];
 }
 
@@ -47,7 +52,8 @@ TEST(GuardedCall, EveryExceptionIsCaughtWithItsWording) {
         {keyed, [] { throw std::runtime_error("lib broke"); },
          "10:00:00:05:33:a0:b1:c2 - libGetPortByWwn got std exception: lib broke"},
         {keyless, [] { throw 1.5; }, "libGetAllRemotePorts got default exception"},
-        {atEnd, [] { throw "text"; }, "libGetEthPortByEthMac got default exception for 00:05:33:aa:bb:cc"},
+        {atEnd, [] { throw "text"; },
+         "libGetEthPortByEthMac got default exception for 00:05:33:aa:bb:cc"},
         {atEnd, [] { throw HbaAgentError(9, "z"); },  // only the default wording moves
          "00:05:33:aa:bb:cc - libGetEthPortByEthMac got User exception 9: z"},
     };

@@ -17,7 +17,8 @@ TEST(NoLibrary, StartsWithFallbacksAndFindsNothing) {
         ProviderInit init;
         EXPECT_EQ(libHandle, nullptr);
         EXPECT_EQ(ProviderInit::getDriverStatus(), 1);
-        EXPECT_TRUE(log.has("DBG", "Error in loading library: libdtfaj.so: cannot open shared object file"))
+        EXPECT_TRUE(
+            log.has("DBG", "Error in loading library: libdtfaj.so: cannot open shared object file"))
             << log.text();
         EXPECT_TRUE(log.has("INFO", "TFAJ Library version: NOT Loaded"));
         EXPECT_TRUE(log.has("ERR", "libInitHbaLib returns NULL response or has error"));

@@ -14,13 +14,17 @@ using gwtest::parseJson;
 namespace {
 
 TEST(AddressForms, ColonFormatAndTags) {
-    auto colon = [](const char* s) { return std::string(ProviderUtil::getIndexInColonFormat(s).c_str()); };
+    auto colon = [](const char* s) {
+        return std::string(ProviderUtil::getIndexInColonFormat(s).c_str());
+    };
     EXPECT_EQ(colon("1000000533a0b1c2"), "10:00:00:05:33:a0:b1:c2");
     EXPECT_EQ(colon("12345"), "12:345");  // an odd last character stays with the last pair
     EXPECT_EQ(colon("123"), "123");
-    EXPECT_STREQ(ProviderUtil::eraseColonsFromIndex("10:00:00:05:33:a0:b1:c2").c_str(), "1000000533a0b1c2");
+    EXPECT_STREQ(ProviderUtil::eraseColonsFromIndex("10:00:00:05:33:a0:b1:c2").c_str(),
+                 "1000000533a0b1c2");
     // Characters 19..22 hold the node part, 24 on the rest.
-    EXPECT_STREQ(ProviderUtil::getNodeMACOrWWNFromTag("Adapter-00001-Port-ABCD:12").c_str(), "ABCD12");
+    EXPECT_STREQ(ProviderUtil::getNodeMACOrWWNFromTag("Adapter-00001-Port-ABCD:12").c_str(),
+                 "ABCD12");
     EXPECT_STREQ(ProviderUtil::getNodeMACOrWWNFromTag("short").c_str(), "");
 }
 
@@ -36,7 +40,8 @@ TEST(AddressForms, RawBytesAreStrictHex) {
     unsigned char mac[6];
     EXPECT_TRUE(ProviderUtil::getRawMacFromStr("0005331aBbCc", mac));
     EXPECT_EQ(mac[5], 0xcc);
-    for (const char* bad : {"0005331a", "00:05:33:1a:bb:cc", "0005331aBbCg", static_cast<const char*>(nullptr)})
+    for (const char* bad :
+         {"0005331a", "00:05:33:1a:bb:cc", "0005331aBbCg", static_cast<const char*>(nullptr)})
         EXPECT_FALSE(ProviderUtil::getRawMacFromStr(bad, mac)) << (bad ? bad : "null");
 }
 
@@ -71,7 +76,8 @@ TEST(JsonAccess, WrongTypeCountsAsMissing) {
 
 // jsoncpp's own isMember/operator[] throw on arrays and scalars.
 TEST(JsonAccess, NonObjectsNeverThrow) {
-    for (const Json::Value& v : {Json::Value(), parseJson("[1,2]"), Json::Value(5), Json::Value("t")}) {
+    for (const Json::Value& v :
+         {Json::Value(), parseJson("[1,2]"), Json::Value(5), Json::Value("t")}) {
         EXPECT_NO_THROW({
             EXPECT_EQ(jsonInt(v, "x", -1), -1);
             EXPECT_STREQ(jsonString(v, "x").c_str(), "");

@@ -28,7 +28,8 @@ LogCapture& freshLog() {
 
 TEST(LogCallbackVersion, ThreeCharacterComparisons) {
     EXPECT_TRUE(ProviderInit::acceptsLogCallback("3.2.1"));
-    for (const char* version : {"2.9.9", "3.10.0", "4.0.5", "3.2", "", static_cast<const char*>(nullptr)})
+    for (const char* version :
+         {"2.9.9", "3.10.0", "4.0.5", "3.2", "", static_cast<const char*>(nullptr)})
         EXPECT_FALSE(ProviderInit::acceptsLogCallback(version)) << (version ? version : "null");
 }
 
@@ -43,9 +44,10 @@ TEST(StartUp, BuiltInHostStartsAndTheLibraryLogsThroughUs) {
         }
         // Shut-down frees the library, then takes our callback back (the
         // library stays mapped after the module is gone).
-        EXPECT_EQ(sim.entriesCalled(), (std::vector<std::string>{"get_agt_version", "registerLogMsgCb", "init_hba_lib",
-                                                                 "getNumberOfAdapters", "free_hba_lib",
-                                                                 "registerLogMsgCb"}));
+        EXPECT_EQ(
+            sim.entriesCalled(),
+            (std::vector<std::string>{"get_agt_version", "registerLogMsgCb", "init_hba_lib",
+                                      "getNumberOfAdapters", "free_hba_lib", "registerLogMsgCb"}));
         EXPECT_EQ(log.count("ERR", " not found. ", true), 0);
         EXPECT_TRUE(log.has("INFO", "TFAJ Library version: 3.2.1"));
         EXPECT_EQ(log.count("INFO", kSimulatorInitMessage, true), 1) << log.text();
@@ -78,10 +80,13 @@ TEST(StartUp, FailedInitialisationNeverAsksForAdapters) {
         };
         const Case cases[] = {
             {0, 0, nullptr, "libInitHbaLib is failed - 5 "},
-            {TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr, "libInitHbaLib returns NULL response or has error"},
-            {TVRN_SIM_FAULT_ERROR_OBJECT, 3, "no driver", "libInitHbaLib returns NULL response or has error"},
+            {TVRN_SIM_FAULT_NULL_ANSWER, 0, nullptr,
+             "libInitHbaLib returns NULL response or has error"},
+            {TVRN_SIM_FAULT_ERROR_OBJECT, 3, "no driver",
+             "libInitHbaLib returns NULL response or has error"},
             {TVRN_SIM_FAULT_WRONG_TYPE, 0, "result", "libInitHbaLib is failed - -1 "},
-            {TVRN_SIM_FAULT_HBA_AGENT_ERROR, 19, "no driver", "libInitHbaLib got User exception 19: no driver"},
+            {TVRN_SIM_FAULT_HBA_AGENT_ERROR, 19, "no driver",
+             "libInitHbaLib got User exception 19: no driver"},
             {TVRN_SIM_FAULT_NON_STANDARD, 1, nullptr, "libInitHbaLib got default exception"},
         };
         for (const Case& c : cases) {

@@ -29,7 +29,8 @@ TEST(LogCallback, LevelsMapAndTheTextIsNotAFormat) {
     for (int level = 0; level <= 6; level++)
         ProviderUtil::logMsg(level, "lib.c", level, "text %s %n");
     for (int level = 0; level <= 6; level++)
-        EXPECT_TRUE(log.has(levels[level], "lib.c:" + std::to_string(level) + " text %s %n")) << level;
+        EXPECT_TRUE(log.has(levels[level], "lib.c:" + std::to_string(level) + " text %s %n"))
+            << level;
 
     ProviderUtil::logMsg(4, std::string(40, 'f').c_str(), 123456, "message");  // location cut to 31
     EXPECT_TRUE(log.has("ERR", std::string(31, 'f') + "message"));
@@ -53,7 +54,8 @@ TEST(SmallHelpers, TrimAndUtf8Lead) {
         EXPECT_FALSE(ProviderUtil::valid_UTF_string(bad));
 }
 
-void fakeProcess(const ScratchDir& root, const std::string& pid, const std::string& comm, char state) {
+void fakeProcess(const ScratchDir& root, const std::string& pid, const std::string& comm,
+                 char state) {
     std::filesystem::create_directories(root / pid);
     writeFile(root / pid + "/comm", comm + "\n");
     writeFile(root / pid + "/stat", pid + " (" + comm + ") " + state + " 1 1 1 0 -1\n");
@@ -106,7 +108,8 @@ int portRecord(const String& key, Json::Value& port) {
 TEST(EthDeviceName, ThroughTheInventoryHook) {
     LogCapture& log = LogCapture::get();
     log.mark();
-    EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC("00:05:33:aa:bb:cc").c_str(), "");  // no hook yet
+    EXPECT_STREQ(ProviderUtil::getEthDeviceNameByMAC("00:05:33:aa:bb:cc").c_str(),
+                 "");  // no hook yet
     EXPECT_TRUE(log.has("ERR", "Unable to get Eth Device Name for 00:05:33:aa:bb:cc"));
 
     ProviderUtil::setEthPortDetailsHook(portRecord);

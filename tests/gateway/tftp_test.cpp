@@ -78,7 +78,7 @@ TEST_F(TftpClient, LostPacketsAreRetriedAndAnotherPortIsRefused) {
     ASSERT_EQ(fetch("fw.bin"), 0) << error;
     EXPECT_TRUE(received() == content(2000));
     EXPECT_EQ(server.requests().size(), 3u);  // the request went out three times
-    EXPECT_EQ(server.strayAnswer(), 5);        // "Unknown transfer ID"
+    EXPECT_EQ(server.strayAnswer(), 5);       // "Unknown transfer ID"
 }
 
 TEST_F(TftpClient, SilentServerTimesOutAfterTheRetries) {
@@ -118,7 +118,9 @@ protected:
         ProviderUtil::setTftpDownloadDir(".");
         ProviderUtil::setTftpOptions(TftpOptions());
     }
-    int get(const std::string& server, const char* file) { return ProviderUtil::TftpGetFile(server.c_str(), file); }
+    int get(const std::string& server, const char* file) {
+        return ProviderUtil::TftpGetFile(server.c_str(), file);
+    }
 
     ScratchDir downloads, outside;
     TftpTestServer server;
@@ -126,7 +128,8 @@ protected:
 
 // Downloads that succeed are tftpd_test.cpp's.
 TEST_F(TftpGetFile, FailureRemovesTheOldCopyAndIsLogged) {
-    EXPECT_STREQ(ProviderUtil::tftpLocalPath("images/fw.bin").c_str(), (downloads / "fw.bin").c_str());
+    EXPECT_STREQ(ProviderUtil::tftpLocalPath("images/fw.bin").c_str(),
+                 (downloads / "fw.bin").c_str());
     gwtest::writeFile(downloads / "fw.bin", "old copy");
     EXPECT_EQ(get(server.address(), "images/fw.bin"), -1);
     EXPECT_EQ(server.requests(), std::vector<std::string>{"images/fw.bin|octet"});
@@ -140,9 +143,9 @@ TEST_F(TftpGetFile, FailureRemovesTheOldCopyAndIsLogged) {
 TEST_F(TftpGetFile, NamesThatLeaveTheDirectoryAreRefusedBeforeAnythingHappens) {
     gwtest::writeFile(outside / "victim", "keep me");
     const std::string up = "../" + outside.path().substr(outside.path().rfind('/') + 1) + "/victim";
-    for (const std::string& name : {up, outside / "victim", std::string("a/../../victim"),
-                                    std::string(".."), std::string("dir/"), std::string(""),
-                                    std::string("line\nbreak")}) {
+    for (const std::string& name :
+         {up, outside / "victim", std::string("a/../../victim"), std::string(".."),
+          std::string("dir/"), std::string(""), std::string("line\nbreak")}) {
         EXPECT_STREQ(ProviderUtil::tftpLocalPath(name.c_str()).c_str(), "") << name;
         EXPECT_EQ(get(server.address(), name.c_str()), -1) << name;
     }

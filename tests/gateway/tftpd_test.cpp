@@ -32,7 +32,9 @@ protected:
         ProviderUtil::setTftpDownloadDir(downloads.path().c_str());
     }
     void TearDown() override { ProviderUtil::setTftpDownloadDir("."); }
-    int get(const std::string& file) { return ProviderUtil::TftpGetFile(server.address().c_str(), file.c_str()); }
+    int get(const std::string& file) {
+        return ProviderUtil::TftpGetFile(server.address().c_str(), file.c_str());
+    }
 
     gwtest::Tftpd server;
     ScratchDir downloads;

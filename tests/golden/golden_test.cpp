@@ -68,7 +68,8 @@ TEST_P(Golden, File) {
     const char* update = std::getenv("TVRN_GOLDEN_UPDATE");
     if (update == nullptr || *update == '\0' || std::string(update) == "0") {
         for (const Golden_Case& c : cases)
-            EXPECT_EQ(withoutTrailingNewlines(c.expected), withoutTrailingNewlines(session.cli(c.command)))
+            EXPECT_EQ(withoutTrailingNewlines(c.expected),
+                      withoutTrailingNewlines(session.cli(c.command)))
                 << path << ":" << c.line << ": $ " << c.command;
         return;
     }
@@ -77,7 +78,8 @@ TEST_P(Golden, File) {
         os << withoutTrailingNewlines(head) << "\n\n";
     for (size_t i = 0; i < cases.size(); i++) {
         const std::string answer = withoutTrailingNewlines(session.cli(cases[i].command));
-        os << (i > 0 ? "\n" : "") << "$ " << cases[i].command << "\n" << answer << (answer.empty() ? "" : "\n");
+        os << (i > 0 ? "\n" : "") << "$ " << cases[i].command << "\n"
+           << answer << (answer.empty() ? "" : "\n");
     }
 }
 

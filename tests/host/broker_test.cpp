@@ -18,8 +18,7 @@ protected:
     CMPIStatus rc{CMPI_RC_OK, nullptr};
 };
 
-TEST_F(Broker, DateTimesFromCharsAndBinary)
-{
+TEST_F(Broker, DateTimesFromCharsAndBinary) {
     CMPIDateTime *d = CMNewDateTimeFromChars(b, "20231114231320.000001+060", &rc);
     ASSERT_EQ(rc.rc, CMPI_RC_OK);
     EXPECT_EQ(CMGetBinaryFormat(d, nullptr), 1700000000000001ULL);
@@ -36,8 +35,7 @@ TEST_F(Broker, DateTimesFromCharsAndBinary)
     EXPECT_TRUE(CMIsInterval(i, nullptr));
 }
 
-TEST_F(Broker, ArraysCheckTypesAndBounds)
-{
+TEST_F(Broker, ArraysCheckTypesAndBounds) {
     CMPIArray *a = CMNewArray(b, 2, CMPI_uint16, &rc);
     ASSERT_EQ(rc.rc, CMPI_RC_OK);
     EXPECT_EQ(CMGetArrayType(a, nullptr), CMPI_uint16);
@@ -59,8 +57,7 @@ TEST_F(Broker, ArraysCheckTypesAndBounds)
     EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_DATA_TYPE);
 }
 
-TEST_F(Broker, InstancesFilterPropertiesAndKeepPathKeysInStep)
-{
+TEST_F(Broker, InstancesFilterPropertiesAndKeepPathKeysInStep) {
     CMPIObjectPath *op = CMNewObjectPath(b, "root/t", "C", nullptr);
     CMAddKey(op, "Id", "k1", CMPI_chars);
     CMPIInstance *i = CMNewInstance(b, op, nullptr);
@@ -83,12 +80,10 @@ TEST_F(Broker, InstancesFilterPropertiesAndKeepPathKeysInStep)
     CMPIData key = CMGetKey(p, "Id", nullptr);
     EXPECT_TRUE(CMIsKeyValue(key));
     EXPECT_STREQ(CMGetCharsPtr(key.value.string, nullptr), "k2");
-    EXPECT_STREQ(CMGetCharsPtr(CMObjectPathToString(p, nullptr), nullptr),
-                 "root/t:C.Id=\"k2\"");
+    EXPECT_STREQ(CMGetCharsPtr(CMObjectPathToString(p, nullptr), nullptr), "root/t:C.Id=\"k2\"");
 }
 
-TEST_F(Broker, TypeServicesAndMessages)
-{
+TEST_F(Broker, TypeServicesAndMessages) {
     host.addSubclass("Sub", "Base");
     CMPIObjectPath *op = CMNewObjectPath(b, "ns", "Sub", nullptr);
     EXPECT_TRUE(CMClassPathIsA(b, op, "base", nullptr));
@@ -98,17 +93,16 @@ TEST_F(Broker, TypeServicesAndMessages)
     EXPECT_STREQ(CMGetCharsPtr(CDToString(b, op, nullptr), nullptr), "ns:Sub");
 
     CMPIString *s = CMNewString(b, "str", nullptr);
-    CMPIString *m = CMGetMessage(b, "ID1", "$0 of $1 at $2 ($3, $5)", &rc,
-                                 CMFmtArgs4(CMFmtSint(-1), CMFmtUint(2), CMFmtChars("c"),
-                                            CMFmtString(s)));
+    CMPIString *m =
+        CMGetMessage(b, "ID1", "$0 of $1 at $2 ($3, $5)", &rc,
+                     CMFmtArgs4(CMFmtSint(-1), CMFmtUint(2), CMFmtChars("c"), CMFmtString(s)));
     ASSERT_EQ(rc.rc, CMPI_RC_OK);
     EXPECT_STREQ(CMGetCharsPtr(m, nullptr), "-1 of 2 at c (str, $5)");
     CMLogMessage(b, CMPI_SEV_INFO, "TEST", "logged", nullptr);
     EXPECT_EQ(host.logMessages().back(), "log[2] TEST: logged");
 }
 
-TEST_F(Broker, ContextsArgsAndHandles)
-{
+TEST_F(Broker, ContextsArgsAndHandles) {
     CMPIArgs *args = CMNewArgs(b, nullptr);
     CMPISint64 big = -5;
     CMAddArg(args, "N", &big, CMPI_sint64);
@@ -128,8 +122,7 @@ TEST_F(Broker, ContextsArgsAndHandles)
     EXPECT_EQ(CMAddArg(args, "X", &bad, CMPI_class).rc, CMPI_RC_ERR_INVALID_DATA_TYPE);
 }
 
-TEST_F(Broker, ReleaseAndCloneOwnership)
-{
+TEST_F(Broker, ReleaseAndCloneOwnership) {
     const size_t before = Host::liveObjects();
     CMPIString *s = CMNewString(b, "a", nullptr);
     CMPIString *c = CMClone(s, nullptr);

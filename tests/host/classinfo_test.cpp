@@ -12,8 +12,7 @@ using namespace tvrnhost;
 
 namespace {
 
-TEST(RepositoryClasses, AnAssociationWithItsQualifiers)
-{
+TEST(RepositoryClasses, AnAssociationWithItsQualifiers) {
     const Meta_Class *mc = find_meta_class(&__meta_repository, "CIM_Component");
     ASSERT_NE(mc, nullptr);
     EXPECT_EQ(classinfo::classMof(*mc),
@@ -42,17 +41,22 @@ const Meta_Value_Array<const char *> kTimesDefault = {kTimes, 1};
 const Meta_Value_Array<uint8> kNoBytes = {nullptr, 0};
 
 Meta_Property property(uint32 flags, const char *name, uint16 type, sint16 subscript,
-                       const void *value = nullptr)
-{
-    return {0, FLAG_PROPERTY | flags, name, nullptr, 0, type, subscript, 0,
+                       const void *value = nullptr) {
+    return {0,
+            FLAG_PROPERTY | flags,
+            name,
+            nullptr,
+            0,
+            type,
+            subscript,
+            0,
             static_cast<const Meta_Value *>(value)};
 }
 
 extern const Meta_Class kRoot;
 
 template <class T>
-const Meta_Feature *feature(const T &record)
-{
+const Meta_Feature *feature(const T &record) {
     return reinterpret_cast<const Meta_Feature *>(&record);
 }
 
@@ -74,35 +78,37 @@ const Meta_Reference kParent = {0, FLAG_REFERENCE, "Parent", nullptr, 0, 0, &kRo
 
 const Meta_Property kMode = property(FLAG_IN | FLAG_REQUIRED, "Mode", STRING, 0);
 const Meta_Reference kResult = {0, FLAG_REFERENCE | FLAG_OUT, "Result", nullptr, 0, 0, &kRoot, 0};
-const Meta_Reference kInto = {0, FLAG_REFERENCE | FLAG_IN | FLAG_EMBEDDED_INSTANCE, "Into",
-                              nullptr, 0, -1, &kRoot, 0};
+const Meta_Reference kInto = {
+    0, FLAG_REFERENCE | FLAG_IN | FLAG_EMBEDDED_INSTANCE, "Into", nullptr, 0, -1, &kRoot, 0};
 const Meta_Property kCounts = property(FLAG_IN | FLAG_OUT, "Counts", UINT64, -1);
 const Meta_Property kReturn = property(FLAG_OUT, "return_value", SINT32, 0);
 const Meta_Feature *const kRunParams[] = {feature(kMode), feature(kResult), feature(kInto),
-                                           feature(kCounts), feature(kReturn)};
-const Meta_Method kRun = {0, FLAG_METHOD | FLAG_EXPERIMENTAL | FLAG_STATIC, "Run", nullptr, 0,
-                          kRunParams, 5, 0, SINT32};
+                                          feature(kCounts), feature(kReturn)};
+const Meta_Method kRun = {
+    0, FLAG_METHOD | FLAG_EXPERIMENTAL | FLAG_STATIC, "Run", nullptr, 0, kRunParams, 5, 0, SINT32};
 const Meta_Feature *const kNoParams[] = {feature(kReturn)};
 const Meta_Method kStop = {0, FLAG_METHOD, "Stop", nullptr, 0, kNoParams, 1, 0, SINT32};
 
 const Meta_Feature *const kRootFeatures[] = {
-    feature(kId),      feature(kTextP),  feature(kWaitP), feature(kOnP),
-    feature(kLetterP), feature(kRatioP), feature(kLowP),  feature(kHighP),
+    feature(kId),      feature(kTextP),  feature(kWaitP),  feature(kOnP),
+    feature(kLetterP), feature(kRatioP), feature(kLowP),   feature(kHighP),
     feature(kCodesP),  feature(kNamesP), feature(kTimesP), feature(kBytesP),
-    feature(kPayload), feature(kParent), feature(kRun),   feature(kStop),
+    feature(kPayload), feature(kParent), feature(kRun),    feature(kStop),
 };
 
 extern const Meta_Repository kRepository;
-const Meta_Class kRoot = {0, FLAG_CLASS | FLAG_ABSTRACT | FLAG_INDICATION,
-                          "Test_Root", nullptr, 0, kRootFeatures, 16, 0, nullptr, nullptr, 1,
-                          &kRepository};
-const Meta_Class kLeaf = {0, FLAG_CLASS, "Test_Leaf", nullptr, 0, nullptr, 0, 0, nullptr, &kRoot,
-                          0, &kRepository};
+const Meta_Class kRoot = {0,           FLAG_CLASS | FLAG_ABSTRACT | FLAG_INDICATION,
+                          "Test_Root", nullptr,
+                          0,           kRootFeatures,
+                          16,          0,
+                          nullptr,     nullptr,
+                          1,           &kRepository};
+const Meta_Class kLeaf = {0, FLAG_CLASS, "Test_Leaf", nullptr, 0, nullptr,
+                          0, 0,          nullptr,     &kRoot,  0, &kRepository};
 const Meta_Class *const kClasses[] = {&kRoot, &kLeaf};
 const Meta_Repository kRepository = {kClasses, 2};
 
-TEST(ClassMof, EveryKindOfFeatureAndDefault)
-{
+TEST(ClassMof, EveryKindOfFeatureAndDefault) {
     EXPECT_EQ(classinfo::classMof(kRoot),
               "[Abstract, Indication]\n"
               "class Test_Root {\n"
@@ -129,8 +135,7 @@ TEST(ClassMof, EveryKindOfFeatureAndDefault)
     EXPECT_EQ(classinfo::classMof(kLeaf), "class Test_Leaf : Test_Root {\n};\n");
 }
 
-TEST(ClassMof, CatalogLooksClassesUpWithoutRegardToCase)
-{
+TEST(ClassMof, CatalogLooksClassesUpWithoutRegardToCase) {
     const classinfo::RepositoryCatalog catalog(kRepository);
     EXPECT_EQ(catalog.classNames(), (std::vector<std::string>{"Test_Root", "Test_Leaf"}));
     EXPECT_EQ(catalog.classMof("test_leaf"), classinfo::classMof(kLeaf));

@@ -20,15 +20,13 @@ struct Output {
     std::string out, err;
 };
 
-std::vector<std::string> withModule(std::vector<std::string> args)
-{
-    args.insert(args.begin(), {"--module", TVRN_TESTPROV_LIB, "--reg", TVRN_TESTPROV_REG, "-n",
-                               "root/test"});
+std::vector<std::string> withModule(std::vector<std::string> args) {
+    args.insert(args.begin(),
+                {"--module", TVRN_TESTPROV_LIB, "--reg", TVRN_TESTPROV_REG, "-n", "root/test"});
     return args;
 }
 
-Output runCli(const std::vector<std::string> &args, const cli::Defaults &d = {})
-{
+Output runCli(const std::vector<std::string> &args, const cli::Defaults &d = {}) {
     std::ostringstream out, err;
     const int st = cli::run(withModule(args), out, err, d);
     return Output{st, out.str(), err.str()};
@@ -37,8 +35,7 @@ Output runCli(const std::vector<std::string> &args, const cli::Defaults &d = {})
 // Commands against one loaded host, so that changes persist between them.
 class CliSession : public HostFixture {
 protected:
-    Output exec(const std::vector<std::string> &args)
-    {
+    Output exec(const std::vector<std::string> &args) {
         std::ostringstream out, err;
         const int st = cli::execute(*host, cli::parseInvocation(withModule(args), {}), out, err);
         return Output{st, out.str(), err.str()};
@@ -47,8 +44,7 @@ protected:
 
 // The module's instances and associations as tvrncli prints them are in the
 // golden files; here the test provider's (property lists, writes, methods).
-TEST(Cli, PrintsInstancesAsMofWithThePropertiesAskedFor)
-{
+TEST(Cli, PrintsInstancesAsMofWithThePropertiesAskedFor) {
     Output o = runCli({"--props", "Size", "gi", "Test_Widget.Id=\"w2\""});
     EXPECT_EQ(o.status, 0) << o.err;
     EXPECT_EQ(o.out,
@@ -59,8 +55,7 @@ TEST(Cli, PrintsInstancesAsMofWithThePropertiesAskedFor)
               "};\n");
 }
 
-TEST(Cli, AFailedRequestIsOneLineWithTheStatusCode)
-{
+TEST(Cli, AFailedRequestIsOneLineWithTheStatusCode) {
     struct Case {
         std::vector<std::string> args;
         const char *line;
@@ -91,8 +86,7 @@ TEST(Cli, AFailedRequestIsOneLineWithTheStatusCode)
     EXPECT_EQ(std::count(line.begin(), line.end(), '\n'), 1);
 }
 
-TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage)
-{
+TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage) {
     const std::string pathNote = "PATH: [//host/][namespace:]Class.Key=";
     struct Case {
         std::vector<std::string> args;
@@ -105,9 +99,11 @@ TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage)
         {{"classes", "extra"}, "tvrncli: wrong number of arguments for classes", "classes\n"},
         {{"ci", "Test_Widget.Id=\"w9\"", "Size=uint8:300"}, "tvrncli: Size: ", "ci PATH"},
         {{"cm", "Test_Widget.Id=\"w1\"", "Echo", "noequals"},
-         "tvrncli: expected NAME=VALUE: noequals", "cm PATH"},
+         "tvrncli: expected NAME=VALUE: noequals",
+         "cm PATH"},
         {{"ri", "Test_Widget.Id=\"w1\"", "--result-role", "X"},
-         "tvrncli: unknown option --result-role", "ri PATH"},
+         "tvrncli: unknown option --result-role",
+         "ri PATH"},
         {{"frobnicate"}, "tvrncli: unknown command 'frobnicate'", nullptr},
     };
     for (const auto &c : cases) {
@@ -128,8 +124,7 @@ TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage)
     EXPECT_EQ(o.err, "tvrncli: --seed needs a value\n" + cli::usage());
 }
 
-TEST_F(CliSession, CreateModifyDeleteWithTypedValues)
-{
+TEST_F(CliSession, CreateModifyDeleteWithTypedValues) {
     Output o = exec({"ci", "Test_Widget.Id=\"w7\"", "Count=uint32:4", "Label=hello world"});
     ASSERT_EQ(o.status, 0) << o.err;
     EXPECT_EQ(o.out, "root/test:Test_Widget.Id=\"w7\"\n");
@@ -148,13 +143,12 @@ TEST_F(CliSession, CreateModifyDeleteWithTypedValues)
     EXPECT_EQ(exec({"di", "Test_Widget.Id=\"w7\""}).status, 1);
 }
 
-TEST_F(CliSession, MethodCallsPrintTheReturnValueAndOutputs)
-{
+TEST_F(CliSession, MethodCallsPrintTheReturnValueAndOutputs) {
     // Echo returns its inputs as outputs: the MOF literal of each kind.
-    Output o = exec({"cm", "Test_Widget.Id=\"w1\"", "Echo", "C=char16:'x'", "S=\"a\\\"b\\\\c\\n\"",
-                     "B=TRUE", "N=NULL", "A={\"x\", NULL}",
-                     "T=\"root/test:Test_Gadget.Name=\\\"g2\\\"\"",
-                     "W=datetime:\"20240101000000.000000+000\""});
+    Output o =
+        exec({"cm", "Test_Widget.Id=\"w1\"", "Echo", "C=char16:'x'", "S=\"a\\\"b\\\\c\\n\"",
+              "B=TRUE", "N=NULL", "A={\"x\", NULL}", "T=\"root/test:Test_Gadget.Name=\\\"g2\\\"\"",
+              "W=datetime:\"20240101000000.000000+000\""});
     ASSERT_EQ(o.status, 0) << o.err;
     EXPECT_EQ(o.out,
               "ReturnValue = 7;\n"
@@ -173,15 +167,13 @@ TEST_F(CliSession, MethodCallsPrintTheReturnValueAndOutputs)
     EXPECT_EQ(o.err.rfind("tvrncli: CMPI_RC_ERR_METHOD_NOT_FOUND (17)", 0), 0u) << o.err;
 }
 
-TEST(Cli, RequestsRunAsThePrincipalGiven)
-{
+TEST(Cli, RequestsRunAsThePrincipalGiven) {
     EXPECT_EQ(runCli({"cm", "Test_Widget.Id=\"w1\"", "WhoAmI"}).out, "ReturnValue = \"root\";\n");
     EXPECT_EQ(runCli({"--principal", "alice", "cm", "Test_Widget.Id=\"w1\"", "WhoAmI"}).out,
               "ReturnValue = \"alice\";\n");
 }
 
-TEST_F(CliSession, PrintsIndicationsForTheGivenTime)
-{
+TEST_F(CliSession, PrintsIndicationsForTheGivenTime) {
     Output o = exec({"ind", "Test_Alert", "1"});
     ASSERT_EQ(o.status, 0) << o.err;
     const std::string head = "// root/test:Test_Alert\ninstance of Test_Alert {\n";
@@ -193,8 +185,7 @@ TEST_F(CliSession, PrintsIndicationsForTheGivenTime)
     EXPECT_EQ(host->indications().size(), 3u);
 }
 
-TEST(Cli, SeedsTheStoreFromAFile)
-{
+TEST(Cli, SeedsTheStoreFromAFile) {
     char name[] = "/tmp/tvrncli_seed_XXXXXX";
     const int fd = mkstemp(name);
     ASSERT_GE(fd, 0);
@@ -215,8 +206,7 @@ TEST(Cli, SeedsTheStoreFromAFile)
     std::remove(seed.c_str());
 }
 
-Output runProgram(const std::string &args)
-{
+Output runProgram(const std::string &args) {
     const std::string cmd = std::string(TVRN_TEST_BUILD_DIR) + "/bin/tvrncli " + args + " 2>&1";
     Output o{-1, "", ""};
     FILE *p = popen(cmd.c_str(), "r");
@@ -231,10 +221,11 @@ Output runProgram(const std::string &args)
     return o;
 }
 
-size_t lineCount(const std::string &s) { return std::count(s.begin(), s.end(), '\n'); }
+size_t lineCount(const std::string &s) {
+    return std::count(s.begin(), s.end(), '\n');
+}
 
-TEST(CliProgram, RunsAsAChildProcess)
-{
+TEST(CliProgram, RunsAsAChildProcess) {
     Output o = runProgram("help");
     EXPECT_EQ(o.status, 0);
     EXPECT_EQ(o.out.rfind("usage: tvrncli", 0), 0u) << o.out;
@@ -254,8 +245,7 @@ TEST(CliProgram, RunsAsAChildProcess)
         << o.out;
 }
 
-TEST(CliProgram, DescribesTheModulesClasses)
-{
+TEST(CliProgram, DescribesTheModulesClasses) {
     Output o = runProgram("--module /nonexistent/lib.so classes");
     EXPECT_EQ(o.status, 0) << o.out;
     EXPECT_EQ(lineCount(o.out), 178u);

@@ -10,8 +10,7 @@ namespace {
 
 using Concurrency = HostFixture;
 
-TEST_F(Concurrency, ParallelRequestsAllSucceed)
-{
+TEST_F(Concurrency, ParallelRequestsAllSucceed) {
     constexpr int kThreads = 4, kRounds = 40;
     std::atomic<int> failures{0};
     auto check = [&](const Status &st) {

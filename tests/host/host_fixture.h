@@ -17,8 +17,7 @@ using namespace tvrnhost;
 
 inline const char *kNs = "root/test";
 
-inline ObjectPath path(const std::string &text)
-{
+inline ObjectPath path(const std::string &text) {
     ObjectPath p = ObjectPath::parse(text);
     if (p.nameSpace().empty())
         p.setNameSpace(kNs);
@@ -27,8 +26,7 @@ inline ObjectPath path(const std::string &text)
 
 class HostFixture : public ::testing::Test {
 protected:
-    void SetUp() override
-    {
+    void SetUp() override {
         HostOptions o;
         o.principal = "tester";
         host = std::make_unique<Host>(o);
@@ -39,8 +37,7 @@ protected:
         ASSERT_TRUE(host->store("root/interop").add(mgr));
     }
 
-    void TearDown() override
-    {
+    void TearDown() override {
         if (host) {
             EXPECT_TRUE(host->unload().ok());
         }
@@ -48,8 +45,7 @@ protected:
     }
 
     // What the provider library counted so far (while it is loaded).
-    static tvrntest_counters counters()
-    {
+    static tvrntest_counters counters() {
         tvrntest_counters c{};
         void *h = dlopen(TVRN_TESTPROV_LIB, RTLD_NOW | RTLD_NOLOAD);
         if (!h)

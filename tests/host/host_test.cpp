@@ -9,8 +9,7 @@ namespace {
 
 using Requests = HostFixture;
 
-TEST_F(Requests, EnumeratesInstancesWithTypedProperties)
-{
+TEST_F(Requests, EnumeratesInstancesWithTypedProperties) {
     auto r = host->enumerateInstances(kNs, "Test_Widget");
     ASSERT_TRUE(r.ok()) << r.toString();
     ASSERT_EQ(r.items.size(), 3u);
@@ -30,8 +29,7 @@ TEST_F(Requests, EnumeratesInstancesWithTypedProperties)
     EXPECT_EQ(*r.items[2].get("Tags"), Value::array(Type::String, {}));
 }
 
-TEST_F(Requests, PropertyListFiltersEverythingButKeys)
-{
+TEST_F(Requests, PropertyListFiltersEverythingButKeys) {
     auto r = host->enumerateInstances(kNs, "Test_Widget", std::vector<std::string>{"size"});
     ASSERT_TRUE(r.ok());
     for (const auto &i : r.items) {
@@ -43,8 +41,7 @@ TEST_F(Requests, PropertyListFiltersEverythingButKeys)
     EXPECT_EQ(g.instance.properties().size(), 1u) << g.instance;
 }
 
-TEST_F(Requests, NamesGetAndNotFound)
-{
+TEST_F(Requests, NamesGetAndNotFound) {
     auto n = host->enumerateInstanceNames(kNs, "Test_Widget");
     ASSERT_TRUE(n.ok());
     ASSERT_EQ(n.items.size(), 3u);
@@ -57,8 +54,7 @@ TEST_F(Requests, NamesGetAndNotFound)
     EXPECT_EQ(missing.msg, "no widget zz");
 }
 
-TEST_F(Requests, ReferencesCarryReferenceKeys)
-{
+TEST_F(Requests, ReferencesCarryReferenceKeys) {
     auto r = host->references(path("Test_Gadget.Name=\"g1\""), "Test_WidgetGadget", "Gadget");
     ASSERT_TRUE(r.ok()) << r.toString();
     ASSERT_EQ(r.items.size(), 2u);
@@ -73,8 +69,7 @@ TEST_F(Requests, ReferencesCarryReferenceKeys)
     EXPECT_EQ(*names.items[0].key("Widget"), Value::reference(path("Test_Widget.Id=\"w2\"")));
 }
 
-TEST_F(Requests, MethodArgumentsRoundTripEveryKindOfValue)
-{
+TEST_F(Requests, MethodArgumentsRoundTripEveryKindOfValue) {
     const PropertyVector in = {
         {"Text", Value::string("hello")},
         {"Codes", Value::array(Type::Uint16, {Value::uint16(1), Value::uint16(65535)})},
@@ -99,8 +94,7 @@ TEST_F(Requests, MethodArgumentsRoundTripEveryKindOfValue)
     }
 }
 
-TEST_F(Requests, UpCallsSeeContextStoresAndOtherProviders)
-{
+TEST_F(Requests, UpCallsSeeContextStoresAndOtherProviders) {
     const ObjectPath w1 = path("Test_Widget.Id=\"w1\"");
     EXPECT_EQ(host->invokeMethod(w1, "WhoAmI").returnValue, Value::string("tester"));
     EXPECT_EQ(host->invokeMethod(w1, "ReadManager").returnValue, Value::string("the manager"));
@@ -113,8 +107,7 @@ TEST_F(Requests, UpCallsSeeContextStoresAndOtherProviders)
     EXPECT_EQ(host->invokeMethod(w1, "ReadManager").rc, CMPI_RC_ERR_NOT_FOUND);
 }
 
-TEST_F(Requests, FailuresReportCodeAndMessage)
-{
+TEST_F(Requests, FailuresReportCodeAndMessage) {
     const ObjectPath w1 = path("Test_Widget.Id=\"w1\"");
     auto denied = host->invokeMethod(w1, "Fail");
     EXPECT_EQ(denied.toString(), "CMPI_RC_ERR_ACCESS_DENIED: denied by test");
@@ -131,8 +124,7 @@ TEST_F(Requests, FailuresReportCodeAndMessage)
     EXPECT_NE(missing.msg.find("Test_Missing_Provider_Create_InstanceMI"), std::string::npos);
 }
 
-TEST_F(Requests, ClassesInSeveralNamespacesAndSubclasses)
-{
+TEST_F(Requests, ClassesInSeveralNamespacesAndSubclasses) {
     auto other = host->enumerateInstanceNames("root/other", "Test_Gadget");
     ASSERT_TRUE(other.ok());
     EXPECT_EQ(other.items[0].nameSpace(), "root/other");
@@ -152,12 +144,12 @@ TEST_F(Requests, ClassesInSeveralNamespacesAndSubclasses)
     EXPECT_TRUE(host->getInstance(path("Test_Stored.Key=1")).ok());
 }
 
-TEST_F(Requests, StoreAssociationsAreTraversed)
-{
+TEST_F(Requests, StoreAssociationsAreTraversed) {
     Instance owner(path("Test_Owner.Id=\"o\""));
     owner.set("Id", Value::string("o"));
-    Instance link(path("Test_Owns.Owner=\"root/test:Test_Owner.Id=\\\"o\\\"\","
-                       "Owned=\"root/test:Test_Widget.Id=\\\"w3\\\"\""));
+    Instance link(
+        path("Test_Owns.Owner=\"root/test:Test_Owner.Id=\\\"o\\\"\","
+             "Owned=\"root/test:Test_Widget.Id=\\\"w3\\\"\""));
     link.set("Owner", *link.path().key("Owner")).set("Owned", *link.path().key("Owned"));
     ASSERT_TRUE(host->store(kNs).add(owner));
     ASSERT_TRUE(host->store(kNs).add(link));
@@ -165,15 +157,15 @@ TEST_F(Requests, StoreAssociationsAreTraversed)
     ASSERT_TRUE(a.ok()) << a.toString();
     ASSERT_EQ(a.items.size(), 1u);  // the widget, fetched from its provider
     EXPECT_EQ(*a.items[0].get("Size"), Value::uint16(30));
-    EXPECT_EQ(host->referenceNames(path("Test_Widget.Id=\"w3\""), "Test_Owns", "Owned").items.size(),
-              1u);
-    EXPECT_TRUE(host->references(path("Test_Widget.Id=\"w3\""), "Test_Owns", "Owner").items.empty());
+    EXPECT_EQ(
+        host->referenceNames(path("Test_Widget.Id=\"w3\""), "Test_Owns", "Owned").items.size(), 1u);
+    EXPECT_TRUE(
+        host->references(path("Test_Widget.Id=\"w3\""), "Test_Owns", "Owner").items.empty());
 }
 
 using ReleaseRules = HostFixture;
 
-TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEndsClonesOutliveIt)
-{
+TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEndsClonesOutliveIt) {
     const ObjectPath w1 = path("Test_Widget.Id=\"w1\"");
     ASSERT_TRUE(host->enumerateInstances(kNs, "Test_Widget").ok());  // MIs created
     const size_t before = Host::liveObjects();
@@ -195,14 +187,12 @@ TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEndsClonesOutliveIt)
 
 using Indications = HostFixture;
 
-size_t countIn(const std::vector<Indication> &inds, const std::string &ns)
-{
-    return static_cast<size_t>(std::count_if(inds.begin(), inds.end(),
-                                             [&](const Indication &i) { return i.nameSpace == ns; }));
+size_t countIn(const std::vector<Indication> &inds, const std::string &ns) {
+    return static_cast<size_t>(std::count_if(
+        inds.begin(), inds.end(), [&](const Indication &i) { return i.nameSpace == ns; }));
 }
 
-TEST_F(Indications, DeliveredFromAnAttachedProviderThreadToActiveNamespaces)
-{
+TEST_F(Indications, DeliveredFromAnAttachedProviderThreadToActiveNamespaces) {
     using namespace std::chrono_literals;
     ASSERT_TRUE(host->subscribe(kNs, "Test_Alert").ok());
     ASSERT_TRUE(host->waitForIndications(3, 10s));
@@ -233,8 +223,7 @@ TEST_F(Indications, DeliveredFromAnAttachedProviderThreadToActiveNamespaces)
     EXPECT_EQ(c.threadsDetached, 1);
 }
 
-TEST_F(Indications, UnloadEndsActiveSubscriptions)
-{
+TEST_F(Indications, UnloadEndsActiveSubscriptions) {
     ASSERT_TRUE(host->subscribe(kNs, "Test_Alert").ok());
     ASSERT_TRUE(host->waitForIndications(3, std::chrono::seconds(10)));
     // TearDown unloads with the subscription still active: the provider's
@@ -243,8 +232,7 @@ TEST_F(Indications, UnloadEndsActiveSubscriptions)
 
 using Lifecycle = HostFixture;
 
-TEST_F(Lifecycle, NonTerminatingCleanupHonoursDoNotUnload)
-{
+TEST_F(Lifecycle, NonTerminatingCleanupHonoursDoNotUnload) {
     const ObjectPath w1 = path("Test_Widget.Id=\"w1\"");
     ASSERT_TRUE(host->invokeMethod(w1, "ForbidUnload").ok());
     ASSERT_TRUE(host->enumerateInstances(kNs, "Test_Widget").ok());
@@ -273,8 +261,7 @@ TEST_F(Lifecycle, NonTerminatingCleanupHonoursDoNotUnload)
     EXPECT_EQ(counters().factoryCalls, factories + 2);
 }
 
-TEST_F(Lifecycle, UnloadClosesTheLibraryAndLoadStartsAgain)
-{
+TEST_F(Lifecycle, UnloadClosesTheLibraryAndLoadStartsAgain) {
     ASSERT_TRUE(host->enumerateInstances(kNs, "Test_Gadget").ok());
     ASSERT_TRUE(host->unload().ok());
     EXPECT_FALSE(host->loaded());
@@ -285,8 +272,7 @@ TEST_F(Lifecycle, UnloadClosesTheLibraryAndLoadStartsAgain)
     EXPECT_TRUE(host->enumerateInstances(kNs, "Test_Gadget").ok());
 }
 
-TEST(HostLoad, ReportsMissingFiles)
-{
+TEST(HostLoad, ReportsMissingFiles) {
     Host h;
     Status st = h.load("/nonexistent/libx.so", TVRN_TESTPROV_REG);
     EXPECT_EQ(st.rc, CMPI_RC_ERR_FAILED);
@@ -296,8 +282,7 @@ TEST(HostLoad, ReportsMissingFiles)
     EXPECT_NE(st.msg.find("cannot open"), std::string::npos);
 }
 
-TEST(HostLoad, KeepMappedLeavesTheLibraryLoaded)
-{
+TEST(HostLoad, KeepMappedLeavesTheLibraryLoaded) {
     HostOptions o;
     o.keepMapped = true;
     {

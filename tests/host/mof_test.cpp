@@ -7,8 +7,7 @@ using namespace tvrnhost;
 
 namespace {
 
-TEST(MofValue, EveryKindOfScalar)
-{
+TEST(MofValue, EveryKindOfScalar) {
     const DateTime when = *DateTime::parse("20240101120000.000000+060");
     struct Case {
         Value value;
@@ -40,8 +39,7 @@ TEST(MofValue, EveryKindOfScalar)
     }
 }
 
-TEST(MofValue, ArraysAndEmbeddedInstances)
-{
+TEST(MofValue, ArraysAndEmbeddedInstances) {
     EXPECT_EQ(mofValue(Value::array(Type::Uint16, {})), "{}");
     EXPECT_EQ(mofValue(Value::array(Type::String, {Value::string("a"), Value::null(Type::String),
                                                    Value::string("b,c")})),
@@ -54,14 +52,12 @@ TEST(MofValue, ArraysAndEmbeddedInstances)
     EXPECT_EQ(mofValue(Value::instance(err)),
               "\"instance of CIM_Error { ErrorType = 4; "
               "Message = \\\"say \\\\\\\"no\\\\\\\"\\\"; };\"");
-    EXPECT_EQ(mofValue(Value::instance(Instance("root/t", "Empty"))),
-              "\"instance of Empty {};\"");
+    EXPECT_EQ(mofValue(Value::instance(Instance("root/t", "Empty"))), "\"instance of Empty {};\"");
     EXPECT_EQ(mofValue(Value::array(Type::Instance, {Value::instance(Instance("", "E"))})),
               "{\"instance of E {};\"}");
 }
 
-TEST(MofInstance, NonNullPropertiesInTheInstancesOrder)
-{
+TEST(MofInstance, NonNullPropertiesInTheInstancesOrder) {
     Instance inst(ObjectPath::parse("root/t:Zed.Key=\"k\""));
     inst.set("Zeta", Value::uint32(1))
         .set("Key", Value::string("k"))

@@ -31,16 +31,14 @@ CMPI_MUTEX_TYPE tp_mutex(void);
 /* Factory hook and cleanup of every MI. */
 void tp_init(const CMPIBroker *b);
 CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating);
-#define TP_CLEANUP(name, kind) \
-    static CMPIStatus name(CMPI##kind##MI *mi, const CMPIContext *ctx, CMPIBoolean t) \
-    { \
-        return tp_cleanup(ctx, t); \
+#define TP_CLEANUP(name, kind)                                                          \
+    static CMPIStatus name(CMPI##kind##MI *mi, const CMPIContext *ctx, CMPIBoolean t) { \
+        return tp_cleanup(ctx, t);                                                      \
     }
 
 /* An MI function that no test asks for. */
-#define TP_NOT_SUPPORTED(name, ...) \
-    static CMPIStatus name(__VA_ARGS__) \
-    { \
+#define TP_NOT_SUPPORTED(name, ...)          \
+    static CMPIStatus name(__VA_ARGS__) {    \
         CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
     }
 

@@ -15,8 +15,7 @@ static const struct {
 } gadgets[] = {{"g1", 5}, {"g2", 7}};
 #define NGADGETS (sizeof gadgets / sizeof gadgets[0])
 
-static CMPIInstance *gadgetInstance(size_t i, const char *ns, const char **props)
-{
+static CMPIInstance *gadgetInstance(size_t i, const char *ns, const char **props) {
     static const char *keys[] = {"Name", NULL};
     CMPIInstance *ci = CMNewInstance(tp_broker, tp_gadgetPath(gadgets[i].name, ns), NULL);
     if (props)
@@ -29,8 +28,7 @@ static CMPIInstance *gadgetInstance(size_t i, const char *ns, const char **props
 TP_CLEANUP(GadgetCleanup, Instance)
 
 static CMPIStatus GadgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                          const CMPIResult *rslt, const CMPIObjectPath *op)
-{
+                                          const CMPIResult *rslt, const CMPIObjectPath *op) {
     size_t i;
     for (i = 0; i < NGADGETS; ++i)
         CMReturnObjectPath(rslt, tp_gadgetPath(gadgets[i].name, tp_ns(op)));
@@ -40,8 +38,7 @@ static CMPIStatus GadgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext 
 
 static CMPIStatus GadgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                       const CMPIResult *rslt, const CMPIObjectPath *op,
-                                      const char **props)
-{
+                                      const char **props) {
     size_t i;
     for (i = 0; i < NGADGETS; ++i)
         CMReturnInstance(rslt, gadgetInstance(i, tp_ns(op), props));
@@ -51,8 +48,7 @@ static CMPIStatus GadgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx
 
 static CMPIStatus GadgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                     const CMPIResult *rslt, const CMPIObjectPath *op,
-                                    const char **props)
-{
+                                    const char **props) {
     const char *name = tp_key(op, "Name");
     size_t i;
     for (i = 0; name && i < NGADGETS; ++i)
@@ -80,15 +76,14 @@ TP_NOT_SUPPORTED(GadgetExecQuery, CMPIInstanceMI *mi, const CMPIContext *ctx,
 
 CMInstanceMIStub(Gadget, Test_Gadget_Provider, mib, tp_init(mib))
 
-/* Test_WidgetGadget */
+    /* Test_WidgetGadget */
 
-static const struct {
+    static const struct {
     const char *widget, *gadget;
 } links[] = {{"w1", "g1"}, {"w1", "g2"}, {"w2", "g1"}};
 #define NLINKS (sizeof links / sizeof links[0])
 
-static CMPIObjectPath *linkPath(size_t i, const char *ns)
-{
+static CMPIObjectPath *linkPath(size_t i, const char *ns) {
     CMPIObjectPath *op = CMNewObjectPath(tp_broker, ns, "Test_WidgetGadget", NULL);
     CMPIObjectPath *w = tp_widgetPath(links[i].widget, ns);
     CMPIObjectPath *g = tp_gadgetPath(links[i].gadget, ns);
@@ -97,8 +92,7 @@ static CMPIObjectPath *linkPath(size_t i, const char *ns)
     return op;
 }
 
-static CMPIInstance *linkInstance(size_t i, const char *ns, const char **props)
-{
+static CMPIInstance *linkInstance(size_t i, const char *ns, const char **props) {
     static const char *keys[] = {"Widget", "Gadget", NULL};
     CMPIInstance *ci = CMNewInstance(tp_broker, linkPath(i, ns), NULL);
     CMPIObjectPath *w = tp_widgetPath(links[i].widget, ns);
@@ -114,8 +108,7 @@ static CMPIInstance *linkInstance(size_t i, const char *ns, const char **props)
 
 /* The other end of link i, or NULL when the link does not refer to the
  * source in the role asked for (any role when NULL). */
-static CMPIObjectPath *otherEnd(size_t i, const CMPIObjectPath *src, const char *role)
-{
+static CMPIObjectPath *otherEnd(size_t i, const CMPIObjectPath *src, const char *role) {
     const char *cls = tp_class(src), *ns = tp_ns(src);
     int isWidget = strcasecmp(cls, "Test_Widget") == 0;
     const char *key = tp_key(src, isWidget ? "Id" : "Name");
@@ -132,9 +125,8 @@ TP_CLEANUP(LinkAssociationCleanup, Association)
 
 static CMPIStatus LinkAssociators(CMPIAssociationMI *mi, const CMPIContext *ctx,
                                   const CMPIResult *rslt, const CMPIObjectPath *op,
-                                  const char *assocClass, const char *resultClass,
-                                  const char *role, const char *resultRole, const char **props)
-{
+                                  const char *assocClass, const char *resultClass, const char *role,
+                                  const char *resultRole, const char **props) {
     size_t i;
     for (i = 0; i < NLINKS; ++i) {
         CMPIObjectPath *other = otherEnd(i, op, role);
@@ -158,8 +150,7 @@ TP_NOT_SUPPORTED(LinkAssociatorNames, CMPIAssociationMI *mi, const CMPIContext *
 
 static CMPIStatus LinkReferences(CMPIAssociationMI *mi, const CMPIContext *ctx,
                                  const CMPIResult *rslt, const CMPIObjectPath *op,
-                                 const char *resultClass, const char *role, const char **props)
-{
+                                 const char *resultClass, const char *role, const char **props) {
     size_t i;
     for (i = 0; i < NLINKS; ++i)
         if (otherEnd(i, op, role))
@@ -170,8 +161,7 @@ static CMPIStatus LinkReferences(CMPIAssociationMI *mi, const CMPIContext *ctx,
 
 static CMPIStatus LinkReferenceNames(CMPIAssociationMI *mi, const CMPIContext *ctx,
                                      const CMPIResult *rslt, const CMPIObjectPath *op,
-                                     const char *resultClass, const char *role)
-{
+                                     const char *resultClass, const char *role) {
     size_t i;
     for (i = 0; i < NLINKS; ++i)
         if (otherEnd(i, op, role))
@@ -181,11 +171,10 @@ static CMPIStatus LinkReferenceNames(CMPIAssociationMI *mi, const CMPIContext *c
 }
 
 CMAssociationMIStub(Link, Test_WidgetGadget_Provider, mib, tp_init(mib))
-
 /* Test_Alert */
 
 #define MAX_NS 4
-static struct {
+    static struct {
     char ns[64];
     int count;
 } activeNs[MAX_NS];
@@ -197,8 +186,7 @@ static const CMPIUint32 kBurst = 3;
 static CMPIUint32 seq;
 
 /* One alert to every namespace with an active filter. */
-static void deliverAlert(const CMPIContext *ctx)
-{
+static void deliverAlert(const CMPIContext *ctx) {
     int i;
     ++seq;
     for (i = 0; i < MAX_NS; ++i) {
@@ -221,8 +209,7 @@ static void deliverAlert(const CMPIContext *ctx)
 
 /* Delivers a burst of alerts after every filter activation until told to
  * stop. Runs attached to the broker with the context prepared for it. */
-static CMPI_THREAD_RETURN CMPI_THREAD_CDECL alertMain(void *arg)
-{
+static CMPI_THREAD_RETURN CMPI_THREAD_CDECL alertMain(void *arg) {
     const CMPIContext *ctx = (const CMPIContext *)arg;
     CMPIUint32 i;
     CBAttachThread(tp_broker, ctx);
@@ -243,8 +230,7 @@ static CMPI_THREAD_RETURN CMPI_THREAD_CDECL alertMain(void *arg)
     return NULL;
 }
 
-void tp_alertsStop(void)
-{
+void tp_alertsStop(void) {
     tp_lock();
     if (!alertRunning) {
         tp_unlock();
@@ -266,8 +252,7 @@ TP_CLEANUP(AlertIndicationCleanup, Indication)
 
 static CMPIStatus AlertAuthorizeFilter(CMPIIndicationMI *mi, const CMPIContext *ctx,
                                        const CMPISelectExp *filter, const char *cls,
-                                       const CMPIObjectPath *op, const char *owner)
-{
+                                       const CMPIObjectPath *op, const char *owner) {
     tvrntest_counters.authorizeCalls++;
     CMReturn(strcasecmp(cls, "Test_Alert") == 0 ? CMPI_RC_OK : CMPI_RC_ERR_INVALID_CLASS);
 }
@@ -277,8 +262,7 @@ TP_NOT_SUPPORTED(AlertMustPoll, CMPIIndicationMI *mi, const CMPIContext *ctx,
 
 static CMPIStatus AlertActivateFilter(CMPIIndicationMI *mi, const CMPIContext *ctx,
                                       const CMPISelectExp *filter, const char *cls,
-                                      const CMPIObjectPath *op, CMPIBoolean first)
-{
+                                      const CMPIObjectPath *op, CMPIBoolean first) {
     const char *ns = tp_ns(op);
     int i, slot = -1;
     if (!CMEvaluateSelExp(filter, NULL, NULL))
@@ -300,8 +284,7 @@ static CMPIStatus AlertActivateFilter(CMPIIndicationMI *mi, const CMPIContext *c
 
 static CMPIStatus AlertDeActivateFilter(CMPIIndicationMI *mi, const CMPIContext *ctx,
                                         const CMPISelectExp *filter, const char *cls,
-                                        const CMPIObjectPath *op, CMPIBoolean last)
-{
+                                        const CMPIObjectPath *op, CMPIBoolean last) {
     const char *ns = tp_ns(op);
     int i;
     tp_lock();
@@ -314,8 +297,7 @@ static CMPIStatus AlertDeActivateFilter(CMPIIndicationMI *mi, const CMPIContext 
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus AlertEnableIndications(CMPIIndicationMI *mi, const CMPIContext *ctx)
-{
+static CMPIStatus AlertEnableIndications(CMPIIndicationMI *mi, const CMPIContext *ctx) {
     CMPIContext *threadCtx = CBPrepareAttachThread(tp_broker, ctx);
     tp_lock();
     tvrntest_counters.enableCalls++;
@@ -327,8 +309,7 @@ static CMPIStatus AlertEnableIndications(CMPIIndicationMI *mi, const CMPIContext
     CMReturn(alertRunning ? CMPI_RC_OK : CMPI_RC_ERR_FAILED);
 }
 
-static CMPIStatus AlertDisableIndications(CMPIIndicationMI *mi, const CMPIContext *ctx)
-{
+static CMPIStatus AlertDisableIndications(CMPIIndicationMI *mi, const CMPIContext *ctx) {
     tvrntest_counters.disableCalls++;
     tp_alertsStop();
     CMReturn(CMPI_RC_OK);

@@ -28,8 +28,7 @@ static CMPIInstance *kept; /* a clone that outlives its request */
 
 /* Called with `ready` 1 by every factory (fills the table once) and with 0
  * by cleanup (the next factory starts afresh). */
-void tp_widgetsReset(int ready)
-{
+void tp_widgetsReset(int ready) {
     static const Widget initial[] = {
         {1, "w1", 1, 10, 1, 0, "first", 0.5, 1700000000000000ULL, 2, {"a", "b"}},
         {1, "w2", 2, 20, 0, 1, "", 1.5, 1700000060000000ULL, -1, {""}},
@@ -49,8 +48,7 @@ void tp_widgetsReset(int ready)
     tp_unlock();
 }
 
-static Widget *findWidget(const char *id)
-{
+static Widget *findWidget(const char *id) {
     int i;
     for (i = 0; id && i < MAX_WIDGETS; ++i)
         if (widgets[i].used && strcmp(widgets[i].id, id) == 0)
@@ -58,8 +56,7 @@ static Widget *findWidget(const char *id)
     return NULL;
 }
 
-static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char **props)
-{
+static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char **props) {
     static const char *keys[] = {"Id", NULL};
     CMPIInstance *ci = CMNewInstance(tp_broker, tp_widgetPath(w->id, ns), NULL);
     CMPIDateTime *created = CMNewDateTimeFromBinary(tp_broker, w->created, 0, NULL);
@@ -88,8 +85,7 @@ static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char 
 }
 
 /* Copies the properties of `ci` named in `props` (all when NULL) into w. */
-static void updateWidget(Widget *w, const CMPIInstance *ci, const char **props)
-{
+static void updateWidget(Widget *w, const CMPIInstance *ci, const char **props) {
     CMPIStatus rc;
     CMPIData d = CMGetProperty(ci, "Count", &rc);
     if (rc.rc == CMPI_RC_OK && tp_listed(props, "Count"))
@@ -108,8 +104,7 @@ static void updateWidget(Widget *w, const CMPIInstance *ci, const char **props)
 TP_CLEANUP(WidgetCleanup, Instance)
 
 static CMPIStatus WidgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                          const CMPIResult *rslt, const CMPIObjectPath *op)
-{
+                                          const CMPIResult *rslt, const CMPIObjectPath *op) {
     int i;
     tp_lock();
     for (i = 0; i < MAX_WIDGETS; ++i)
@@ -122,8 +117,7 @@ static CMPIStatus WidgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext 
 
 static CMPIStatus WidgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                       const CMPIResult *rslt, const CMPIObjectPath *op,
-                                      const char **props)
-{
+                                      const char **props) {
     int i;
     tp_lock();
     for (i = 0; i < MAX_WIDGETS; ++i)
@@ -136,8 +130,7 @@ static CMPIStatus WidgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx
 
 static CMPIStatus WidgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                     const CMPIResult *rslt, const CMPIObjectPath *op,
-                                    const char **props)
-{
+                                    const char **props) {
     Widget *w;
     char msg[64];
     tp_lock();
@@ -155,8 +148,7 @@ static CMPIStatus WidgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
 
 static CMPIStatus WidgetCreateInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                        const CMPIResult *rslt, const CMPIObjectPath *op,
-                                       const CMPIInstance *ci)
-{
+                                       const CMPIInstance *ci) {
     const char *id = tp_key(op, "Id");
     CMPIrc rc = CMPI_RC_ERR_FAILED;
     int i;
@@ -187,8 +179,7 @@ static CMPIStatus WidgetCreateInstance(CMPIInstanceMI *mi, const CMPIContext *ct
 
 static CMPIStatus WidgetModifyInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
                                        const CMPIResult *rslt, const CMPIObjectPath *op,
-                                       const CMPIInstance *ci, const char **props)
-{
+                                       const CMPIInstance *ci, const char **props) {
     Widget *w;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
@@ -200,8 +191,7 @@ static CMPIStatus WidgetModifyInstance(CMPIInstanceMI *mi, const CMPIContext *ct
 }
 
 static CMPIStatus WidgetDeleteInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                       const CMPIResult *rslt, const CMPIObjectPath *op)
-{
+                                       const CMPIResult *rslt, const CMPIObjectPath *op) {
     Widget *w;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
@@ -218,20 +208,18 @@ TP_NOT_SUPPORTED(WidgetExecQuery, CMPIInstanceMI *mi, const CMPIContext *ctx,
 
 CMInstanceMIStub(Widget, Test_Widget_Provider, mib, tp_init(mib))
 
-/* Methods */
+    /* Methods */
 
-TP_CLEANUP(WidgetMethodCleanup, Method)
+    TP_CLEANUP(WidgetMethodCleanup, Method)
 
-static CMPIStatus returnValue(const CMPIResult *rslt, const void *value, CMPIType type)
-{
+        static CMPIStatus returnValue(const CMPIResult *rslt, const void *value, CMPIType type) {
     CMReturnData(rslt, value, type);
     CMReturnDone(rslt);
     CMReturn(CMPI_RC_OK);
 }
 
 /* Returns every input argument unchanged as an output argument. */
-static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArgs *out)
-{
+static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArgs *out) {
     CMPICount i, n = CMGetArgCount(in, NULL);
     CMPIUint32 count = n;
     for (i = 0; i < n; ++i) {
@@ -243,8 +231,7 @@ static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArg
 }
 
 /* Up-call: an instance that the host keeps in its store. */
-static CMPIStatus methodReadManager(const CMPIContext *ctx, const CMPIResult *rslt)
-{
+static CMPIStatus methodReadManager(const CMPIContext *ctx, const CMPIResult *rslt) {
     CMPIStatus rc;
     CMPIObjectPath *op = CMNewObjectPath(tp_broker, "root/interop", "Test_Manager", NULL);
     CMPIInstance *ci;
@@ -259,8 +246,7 @@ static CMPIStatus methodReadManager(const CMPIContext *ctx, const CMPIResult *rs
 
 /* Up-call: another provider's class, served re-entrantly. */
 static CMPIStatus methodCountGadgets(const CMPIContext *ctx, const CMPIResult *rslt,
-                                     const CMPIObjectPath *self)
-{
+                                     const CMPIObjectPath *self) {
     CMPIStatus rc;
     CMPIObjectPath *op = CMNewObjectPath(tp_broker, tp_ns(self), "Test_Gadget", NULL);
     CMPIEnumeration *en = CBEnumInstances(tp_broker, ctx, op, NULL, &rc);
@@ -277,8 +263,7 @@ static CMPIStatus methodCountGadgets(const CMPIContext *ctx, const CMPIResult *r
 }
 
 /* Makes objects and leaves them to the broker's end-of-request cleanup. */
-static CMPIStatus methodScratch(const CMPIResult *rslt)
-{
+static CMPIStatus methodScratch(const CMPIResult *rslt) {
     int i;
     char *mem;
     CMPIGcStat *mark;
@@ -297,8 +282,7 @@ static CMPIStatus methodScratch(const CMPIResult *rslt)
 
 static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
                                      const CMPIResult *rslt, const CMPIObjectPath *op,
-                                     const char *method, const CMPIArgs *in, CMPIArgs *out)
-{
+                                     const char *method, const CMPIArgs *in, CMPIArgs *out) {
     if (strcasecmp(method, "Echo") == 0)
         return methodEcho(rslt, in, out);
     if (strcasecmp(method, "WhoAmI") == 0) {
@@ -343,4 +327,3 @@ static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
 }
 
 CMMethodMIStub(Widget, Test_Widget_Provider, mib, tp_init(mib))
-

@@ -9,8 +9,7 @@ using namespace tvrnhost;
 
 namespace {
 
-TEST(ObjectPathText, ParsesEveryFormAndPrintsKeysSorted)
-{
+TEST(ObjectPathText, ParsesEveryFormAndPrintsKeysSorted) {
     struct Case {
         const char *in, *host, *ns, *cls, *printed;
         size_t keys;
@@ -36,8 +35,7 @@ TEST(ObjectPathText, ParsesEveryFormAndPrintsKeysSorted)
     }
 }
 
-TEST(ObjectPathText, KeyTypesAndReferenceKeys)
-{
+TEST(ObjectPathText, KeyTypesAndReferenceKeys) {
     ObjectPath p = ObjectPath::parse(
         "root/t:Assoc.Antecedent=\"root/t:A.Id=\\\"1\\\"\",Name=\"plain\",N=7,S=-7,On=FALSE");
     ASSERT_TRUE(p.key("antecedent"));  // case-insensitive look-up
@@ -50,22 +48,20 @@ TEST(ObjectPathText, KeyTypesAndReferenceKeys)
     EXPECT_EQ(ObjectPath::parse(p.toString()), p);
 }
 
-TEST(ObjectPathText, RejectsMalformedPaths)
-{
-    for (const char *bad : {"", "//host", "//host/Class.K=1", ":C", "root:1Class", "C.K", "C.K=",
-                            "C.K=bare", "C.K=\"open", "C.K=1,K=2", "C.K=1 junk"}) {
+TEST(ObjectPathText, RejectsMalformedPaths) {
+    for (const char *bad : {"", "//host", "//host/Class.K=1", ":C", "root:1Class", "C.K",
+                            "C.K=", "C.K=bare", "C.K=\"open", "C.K=1,K=2", "C.K=1 junk"}) {
         SCOPED_TRACE(bad);
         EXPECT_THROW(ObjectPath::parse(bad), ParseError);
     }
 }
 
-TEST(ObjectPathEquality, IdentifiesComparesIntegerKeysByValue)
-{
+TEST(ObjectPathEquality, IdentifiesComparesIntegerKeysByValue) {
     ObjectPath a("root/t", "C");
     a.addKey("N", Value::uint16(5));
     ObjectPath b("", "c");
     b.addKey("n", Value::uint64(5));
-    EXPECT_NE(a, b);            // exact: types and namespaces differ
+    EXPECT_NE(a, b);               // exact: types and namespaces differ
     EXPECT_TRUE(a.identifies(b));  // same object
     b.addKey("n", Value::sint64(-5));
     EXPECT_FALSE(a.identifies(b));
@@ -74,8 +70,7 @@ TEST(ObjectPathEquality, IdentifiesComparesIntegerKeysByValue)
     EXPECT_FALSE(a.identifies(c));  // both namespaces given and different
 }
 
-TEST(InstanceText, PrintsSortedTypedDeclarationsAndParsesThemBack)
-{
+TEST(InstanceText, PrintsSortedTypedDeclarationsAndParsesThemBack) {
     Instance embedded(ObjectPath("", "CIM_Error"));
     embedded.set("Message", Value::string("m"));
     Instance i(ObjectPath::parse("root/t:Test_Widget.Id=\"w1\""));
@@ -109,8 +104,7 @@ TEST(InstanceText, PrintsSortedTypedDeclarationsAndParsesThemBack)
     EXPECT_EQ(parsed[1], i);
 }
 
-TEST(InstanceText, ReportsTheLineOfAnError)
-{
+TEST(InstanceText, ReportsTheLineOfAnError) {
     try {
         parseInstances("instance C.K=1 {\n  uint8 A = 300;\n}\n");
         FAIL() << "accepted an out-of-range uint8";
@@ -122,8 +116,7 @@ TEST(InstanceText, ReportsTheLineOfAnError)
                  ParseError);
 }
 
-TEST(ValueLiterals, GuessedAndExplicitTypes)
-{
+TEST(ValueLiterals, GuessedAndExplicitTypes) {
     struct Case {
         const char *text;
         Value expected;
@@ -158,8 +151,7 @@ TEST(ValueLiterals, GuessedAndExplicitTypes)
     }
 }
 
-TEST(ValueEquality, TypeNullnessAndWidthMatter)
-{
+TEST(ValueEquality, TypeNullnessAndWidthMatter) {
     EXPECT_NE(Value::uint16(1), Value::uint32(1));
     EXPECT_NE(Value::null(Type::Uint8), Value::uint8(0));
     EXPECT_NE(Value::null(Type::Uint8), Value::null(Type::Uint8, true));
@@ -168,8 +160,7 @@ TEST(ValueEquality, TypeNullnessAndWidthMatter)
     EXPECT_EQ(Value::real32(0.1f).toString(), "0.1");
 }
 
-TEST(DateTimeConversion, BinaryAndTextAgree)
-{
+TEST(DateTimeConversion, BinaryAndTextAgree) {
     struct Case {
         const char *text;
         std::uint64_t usec;
@@ -186,12 +177,11 @@ TEST(DateTimeConversion, BinaryAndTextAgree)
         ASSERT_TRUE(dt);
         EXPECT_EQ(dt->toBinary(), c.usec);
     }
-    EXPECT_EQ(DateTime::fromBinary(1700000000123456ULL, false).text(),
-              "20231114221320.123456+000");
+    EXPECT_EQ(DateTime::fromBinary(1700000000123456ULL, false).text(), "20231114221320.123456+000");
     EXPECT_EQ(DateTime::fromBinary(93784000005ULL, true).text(), "00000001020304.000005:000");
-    for (const char *bad : {"2023111422132.123456+000", "20231114221320.123456*000",
-                            "20231114221320-123456+000", "20231314221320.000000+000",
-                            "00000001020304.000000:001", "2023111422132a.000000+000"}) {
+    for (const char *bad :
+         {"2023111422132.123456+000", "20231114221320.123456*000", "20231114221320-123456+000",
+          "20231314221320.000000+000", "00000001020304.000000:001", "2023111422132a.000000+000"}) {
         SCOPED_TRACE(bad);
         EXPECT_FALSE(DateTime::parse(bad));
     }
@@ -199,16 +189,16 @@ TEST(DateTimeConversion, BinaryAndTextAgree)
 
 // The test library's registration file, read by every host test, has the
 // usual forms; here the others.
-TEST(RegistrationFile, ParsesBlocksTypesAndNamespaces)
-{
-    auto regs = parseRegistrations("# providers\n"
-                                   "\n"
-                                   "[C]\n"
-                                   "provider: P\n"
-                                   "location: l\n"
-                                   "type: association, instance\n"
-                                   "namespace: n1 n2\n"
-                                   "namespace: n3\n");
+TEST(RegistrationFile, ParsesBlocksTypesAndNamespaces) {
+    auto regs = parseRegistrations(
+        "# providers\n"
+        "\n"
+        "[C]\n"
+        "provider: P\n"
+        "location: l\n"
+        "type: association, instance\n"
+        "namespace: n1 n2\n"
+        "namespace: n3\n");
     ASSERT_EQ(regs.size(), 1u);
     EXPECT_EQ(regs[0].provider, "P");
     EXPECT_EQ(regs[0].kinds, kInstanceMI | kAssociationMI);
@@ -216,12 +206,11 @@ TEST(RegistrationFile, ParsesBlocksTypesAndNamespaces)
     EXPECT_EQ(regs[0].line, 3);
 }
 
-TEST(RegistrationFile, RejectsIncompleteOrUnknownEntries)
-{
+TEST(RegistrationFile, RejectsIncompleteOrUnknownEntries) {
     const char *bad[] = {
-        "provider: P\n",                                            // before any block
-        "[C]\nprovider: P\nlocation: l\ntype: instance\n",          // no namespace
-        "[C]\nprovider: P\nlocation: l\nnamespace: n\n",            // no type
+        "provider: P\n",                                    // before any block
+        "[C]\nprovider: P\nlocation: l\ntype: instance\n",  // no namespace
+        "[C]\nprovider: P\nlocation: l\nnamespace: n\n",    // no type
         "[C]\nprovider: P\nlocation: l\ntype: instanse\nnamespace: n\n",
         "[C]\nprovider: P\nlocation: l\ntype: instance\nnamespace: n\ncolour: red\n",
         "[C\nprovider: P\n",

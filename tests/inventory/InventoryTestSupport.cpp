@@ -49,13 +49,17 @@ int& hostResolves() {
     return resolves;
 }
 
-void setHostMode(HostMode mode) { gMode = mode; }
+void setHostMode(HostMode mode) {
+    gMode = mode;
+}
 
-Instances::~Instances() { destroyInstances(_items); }
+Instances::~Instances() {
+    destroyInstances(_items);
+}
 
 void InventoryTest::SetUp() {
     _sim = &gwtest::boundSimulator();  // back to the built-in host
-    static ProviderInit init;           // the provider start-up, once per program
+    static ProviderInit init;          // the provider start-up, once per program
     ProviderInit::driverStatus = 0;
     gMode = HostMode::ADDRESS;
     ProviderUtil::setHostLookup(&kFakeHost);
@@ -63,7 +67,9 @@ void InventoryTest::SetUp() {
     gwtest::LogCapture::get().mark();
 }
 
-void InventoryTest::TearDown() { ProviderInit::driverStatus = 0; }
+void InventoryTest::TearDown() {
+    ProviderInit::driverStatus = 0;
+}
 
 void InventoryTest::loadJson(const Json::Value& fixture) {
     Json::StreamWriterBuilder writer;
@@ -72,7 +78,8 @@ void InventoryTest::loadJson(const Json::Value& fixture) {
 }
 
 Json::Value fixtureJson(const char* name) {
-    return gwtest::parseJson(gwtest::readFile(std::string(TVRN_SIM_FIXTURES) + "/" + name + ".json"));
+    return gwtest::parseJson(
+        gwtest::readFile(std::string(TVRN_SIM_FIXTURES) + "/" + name + ".json"));
 }
 
 Array<Instance*> InventoryTest::fchba(classId_t id) {

@@ -35,7 +35,8 @@ public:
     bool empty() const { return _items.size() == 0; }
     template <class T>
     T* at(size_t i) const {
-        return i < _items.size() && _items[i] != nullptr && _items[i]->meta_class == &T::static_meta_class
+        return i < _items.size() && _items[i] != nullptr &&
+                       _items[i]->meta_class == &T::static_meta_class
                    ? static_cast<T*>(_items[i])
                    : nullptr;
     }

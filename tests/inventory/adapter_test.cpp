@@ -26,7 +26,8 @@ TEST_F(Adapters, NetworkDriverComesBeforeStorageDriverOnACnaListedFirst) {
     Json::Value cna = fixture["adapters"][2];
     fixture["adapters"] = Json::Value(Json::arrayValue);
     fixture["adapters"].append(cna);
-    fixture["adapters"].append(fixtureJson("variants")["adapters"][4]);  // a second CNA, not flashed
+    fixture["adapters"].append(
+        fixtureJson("variants")["adapters"][4]);  // a second CNA, not flashed
     loadJson(fixture);
     EXPECT_EQ(identities().values(&TAVRIN_AdapterSoftwareIdentity::InstanceID),
               (std::vector<std::string>{"tna", "tvfc", "00051e8a4b00_bios", "00051e8a4b00_firmware",
@@ -36,17 +37,19 @@ TEST_F(Adapters, NetworkDriverComesBeforeStorageDriverOnACnaListedFirst) {
 TEST_F(Adapters, DellMezzanineHasFirmwareButNoBios) {
     load("variants");
     Instances ids = identities();
-    EXPECT_NE(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e7e8f90_firmware"), nullptr);
-    EXPECT_EQ(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e7e8f90_bios"), nullptr);
+    EXPECT_NE(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e7e8f90_firmware"),
+              nullptr);
+    EXPECT_EQ(ids.find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e7e8f90_bios"),
+              nullptr);
 }
 
 TEST_F(Adapters, AdapterWithoutPortsYieldsNothing) {
     loadWithFirstAdapter("portCount", 0);
     for (classId_t id : {CID_PORT_CONTROLLER, CID_PHYSICAL_PACKAGE, CID_PRODUCT})
         EXPECT_EQ(Instances(fchba(id)).size(), 2u) << "class id " << id;
-    EXPECT_EQ(identities().find(&TAVRIN_AdapterSoftwareIdentity::InstanceID,
-                                "200000051e0a0b0c_firmware"),
-              nullptr);
+    EXPECT_EQ(
+        identities().find(&TAVRIN_AdapterSoftwareIdentity::InstanceID, "200000051e0a0b0c_firmware"),
+        nullptr);
     EXPECT_GE(logged("WARN", "There are no ports associated to Adapter id 1"), 1);
 }
 

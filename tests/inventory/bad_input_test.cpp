@@ -114,8 +114,9 @@ TEST_F(BadInput, ExceptionsFromEveryLookUpOfTheEthernetWalkStayInside) {
         Json::Value ports;
         EXPECT_EQ(PortHelper::getPortHelperObject()->getNumberOfPorts(kAdapter1, ports), -1);
     }
-    EXPECT_EQ(logged("ERR", "EthernetPortHelper::getEthernetPortInstancesByAdapter ended by User "
-                            "exception 7: boom"),
+    EXPECT_EQ(logged("ERR",
+                     "EthernetPortHelper::getEthernetPortInstancesByAdapter ended by User "
+                     "exception 7: boom"),
               1);
 }
 
@@ -136,22 +137,23 @@ const MemberCase kMemberCases[] = {
      CID_FC_PORT, 0, "libGetAllAdaptersIndexString returns NULL."},
     {"getAllAdaptersIndexString", nullptr, TVRN_SIM_FAULT_WRONG_TYPE, "indexStrings.0", false,
      CID_PORT_CONTROLLER, 2, "Unable to get Adapter info 1 - "},
-    {"getHbaByWwn", kAdapter1, TVRN_SIM_FAULT_WRONG_TYPE, "hbaData", false, CID_PORT_CONTROLLER,
-     2, "Unable to get adapater details for 20:00:00:05:1e:0a:0b:0c"},
+    {"getHbaByWwn", kAdapter1, TVRN_SIM_FAULT_WRONG_TYPE, "hbaData", false, CID_PORT_CONTROLLER, 2,
+     "Unable to get adapater details for 20:00:00:05:1e:0a:0b:0c"},
     {"getHbaByWwn", kAdapter1, TVRN_SIM_FAULT_DROP_MEMBER, "hbaData.portCount", false,
      CID_PHYSICAL_PACKAGE, 2, nullptr},
     {"getFcPhyPortIndicesByAdapter", kAdapter1, TVRN_SIM_FAULT_WRONG_TYPE, "indexStrings", false,
      CID_LOGICAL_PORT_GROUP, 4, "libGetFcPhyPortIndicesByAdapter returns NULL."},
-    {"getFcPhyPortIndicesByAdapter", kAdapter1, TVRN_SIM_FAULT_WRONG_TYPE, "indexStrings.1",
-     false, CID_FC_PORT, 5, nullptr},
+    {"getFcPhyPortIndicesByAdapter", kAdapter1, TVRN_SIM_FAULT_WRONG_TYPE, "indexStrings.1", false,
+     CID_FC_PORT, 5, nullptr},
     {"getPortByWwn", kPort1, TVRN_SIM_FAULT_WRONG_TYPE, "isMezz", false, CID_ALARM_DEVICE, 5,
      "beaconState is NOT available failed for 10:00:00:05:1e:0a:0b:0c."},
-    {"getPortByWwn", kPort1, TVRN_SIM_FAULT_DROP_MEMBER, "beaconState", false, CID_ALARM_DEVICE,
-     5, "beaconState is NOT available failed for 10:00:00:05:1e:0a:0b:0c."},
+    {"getPortByWwn", kPort1, TVRN_SIM_FAULT_DROP_MEMBER, "beaconState", false, CID_ALARM_DEVICE, 5,
+     "beaconState is NOT available failed for 10:00:00:05:1e:0a:0b:0c."},
     {"getAllRemotePorts", kPort1, TVRN_SIM_FAULT_WRONG_TYPE, "0.remotePortWwn", false,
      CID_SCSI_PROTOCOL_ENDPOINT, 10, "libGetCompleteRemotePort returned NULL for "},
     {"getCompleteRemotePort", kDiskTarget, TVRN_SIM_FAULT_WRONG_TYPE, "deviceData", false,
-     CID_SCSI_PROTOCOL_ENDPOINT, 10, "libGetCompleteRemotePort returned NULL for 50:05:07:68:01:10:f0:0d"},
+     CID_SCSI_PROTOCOL_ENDPOINT, 10,
+     "libGetCompleteRemotePort returned NULL for 50:05:07:68:01:10:f0:0d"},
     {"getCompleteRemotePort", kDiskTarget, TVRN_SIM_FAULT_WRONG_TYPE, "lunList", true,
      CID_LOGICAL_DISK, 7, "No LUN Info is available for Rport 50:05:07:68:01:10:f0:0d."},
     {"getCompleteRemotePort", kDiskTarget, TVRN_SIM_FAULT_WRONG_TYPE, "lunList.3.number", true,
@@ -174,12 +176,13 @@ TEST_F(BadInput, MembersMissingOrOfTheWrongTypeCountAsMissing) {
         tvrn_sim_clear_faults();
         gwtest::LogCapture::get().mark();
         fault(c.entry, c.key, c.kind, c.member);
-        EXPECT_EQ(c.classId == CID_NONE
-                      ? Instances(FCHBAManager::getFCHBAManager()->getEthernetPortInstancesByAdapter(
-                                      "00051e8a4b01"))
-                            .size()
-                      : count(c.hdr, c.classId),
-                  c.count);
+        EXPECT_EQ(
+            c.classId == CID_NONE
+                ? Instances(FCHBAManager::getFCHBAManager()->getEthernetPortInstancesByAdapter(
+                                "00051e8a4b01"))
+                      .size()
+                : count(c.hdr, c.classId),
+            c.count);
         if (c.line != nullptr) {
             EXPECT_EQ(logged("ERR", c.line) + logged("INFO", c.line), 1) << log();
         }
@@ -209,12 +212,12 @@ TEST_F(BadInput, LunEntriesMissingMembersAreSkippedOneByOne) {
     Json::Value fixture = fixtureJson("default");
     Json::Value& luns = fixture["adapters"][0]["fcPorts"][0]["remotePorts"][0]["lunList"];
     const char* bad[] = {
-        R"({"number": 7, "productID": "DISK-X"})",                      // no vendor
-        R"({"number": "8", "vendor": "ACME", "productID": "DISK-X"})",  // number as text
-        R"({"number": 9, "vendor": "ACME", "productID": 17})",          // product as number
-        R"({"number": 10, "vendor": ["ACME"], "productID": "DISK-X"})", // vendor as array
+        R"({"number": 7, "productID": "DISK-X"})",                       // no vendor
+        R"({"number": "8", "vendor": "ACME", "productID": "DISK-X"})",   // number as text
+        R"({"number": 9, "vendor": "ACME", "productID": 17})",           // product as number
+        R"({"number": 10, "vendor": ["ACME"], "productID": "DISK-X"})",  // vendor as array
         R"({"number": 11, "vendor": "ACME", "productID": "DISK-X",
-            "lunDescription": 5, "productSerialNumber": {"x": 1}})",    // both of the wrong type
+            "lunDescription": 5, "productSerialNumber": {"x": 1}})",     // both of the wrong type
     };
     for (const char* text : bad)
         luns.append(gwtest::parseJson(text));

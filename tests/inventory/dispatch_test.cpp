@@ -38,8 +38,9 @@ TEST_F(Dispatch, DriverGate) {
             Instances got(fchba(classId_t(id)));
             EXPECT_EQ(tvrn_sim_total_calls(), 0u);
             EXPECT_EQ(got.size(), id == CID_COMPUTER_SYSTEM ? 1u : 0u);
-            EXPECT_EQ(logged("ERR", "Driver is not installed or there is a tfal mismatch hence "
-                                    "no instances returned"),
+            EXPECT_EQ(logged("ERR",
+                             "Driver is not installed or there is a tfal mismatch hence "
+                             "no instances returned"),
                       id == CID_COMPUTER_SYSTEM ? 0 : 1);
         }
         tvrn_sim_reset_counters();
@@ -71,8 +72,8 @@ TEST_F(Dispatch, NestedScopesShareOneResolutionAndTheNextRequestResolvesAgain) {
     {
         HostIdentityScope request;
         Instances controllers(fchba(CID_PORT_CONTROLLER));
-        Instances ports(FCHBAManager::getFCHBAManager()->getFCPortInstancesByAdapter(
-            "200000051e0a0b0c"));
+        Instances ports(
+            FCHBAManager::getFCHBAManager()->getFCPortInstancesByAdapter("200000051e0a0b0c"));
         Instances hosts(fchba(CID_COMPUTER_SYSTEM));
         EXPECT_EQ(ports.size(), 2u);
         EXPECT_EQ(hostResolves(), 1);

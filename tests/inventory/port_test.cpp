@@ -59,7 +59,8 @@ TEST_F(Ports, SetAlarmStateOutcomes) {
         {"100000000000dead", 3, nullptr, 0, "ERR", "Current ALARM STATE is not available", 0},
         {"100000051e5c6d70", 3, "setPortByWwn", 0, "ERR",
          "libSetPortByWwn response is null or has error", 1},
-        {"100000051e5c6d70", 3, "getPortByWwn", 0, "ERR", "Current ALARM STATE is not available", 0},
+        {"100000051e5c6d70", 3, "getPortByWwn", 0, "ERR", "Current ALARM STATE is not available",
+         0},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(std::string(c.device) + " state " + std::to_string(c.state));
@@ -95,7 +96,8 @@ TEST_F(Ports, PerPortQueries) {
     Json::Value list;
     EXPECT_EQ(ports()->getNumberOfPorts("200000051e5c6d70", list), 2);
     EXPECT_EQ(ports()->getNumberOfPorts("2000000000000001", list), -1);
-    EXPECT_EQ(logged("ERR", "libGetFcPhyPortIndicesByAdapter returns NULL for 2000000000000001"), 1);
+    EXPECT_EQ(logged("ERR", "libGetFcPhyPortIndicesByAdapter returns NULL for 2000000000000001"),
+              1);
 
     EXPECT_TRUE(ports()->isPortDisabled("100000051e5c6d71"));
     EXPECT_FALSE(ports()->isPortDisabled("100000051e5c6d70"));
@@ -104,7 +106,8 @@ TEST_F(Ports, PerPortQueries) {
 
     Json::Value port;
     ports()->getPortDetails("0efc008a4b01", port);
-    EXPECT_EQ(sim().lastRequest("getPortByWwn"), gwtest::parseJson(R"({"mac": "0e:fc:00:8a:4b:01"})"));
+    EXPECT_EQ(sim().lastRequest("getPortByWwn"),
+              gwtest::parseJson(R"({"mac": "0e:fc:00:8a:4b:01"})"));
 
     Json::Value sfp;
     EXPECT_EQ(ports()->getOpticsInfo("100000051e0a0b0c", sfp), 0);

@@ -123,7 +123,8 @@ TEST(Inventory, WithoutAdaptersEveryProviderSucceedsEmptyAndSaysSoOnce) {
             if (line.find(c.noInstances) != std::string::npos)
                 told.push_back(line);
         ASSERT_EQ(told.size(), 1u) << c.noInstances;
-        EXPECT_NE(told[0].find(std::string(c.name) + "_Provider.cpp"), std::string::npos) << told[0];
+        EXPECT_NE(told[0].find(std::string(c.name) + "_Provider.cpp"), std::string::npos)
+            << told[0];
         EXPECT_EQ(s.logCount("Returning instances"), 0u);
     }
 }
@@ -163,13 +164,19 @@ TEST(FCPortStatistics, FCAndFCoEPortsEachFillTheirOwnCounters) {
         const char* property;
         long long fc, fcoe;
     } counters[] = {
-        {"BytesTransmitted", 9876543LL * 4, 0}, {"BytesReceived", 8765432LL * 4, 0},  // words
-        {"PacketsTransmitted", 123456, 0},      {"PacketsReceived", 234567, 0},
-        {"LIPCount", 3, 0},                     {"NOSCount", 1, 0},
+        {"BytesTransmitted", 9876543LL * 4, 0},
+        {"BytesReceived", 8765432LL * 4, 0},  // words
+        {"PacketsTransmitted", 123456, 0},
+        {"PacketsReceived", 234567, 0},
+        {"LIPCount", 3, 0},
+        {"NOSCount", 1, 0},
         {"ErrorFrames", 2, 1 + 5 + 4 + 6 + 7},  // the FCoE errors and the later CRC count
-        {"DumpedFrames", 5, 3},                 {"LinkFailures", 1, 0},
-        {"LossOfSyncCounter", 4, 0},            {"LossOfSignalCounter", 2, 0},
-        {"PrimitiveSeqProtocolErrCount", 0, 0}, {"CRCErrors", 7, 5},
+        {"DumpedFrames", 5, 3},
+        {"LinkFailures", 1, 0},
+        {"LossOfSyncCounter", 4, 0},
+        {"LossOfSignalCounter", 2, 0},
+        {"PrimitiveSeqProtocolErrCount", 0, 0},
+        {"CRCErrors", 7, 5},
         {"InvalidTransmissionWords", 11, 0},
     };
     for (const Counter& c : counters) {
@@ -323,17 +330,24 @@ TEST(Inventory, BadLibraryAnswersNeverFailARequest) {
 
     const tvrn_sim_fault_kind kinds[] = {TVRN_SIM_FAULT_NULL_ANSWER, TVRN_SIM_FAULT_ERROR_OBJECT,
                                          TVRN_SIM_FAULT_HBA_AGENT_ERROR,
-                                         TVRN_SIM_FAULT_STD_EXCEPTION,
-                                         TVRN_SIM_FAULT_NON_STANDARD};
+                                         TVRN_SIM_FAULT_STD_EXCEPTION, TVRN_SIM_FAULT_NON_STANDARD};
     const std::pair<const char*, const char*> members[] = {
-        {"getAllAdaptersIndexString", "indexStrings"}, {"getHbaByWwn", "hbaData"},
-        {"getHbaByWwn", "hbaData.portCount"},           {"getFlashInfo", "flashStatus"},
-        {"getFcPhyPortIndicesByAdapter", "indexStrings"}, {"getPortByWwn", "wwn"},
-        {"getPortByWwn", "supportedPortSpeeds"},        {"getPortByWwn", "beaconState"},
-        {"getDynamicPortStatistics", "0.value"},        {"getAllRemotePorts", "0.remotePortWwn"},
-        {"getCompleteRemotePort", "deviceData"},        {"getCompleteRemotePort", "lunList.0.number"},
-        {"getEthPhyPortIndicesByAdapter", "indexStrings"}, {"getEthPortByEthMac", "ethData"},
-        {"getEthPortByEthMac", "ethData.mtu"},          {"getOpticsSFP", "transceiver"},
+        {"getAllAdaptersIndexString", "indexStrings"},
+        {"getHbaByWwn", "hbaData"},
+        {"getHbaByWwn", "hbaData.portCount"},
+        {"getFlashInfo", "flashStatus"},
+        {"getFcPhyPortIndicesByAdapter", "indexStrings"},
+        {"getPortByWwn", "wwn"},
+        {"getPortByWwn", "supportedPortSpeeds"},
+        {"getPortByWwn", "beaconState"},
+        {"getDynamicPortStatistics", "0.value"},
+        {"getAllRemotePorts", "0.remotePortWwn"},
+        {"getCompleteRemotePort", "deviceData"},
+        {"getCompleteRemotePort", "lunList.0.number"},
+        {"getEthPhyPortIndicesByAdapter", "indexStrings"},
+        {"getEthPortByEthMac", "ethData"},
+        {"getEthPortByEthMac", "ethData.mtu"},
+        {"getOpticsSFP", "transceiver"},
         {"getOpticsSFP", "serialNo"},
     };
     auto everyClassAnswers = [&](const std::string& what) {

@@ -34,8 +34,8 @@ Array<Instance*> standIn(classId_t classId) {
 const Meta_Class* const kPort = &TAVRIN_FCPort::static_meta_class;
 const Meta_Class* const kProduct = &TAVRIN_Product::static_meta_class;
 
-const Inventory_Source kSource = {CID_FC_PORT, standIn, "Nothing here!", LL_WARN, ANNOUNCED,
-                                  "Stand_In_Provider.cpp", 42};
+const Inventory_Source kSource = {
+    CID_FC_PORT, standIn, "Nothing here!", LL_WARN, ANNOUNCED, "Stand_In_Provider.cpp", 42};
 
 TEST(InventoryProviderSteps, OnlyInstancesOfTheProvidersClassAreDeliveredTheRestDestroyed) {
     struct Case {

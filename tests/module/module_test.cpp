@@ -146,8 +146,8 @@ TEST(Module, RegistersEveryProviderOnceInTableOrder) {
         EXPECT_EQ(r->proc(r, CPTA::OPERATION_ENUM_ASSOCIATOR_NAMES, provider, nullptr, &empty,
                           &empty, &empty, nullptr, nullptr, nullptr),
                   row.association ? 111 : -1);
-        EXPECT_EQ(r->proc(r, CPTA::OPERATION_ENUM_REFERENCES, provider, nullptr, nullptr,
-                          &empty, nullptr, nullptr, nullptr, nullptr),
+        EXPECT_EQ(r->proc(r, CPTA::OPERATION_ENUM_REFERENCES, provider, nullptr, nullptr, &empty,
+                          nullptr, nullptr, nullptr, nullptr),
                   row.association ? 121 : -1);
         EXPECT_EQ(Registrations::call(r, CPTA::OPERATION_DISABLE_INDICATIONS, provider),
                   row.indication ? 0 : -1);

@@ -54,8 +54,7 @@ struct Alarm_Provider : TAVRIN_AlarmDevice_Methods {
 struct Install_Provider : TAVRIN_HBASoftwareInstallationService_Methods {
     Invoke_Method_Status InstallFromURI(const TAVRIN_HBASoftwareInstallationService*,
                                         CIM_ConcreteJob*& Job, const Property<String>& URI,
-                                        const CIM_ManagedElement*,
-                                        const Property<Array<uint16>>&,
+                                        const CIM_ManagedElement*, const Property<Array<uint16>>&,
                                         const Property<Array<String>>&,
                                         Property<uint32>& return_value) {
         TAVRIN_ConcreteJob* job = create<TAVRIN_ConcreteJob>(true);

@@ -24,11 +24,13 @@ using namespace CPTA;
 
 namespace {
 
-bool same_word(const std::string& a, const char* b) { return strcasecmp(a.c_str(), b) == 0; }
+bool same_word(const std::string& a, const char* b) {
+    return strcasecmp(a.c_str(), b) == 0;
+}
 
 struct Feature {
     std::string name;
-    char kind;        // 'P' property, 'R' reference, 'M' method
+    char kind;  // 'P' property, 'R' reference, 'M' method
     bool key;
     std::string ref;  // referenced class of a reference ("Instance": any class)
     bool local;       // declared or redeclared by the class itself
@@ -67,7 +69,9 @@ private:
         throw std::runtime_error(path_ + ": " + what + " (token " + std::to_string(pos_) + ")");
     }
 
-    static bool name_char(char c) { return std::isalnum((unsigned char)c) || std::strchr("_.+-", c); }
+    static bool name_char(char c) {
+        return std::isalnum((unsigned char)c) || std::strchr("_.+-", c);
+    }
 
     void tokenize(const std::string& s) {
         for (size_t i = 0; i < s.size();) {
@@ -106,7 +110,9 @@ private:
             fail("unexpected end of file");
         return tokens_[pos_++];
     }
-    bool at(const char* text) const { return pos_ < tokens_.size() && same_word(tokens_[pos_], text); }
+    bool at(const char* text) const {
+        return pos_ < tokens_.size() && same_word(tokens_[pos_], text);
+    }
     // Reads `text` if it comes next.
     bool take(const char* text) { return at(text) && (next(), true); }
     void expect(const char* text) {
@@ -210,7 +216,10 @@ Class from_repository(const Meta_Class* mc) {
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
         uint32 kind = mf->flags & (FLAG_PROPERTY | FLAG_REFERENCE | FLAG_METHOD);
-        Feature f{mf->name, kind == FLAG_PROPERTY ? 'P' : kind == FLAG_METHOD ? 'M' : '?',
+        Feature f{mf->name,
+                  kind == FLAG_PROPERTY ? 'P'
+                  : kind == FLAG_METHOD ? 'M'
+                                        : '?',
                   (mf->flags & FLAG_KEY) != 0, "", mc->locals[i]};
         if (kind == FLAG_REFERENCE) {
             const Meta_Class* target = reinterpret_cast<const Meta_Reference*>(mf)->meta_class;
@@ -253,8 +262,9 @@ struct Inputs {
             for (const Feature& d : decl.features) {
                 if ((d.kind == 'M') != methods)
                     continue;
-                auto old = std::find_if(c.features.begin(), c.features.end(),
-                                        [&](const Feature& f) { return same_word(f.name, d.name.c_str()); });
+                auto old = std::find_if(
+                    c.features.begin(), c.features.end(),
+                    [&](const Feature& f) { return same_word(f.name, d.name.c_str()); });
                 if (old == c.features.end()) {
                     c.features.push_back(d);
                 } else {
@@ -272,15 +282,16 @@ std::string describe(const std::vector<Feature>& features, size_t i) {
     if (i >= features.size())
         return "nothing";
     const Feature& f = features[i];
-    return f.name + (f.kind == 'M' ? "()" : "") + (f.kind == 'R' ? " -> " + f.ref : "") + (f.key ? " key" : "") +
-           (f.local ? " (declared here)" : "");
+    return f.name + (f.kind == 'M' ? "()" : "") + (f.kind == 'R' ? " -> " + f.ref : "") +
+           (f.key ? " key" : "") + (f.local ? " (declared here)" : "");
 }
 
 }  // namespace
 
 TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
     const char* src = std::getenv("TVRN_SOURCE_DIR");
-    std::string tavrin_mof = std::string(src ? src : TVRN_PROJECT_SOURCE_DIR) + "/schema/tavrin.mof";
+    std::string tavrin_mof =
+        std::string(src ? src : TVRN_PROJECT_SOURCE_DIR) + "/schema/tavrin.mof";
     const char* cim_mof = std::getenv("TVRN_CIM_SCHEMA_MOF");
     if (!cim_mof || !*cim_mof)
         cim_mof = TVRN_CIM_SCHEMA_MOF;
@@ -299,7 +310,9 @@ TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
     // The same classes, by exact name; without the DMTF classes, the module's own.
     Inputs inputs{{}, {}, !have_cim, {}};
     std::set<std::string> declared, held;
-    auto checked = [&](const std::string& name) { return have_cim || name.compare(0, 7, "TAVRIN_") == 0; };
+    auto checked = [&](const std::string& name) {
+        return have_cim || name.compare(0, 7, "TAVRIN_") == 0;
+    };
     for (const Class& c : classes) {
         EXPECT_TRUE(inputs.decls.emplace(c.name, &c).second) << c.name << " is declared twice";
         if (checked(c.name))
@@ -327,16 +340,19 @@ TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
         for (size_t i = 0; i < std::max(expected.features.size(), actual.features.size()); i++) {
             std::string e = describe(expected.features, i), a = describe(actual.features, i);
             if (e != a)
-                diff += "  feature " + std::to_string(i) + ": expected " + e + ", found " + a + "\n";
+                diff +=
+                    "  feature " + std::to_string(i) + ": expected " + e + ", found " + a + "\n";
         }
         EXPECT_TRUE(diff.empty()) << diff;
-        EXPECT_EQ(r->second->num_keys, size_t(std::count_if(expected.features.begin(), expected.features.end(),
-                                                            [](const Feature& f) { return f.key; })));
+        EXPECT_EQ(r->second->num_keys,
+                  size_t(std::count_if(expected.features.begin(), expected.features.end(),
+                                       [](const Feature& f) { return f.key; })));
     }
 
     if (!have_cim)
-        GTEST_SKIP() << "DMTF classes not found at " << cim_mof
-                     << " (set TVRN_CIM_SCHEMA_MOF): only the TAVRIN_* classes were checked against "
-                        "tavrin.mof, with the features they inherit from CIM_* classes taken from "
-                        "the repository";
+        GTEST_SKIP()
+            << "DMTF classes not found at " << cim_mof
+            << " (set TVRN_CIM_SCHEMA_MOF): only the TAVRIN_* classes were checked against "
+               "tavrin.mof, with the features they inherit from CIM_* classes taken from "
+               "the repository";
 }

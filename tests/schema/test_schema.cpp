@@ -29,9 +29,13 @@ using namespace CPTA;
 
 namespace {
 
-const Meta_Class* meta(const char* name) { return find_meta_class(&__meta_repository, name); }
+const Meta_Class* meta(const char* name) {
+    return find_meta_class(&__meta_repository, name);
+}
 
-bool is_tavrin(const char* name) { return std::strncmp(name, "TAVRIN_", 7) == 0; }
+bool is_tavrin(const char* name) {
+    return std::strncmp(name, "TAVRIN_", 7) == 0;
+}
 
 uint32 offset_of(const Meta_Feature* f) {
     return f->flags & FLAG_REFERENCE ? reinterpret_cast<const Meta_Reference*>(f)->offset
@@ -42,8 +46,9 @@ uint32 offset_of(const Meta_Feature* f) {
 size_t slot_size(const Meta_Feature* f) {
     static const size_t sizes[] = {1, 1, 1, 2, 2, 4, 4, 8, 8, 4, 8, 2, 8, 8};
     if (f->flags & FLAG_REFERENCE)
-        return reinterpret_cast<const Meta_Reference*>(f)->subscript ? sizeof(Property<Array<Instance*>>)
-                                                                       : sizeof(Instance*);
+        return reinterpret_cast<const Meta_Reference*>(f)->subscript
+                   ? sizeof(Property<Array<Instance*>>)
+                   : sizeof(Instance*);
     auto p = reinterpret_cast<const Meta_Property*>(f);
     return (p->subscript ? sizeof(void*) : sizes[p->type]) + 1;
 }
@@ -118,7 +123,8 @@ TEST(Repository, EveryClassIsConsistentWithItsSuperclass) {
         }
         // Module classes take their superclass's flags, but not Abstract.
         if (sup && is_tavrin(mc->name)) {
-            EXPECT_EQ(mc->flags & ~FLAG_EXPERIMENTAL, sup->flags & ~(FLAG_ABSTRACT | FLAG_EXPERIMENTAL));
+            EXPECT_EQ(mc->flags & ~FLAG_EXPERIMENTAL,
+                      sup->flags & ~(FLAG_ABSTRACT | FLAG_EXPERIMENTAL));
         }
         size_t inherited = sup ? sup->num_meta_features : 0;
         ASSERT_GE(mc->num_meta_features, inherited);
@@ -147,25 +153,79 @@ TEST(Repository, EveryClassIsConsistentWithItsSuperclass) {
 }
 
 TEST(ClassSchema, FCPortHasTheFeaturesOfCimFCPortInOrder) {
-    static const char* const expected[] = {
-        "InstanceID", "Caption", "Description", "ElementName", "Generation", "InstallDate",
-        "Name", "OperationalStatus", "StatusDescriptions", "Status", "HealthState",
-        "CommunicationStatus", "DetailedStatus", "OperatingStatus", "PrimaryStatus",
-        "EnabledState", "OtherEnabledState", "RequestedState", "EnabledDefault",
-        "TimeOfLastStateChange", "AvailableRequestedStates", "TransitioningToState",
-        "RequestStateChange", "SystemCreationClassName", "SystemName", "CreationClassName",
-        "DeviceID", "PowerManagementSupported", "PowerManagementCapabilities", "Availability",
-        "StatusInfo", "LastErrorCode", "ErrorDescription", "ErrorCleared",
-        "OtherIdentifyingInfo", "PowerOnHours", "TotalPowerOnHours", "IdentifyingDescriptions",
-        "AdditionalAvailability", "MaxQuiesceTime", "LocationIndicator", "SetPowerState",
-        "Reset", "EnableDevice", "OnlineDevice", "QuiesceDevice", "SaveProperties",
-        "RestoreProperties", "Speed", "MaxSpeed", "RequestedSpeed", "UsageRestriction",
-        "PortType", "OtherPortType", "OtherNetworkPortType", "PortNumber", "LinkTechnology",
-        "OtherLinkTechnology", "PermanentAddress", "NetworkAddresses", "FullDuplex",
-        "AutoSense", "SupportedMaximumTransmissionUnit", "ActiveMaximumTransmissionUnit",
-        "SupportedCOS", "ActiveCOS", "SupportedFC4Types", "ActiveFC4Types",
-        "DetailedPortState", "DomainPortNumber", "LogicalModulePortNumber",
-        "PortAvailability", "PortDiscriminator"};
+    static const char* const expected[] = {"InstanceID",
+                                           "Caption",
+                                           "Description",
+                                           "ElementName",
+                                           "Generation",
+                                           "InstallDate",
+                                           "Name",
+                                           "OperationalStatus",
+                                           "StatusDescriptions",
+                                           "Status",
+                                           "HealthState",
+                                           "CommunicationStatus",
+                                           "DetailedStatus",
+                                           "OperatingStatus",
+                                           "PrimaryStatus",
+                                           "EnabledState",
+                                           "OtherEnabledState",
+                                           "RequestedState",
+                                           "EnabledDefault",
+                                           "TimeOfLastStateChange",
+                                           "AvailableRequestedStates",
+                                           "TransitioningToState",
+                                           "RequestStateChange",
+                                           "SystemCreationClassName",
+                                           "SystemName",
+                                           "CreationClassName",
+                                           "DeviceID",
+                                           "PowerManagementSupported",
+                                           "PowerManagementCapabilities",
+                                           "Availability",
+                                           "StatusInfo",
+                                           "LastErrorCode",
+                                           "ErrorDescription",
+                                           "ErrorCleared",
+                                           "OtherIdentifyingInfo",
+                                           "PowerOnHours",
+                                           "TotalPowerOnHours",
+                                           "IdentifyingDescriptions",
+                                           "AdditionalAvailability",
+                                           "MaxQuiesceTime",
+                                           "LocationIndicator",
+                                           "SetPowerState",
+                                           "Reset",
+                                           "EnableDevice",
+                                           "OnlineDevice",
+                                           "QuiesceDevice",
+                                           "SaveProperties",
+                                           "RestoreProperties",
+                                           "Speed",
+                                           "MaxSpeed",
+                                           "RequestedSpeed",
+                                           "UsageRestriction",
+                                           "PortType",
+                                           "OtherPortType",
+                                           "OtherNetworkPortType",
+                                           "PortNumber",
+                                           "LinkTechnology",
+                                           "OtherLinkTechnology",
+                                           "PermanentAddress",
+                                           "NetworkAddresses",
+                                           "FullDuplex",
+                                           "AutoSense",
+                                           "SupportedMaximumTransmissionUnit",
+                                           "ActiveMaximumTransmissionUnit",
+                                           "SupportedCOS",
+                                           "ActiveCOS",
+                                           "SupportedFC4Types",
+                                           "ActiveFC4Types",
+                                           "DetailedPortState",
+                                           "DomainPortNumber",
+                                           "LogicalModulePortNumber",
+                                           "PortAvailability",
+                                           "PortDiscriminator"};
     const Meta_Class* mc = &TAVRIN_FCPort::static_meta_class;
     ASSERT_EQ(mc->num_meta_features, 73u);
     std::vector<std::string> keys;
@@ -228,22 +288,30 @@ TEST(ClassSchema, AncestryAndTheRootAgentService) {
 TEST(ClassSchema, MethodRecordsFollowTheirDeclaration) {
     const char* const expected[][3] = {
         {"TAVRIN_EthLoopbackDiagnosticTest", "rundiagnostic",
-         "uint32 RunDiagnostic(in CIM_ManagedElement REF ManagedElement, in CIM_DiagnosticSetting REF DiagSetting, "
+         "uint32 RunDiagnostic(in CIM_ManagedElement REF ManagedElement, in CIM_DiagnosticSetting "
+         "REF DiagSetting, "
          "in CIM_JobSettingData REF JobSetting, out CIM_ConcreteJob REF Job)"},
         {"TAVRIN_MemoryDiagnosticTest", "RunDiagnosticService",
-         "uint32 RunDiagnosticService(in CIM_ManagedElement REF ManagedElement, in CIM_DiagnosticSettingData "
-         "embedded DiagnosticSettings, in CIM_JobSettingData embedded JobSettings, out CIM_ConcreteJob REF Job)"},
+         "uint32 RunDiagnosticService(in CIM_ManagedElement REF ManagedElement, in "
+         "CIM_DiagnosticSettingData "
+         "embedded DiagnosticSettings, in CIM_JobSettingData embedded JobSettings, out "
+         "CIM_ConcreteJob REF Job)"},
         {"TAVRIN_HBASoftwareInstallationService", "InstallFromURI",
-         "uint32 InstallFromURI(out CIM_ConcreteJob REF Job, in string URI, in CIM_ManagedElement REF Target, "
+         "uint32 InstallFromURI(out CIM_ConcreteJob REF Job, in string URI, in CIM_ManagedElement "
+         "REF Target, "
          "in uint16[] InstallOptions, in string[] InstallOptionsValues)"},
         {"TAVRIN_ConcreteJob", "RequestStateChange",
          "uint32 RequestStateChange(in uint16 RequestedState, in datetime TimeoutPeriod)"},
         {"TAVRIN_FCPort", "RequestStateChange",
-         "uint32 RequestStateChange(in uint16 RequestedState, out CIM_ConcreteJob REF Job, in datetime TimeoutPeriod)"},
-        {"TAVRIN_ComputerSystem", "SetPowerState", "uint32 SetPowerState(in uint32 PowerState, in datetime Time)"},
-        {"TAVRIN_FCPort", "SetPowerState", "uint32 SetPowerState(in uint16 PowerState, in datetime Time)"},
+         "uint32 RequestStateChange(in uint16 RequestedState, out CIM_ConcreteJob REF Job, in "
+         "datetime TimeoutPeriod)"},
+        {"TAVRIN_ComputerSystem", "SetPowerState",
+         "uint32 SetPowerState(in uint32 PowerState, in datetime Time)"},
+        {"TAVRIN_FCPort", "SetPowerState",
+         "uint32 SetPowerState(in uint16 PowerState, in datetime Time)"},
         {"TAVRIN_ConcreteJob", "GetError", "uint32 GetError(in out CIM_Error embedded Error)"},
-        {"TAVRIN_AgentService", "executeMethod", "uint32 executeMethod(out string response, in string request)"},
+        {"TAVRIN_AgentService", "executeMethod",
+         "uint32 executeMethod(out string response, in string request)"},
         {"CIM_Capabilities", "CreateGoalSettings",
          "uint16 CreateGoalSettings(in CIM_SettingData embedded[] TemplateGoalSettings, "
          "in out CIM_SettingData embedded[] SupportedGoalSettings)"},
@@ -254,11 +322,13 @@ TEST(ClassSchema, MethodRecordsFollowTheirDeclaration) {
         std::string s = std::string(type_name(m->return_type)) + " " + m->name + "(";
         for (size_t k = 0; k + 1 < m->num_meta_features; k++) {
             const Meta_Feature* f = m->meta_features[k];
-            s += std::string(k ? ", " : "") + (f->flags & FLAG_IN ? "in " : "") + (f->flags & FLAG_OUT ? "out " : "");
+            s += std::string(k ? ", " : "") + (f->flags & FLAG_IN ? "in " : "") +
+                 (f->flags & FLAG_OUT ? "out " : "");
             bool array;
             if (f->flags & FLAG_REFERENCE) {
                 auto r = reinterpret_cast<const Meta_Reference*>(f);
-                s += std::string(r->meta_class->name) + (f->flags & FLAG_EMBEDDED_INSTANCE ? " embedded" : " REF");
+                s += std::string(r->meta_class->name) +
+                     (f->flags & FLAG_EMBEDDED_INSTANCE ? " embedded" : " REF");
                 array = r->subscript != 0;
             } else {
                 auto p = reinterpret_cast<const Meta_Property*>(f);
@@ -269,12 +339,15 @@ TEST(ClassSchema, MethodRecordsFollowTheirDeclaration) {
         }
         EXPECT_EQ(s + ")", e[2]) << e[0];
     }
-    EXPECT_EQ(find_method(meta("CIM_Capabilities"), "CreateGoalSettings")->flags, FLAG_METHOD | FLAG_EXPERIMENTAL);
-    EXPECT_EQ(find_method(meta("TAVRIN_ConcreteJob"), "GetError"), &CIM_ConcreteJob_GetError_method::static_meta_class);
+    EXPECT_EQ(find_method(meta("CIM_Capabilities"), "CreateGoalSettings")->flags,
+              FLAG_METHOD | FLAG_EXPERIMENTAL);
+    EXPECT_EQ(find_method(meta("TAVRIN_ConcreteJob"), "GetError"),
+              &CIM_ConcreteJob_GetError_method::static_meta_class);
 }
 
-#define EXPECT_SLOT(obj, meta_slot, member) \
-    EXPECT_EQ(reinterpret_cast<char*>(obj) + (meta_slot)->offset, reinterpret_cast<char*>(&(obj)->member))
+#define EXPECT_SLOT(obj, meta_slot, member)                       \
+    EXPECT_EQ(reinterpret_cast<char*>(obj) + (meta_slot)->offset, \
+              reinterpret_cast<char*>(&(obj)->member))
 
 TEST(ClassSchema, OffsetsInTheMetaDataMatchTheStructures) {
     const Meta_Class* mc = &TAVRIN_FCPort::static_meta_class;

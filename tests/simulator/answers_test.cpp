@@ -17,25 +17,31 @@ TEST_F(Answers, GlobalInfoAgreesWithThePorts) {
     EXPECT_EQ(kCna, g["adapter"][2]["mac"].asString());
     for (const Json::Value& a : g["adapter"]) {
         const Json::ArrayIndex n = a["numOfPorts"].asUInt();
-        for (const char* list : {"portHasFc", "portWwn", "portHasEth", "portMac", "portHasFcoe", "fcoeMac"})
+        for (const char* list :
+             {"portHasFc", "portWwn", "portHasEth", "portMac", "portHasFcoe", "fcoeMac"})
             EXPECT_TRUE(!a.isMember(list) || a[list].size() == n) << list;
         for (Json::ArrayIndex j = 0; j < n; ++j) {
             Json::Value r(Json::objectValue);
-            if (a["portHasFc"][j].asBool()) r["wwn"] = a["portWwn"][j];
-            else r["mac"] = a["portHasEth"][j].asBool() ? a["portMac"][j] : a["fcoeMac"][j];
+            if (a["portHasFc"][j].asBool())
+                r["wwn"] = a["portWwn"][j];
+            else
+                r["mac"] = a["portHasEth"][j].asBool() ? a["portMac"][j] : a["fcoeMac"][j];
             EXPECT_FALSE(isError(getPortByWwn(r))) << r;
         }
     }
     EXPECT_EQ(3, getAdapterIdByPort(K("indexStr", kEth1))["adapterId"].asInt());
     EXPECT_EQ(0, getAdapterIdByPort(K("indexStr", "00:00:00:00:00:01"))["adapterId"].asInt());
     // The simulator's bookkeeping stays inside.
-    const std::string pl = std::string("{\"pPortWwn\": \"") + kFcPort0 + "\", \"lPortWwn\": \"" + kFcPort0 + "\"";
-    EXPECT_FALSE(getCompleteRemotePort(J(pl + ", \"rPortWwn\": \"" + kDisk + "\"}")).isMember("statistics"));
+    const std::string pl =
+        std::string("{\"pPortWwn\": \"") + kFcPort0 + "\", \"lPortWwn\": \"" + kFcPort0 + "\"";
+    EXPECT_FALSE(
+        getCompleteRemotePort(J(pl + ", \"rPortWwn\": \"" + kDisk + "\"}")).isMember("statistics"));
 }
 
 // Outcomes are passes unless the fixture says otherwise for that adapter or port.
 TEST_F(Answers, DiagnosticOutcomes) {
-    const std::string lb = R"(", "mode": 1, "speed": 4, "dataPattern": 3048584629, "frameCount": 131072})";
+    const std::string lb =
+        R"(", "mode": 1, "speed": 4, "dataPattern": 3048584629, "frameCount": 131072})";
     Json::Value ok = diagLoopbackTest(J(std::string("{\"portWwn\": \"") + kFcPort0 + lb));
     EXPECT_FALSE(ok["failed"].asBool());
     EXPECT_EQ(131072u, ok["transmitFrames"].asUInt());
@@ -53,13 +59,18 @@ TEST_F(Answers, DiagnosticOutcomes) {
 TEST_F(Answers, BadKeysAndShapesAnswerErrors) {
     EXPECT_TRUE(isError(getHbaByWwn(K("wwn", "2000000051e0a0b0c"))));         // raw form
     EXPECT_TRUE(isError(getHbaByWwn(K("wwn", "20:00:00:05:1e:ff:ff:ff"))));   // unknown
-    EXPECT_TRUE(isError(getPortByWwn(J(R"({"wwn": 1000})"))));               // wrong type
-    EXPECT_TRUE(isError(getPortByWwn(K("mac", kFcPort0))));                  // WWN as MAC
-    EXPECT_TRUE(isError(getAllRemotePorts(K("pPortWwn", kFcPort0))));        // missing member
+    EXPECT_TRUE(isError(getPortByWwn(J(R"({"wwn": 1000})"))));                // wrong type
+    EXPECT_TRUE(isError(getPortByWwn(K("mac", kFcPort0))));                   // WWN as MAC
+    EXPECT_TRUE(isError(getAllRemotePorts(K("pPortWwn", kFcPort0))));         // missing member
     EXPECT_TRUE(isError(getDynamicFcoeStatistics(K("indexStr", kFcPort0))));  // not FCoE
 
-    const Json::Value bad[] = {Json::Value(), Json::Value(7), Json::Value("text"), J("[1, 2]"), J("{}"),
-                               J(R"({"indexStr": 5, "wwn": [], "mac": {}, "pPortWwn": true, "portWwn": null})")};
+    const Json::Value bad[] = {
+        Json::Value(),
+        Json::Value(7),
+        Json::Value("text"),
+        J("[1, 2]"),
+        J("{}"),
+        J(R"({"indexStr": 5, "wwn": [], "mac": {}, "pPortWwn": true, "portWwn": null})")};
     int answered = 0;
 #define ENTRY_POINT(kind, symbol, pointer) ENTRY_POINT_##kind(symbol)
 #define ENTRY_POINT_JSON(symbol)                                                  \

@@ -45,13 +45,15 @@ protected:
 };
 
 TEST_F(Events, DeliveredOnTheLibrarysThreadWhileRegistered) {
-    EXPECT_EQ(0, tvrn_sim_emit_event(R"({"eventCategory": 2, "eventId": 1})"));  // nobody registered
+    EXPECT_EQ(0,
+              tvrn_sim_emit_event(R"({"eventCategory": 2, "eventId": 1})"));  // nobody registered
     subscribe();
     EXPECT_EQ(1, tvrn_sim_emit_event(R"({"eventId": 1, "portIndexString": "100000051e0a0b0c"})"));
     EXPECT_EQ(1, tvrn_sim_emit_event("not json at all"));
     EXPECT_EQ(-1, tvrn_sim_emit_event(nullptr));
     ASSERT_EQ(0, tvrn_sim_wait_events(5000));
-    EXPECT_EQ((std::vector<std::string>{R"({"eventId": 1, "portIndexString": "100000051e0a0b0c"})", "not json at all"}),
+    EXPECT_EQ((std::vector<std::string>{R"({"eventId": 1, "portIndexString": "100000051e0a0b0c"})",
+                                        "not json at all"}),
               texts());
     {
         std::lock_guard<std::mutex> lock(gMu);
@@ -83,12 +85,16 @@ TEST_F(Events, QueuedUntilACallbackIsSetAndDroppedOnRequest) {
 }
 
 TEST_F(Events, FixtureEventsFollowRegistration) {
-    ASSERT_EQ(0, tvrn_sim_load_fixture_text(R"({"events": [{"eventId": 3, "portIndexString": "00051e8a4b01"}, "raw text"]})"));
+    ASSERT_EQ(
+        0, tvrn_sim_load_fixture_text(
+               R"({"events": [{"eventId": 3, "portIndexString": "00051e8a4b01"}, "raw text"]})"));
     registerEventProcessingCb(collect);
     const unsigned long long before = tvrn_sim_events_delivered();
     subscribe();
     ASSERT_EQ(0, tvrn_sim_wait_events(5000));
-    EXPECT_EQ((std::vector<std::string>{R"({"eventId":3,"portIndexString":"00051e8a4b01"})", "raw text"}), texts());
+    EXPECT_EQ(
+        (std::vector<std::string>{R"({"eventId":3,"portIndexString":"00051e8a4b01"})", "raw text"}),
+        texts());
     EXPECT_EQ(before + 2, tvrn_sim_events_delivered());
 }
 
@@ -101,7 +107,8 @@ std::atomic<int> gLate{0};
 void slowCallback(const char*) {
     gInCallback = true;
     std::this_thread::sleep_for(std::chrono::milliseconds(50));
-    if (gTornDown) ++gLate;
+    if (gTornDown)
+        ++gLate;
     gInCallback = false;
 }
 
@@ -111,7 +118,8 @@ TEST_F(Events, ClearingTheCallbackWaitsForADeliveryInProgress) {
     register_for_events(J("{}"));
     registerEventProcessingCb(slowCallback);
     tvrn_sim_emit_event("one");
-    while (!gInCallback) std::this_thread::yield();
+    while (!gInCallback)
+        std::this_thread::yield();
     registerEventProcessingCb(nullptr);
     gTornDown = true;
     EXPECT_FALSE(gInCallback);
@@ -123,7 +131,8 @@ TEST_F(Events, ClearingTheCallbackWaitsForADeliveryInProgress) {
 void reentrantCallback(const char* text) {
     collect(text);
     getNumberOfAdapters();
-    if (std::string(text) == "stop") unregister_for_events(J("{}"));
+    if (std::string(text) == "stop")
+        unregister_for_events(J("{}"));
 }
 
 TEST_F(Events, CallbackMayCallTheLibrary) {
@@ -146,8 +155,9 @@ TEST_F(Events, ConcurrentUse) {
     std::vector<std::thread> workers;
     for (int t = 0; t < 4; ++t)
         workers.emplace_back([t, &stop] {
-            const Json::Value port = J(std::string("{\"indexStr\": \"") + kFcPort0 + "\", \"port\": {\"beaconState\": " +
-                                       (t % 2 ? "true" : "false") + "}, \"propArray\": [\"beaconState\"]}");
+            const Json::Value port =
+                J(std::string("{\"indexStr\": \"") + kFcPort0 + "\", \"port\": {\"beaconState\": " +
+                  (t % 2 ? "true" : "false") + "}, \"propArray\": [\"beaconState\"]}");
             while (!stop) {
                 getAllAdaptersIndexString(Json::Value());
                 setPortByWwn(port);
@@ -162,7 +172,8 @@ TEST_F(Events, ConcurrentUse) {
         unregister_for_events(J("{}"));
     }
     stop = true;
-    for (auto& w : workers) w.join();
+    for (auto& w : workers)
+        w.join();
     subscribe();
     tvrn_sim_emit_event("final");
     ASSERT_EQ(0, tvrn_sim_wait_events(5000));

@@ -33,7 +33,8 @@ TEST(LoadByName, ExportsNothingOfTheImplementation) {
 TEST(LoadByName, UnusableFixtureFromTheEnvironment) {
     ASSERT_NE(nullptr, library()) << dlerror();
     testing::internal::CaptureStderr();
-    const unsigned count = sym<UIntFn>("getNumberOfAdapters")();  // the first call loads the fixture
+    const unsigned count =
+        sym<UIntFn>("getNumberOfAdapters")();  // the first call loads the fixture
     const std::string err = testing::internal::GetCapturedStderr();
     EXPECT_EQ(0u, count);
     EXPECT_NE(std::string::npos, err.find("broken.json")) << err;
@@ -43,7 +44,8 @@ TEST(LoadByName, UnusableFixtureFromTheEnvironment) {
     // the log callback once one is registered.
     static std::string logged;
     sym<void (*)(LogCb)>("registerLogMsgCb")([](int level, const char*, int, const char* text) {
-        if (level == 4) logged += text;
+        if (level == 4)
+            logged += text;
     });
     EXPECT_NE(std::string::npos, logged.find("broken.json"));
     Json::Value req(Json::objectValue);

@@ -11,7 +11,9 @@ namespace {
 
 class State : public SimTest {};
 
-Json::Value portOf(const char* wwn) { return getPortByWwn(K("wwn", wwn)); }
+Json::Value portOf(const char* wwn) {
+    return getPortByWwn(K("wwn", wwn));
+}
 
 Json::Value setPort(const std::string& key, const std::string& member, const Json::Value& value) {
     Json::Value req(Json::objectValue);
@@ -57,26 +59,32 @@ TEST_F(State, SettersCheckTypesAndCopyOnlyListedMembers) {
     EXPECT_TRUE(isError(setAdapterState(J(fc + ", \"enableState\": \"no\"}"))));
     ASSERT_FALSE(isError(setFcTrunkingState(J(fc + ", \"enableState\": true}"))));
     EXPECT_TRUE(getAdvAdapterData(J(fc + "}"))["trunkingEnabled"].asBool());
-    EXPECT_TRUE(isError(setFcTrunkingState(J(std::string("{\"indexStr\": \"") + kCna + "\", \"enableState\": true}"))));
-    setPortAlias(J(std::string(R"({"type": "CNA", "mac": ")") + kEth1 + R"(", "alias": "uplink"})"));
+    EXPECT_TRUE(isError(setFcTrunkingState(
+        J(std::string("{\"indexStr\": \"") + kCna + "\", \"enableState\": true}"))));
+    setPortAlias(
+        J(std::string(R"({"type": "CNA", "mac": ")") + kEth1 + R"(", "alias": "uplink"})"));
     EXPECT_EQ("uplink", getEthPortByEthMac(K("mac", kEth1))["ethData"]["alias"].asString());
 
     const std::string p = kFcPort0;
-    setFcByFcWwn(J("{\"portWwn\": \"" + p + R"(", "fcPortData": {"topology": "p2p", "extra": 1}, "paramsConfigured": ["topology"]})"));
+    setFcByFcWwn(J(
+        "{\"portWwn\": \"" + p +
+        R"(", "fcPortData": {"topology": "p2p", "extra": 1}, "paramsConfigured": ["topology"]})"));
     Json::Value fc0 = getFcByFcWwn(K("wwn", p));
     EXPECT_EQ("p2p", fc0["topology"].asString());
     EXPECT_FALSE(fc0.isMember("extra"));
     setPortAuthentication(J("{\"pPortWwn\": \"" + p + R"(", "portAuth": {"authEnabled": true}})"));
     resetPortAuthentication(K("pPortWwn", p));
     EXPECT_FALSE(getPortAuthentication(K("wwn", p))["authEnabled"].asBool());
-    setEthPort(J(std::string("{\"mac\": \"") + kEth0 + R"(", "ethPort": {"mtu": 9000}, "propArray": ["mtu"]})"));
+    setEthPort(J(std::string("{\"mac\": \"") + kEth0 +
+                 R"(", "ethPort": {"mtu": 9000}, "propArray": ["mtu"]})"));
     EXPECT_EQ(9000, getEthPortByEthMac(K("mac", kEth0))["ethData"]["mtu"].asInt());
 }
 
 TEST_F(State, VirtualPorts) {
     const std::string p = kFcPort0, v2 = "24:00:00:05:1e:0a:0b:99";
     auto count = [&] { return getAllVPorts(K("wwn", p))["vports"].size(); };
-    const std::string create = "{\"pwwn\": \"" + p + R"(", "nwwn": "25:00:00:05:1e:0a:0b:99", "vwwn": ")" + v2 +
+    const std::string create = "{\"pwwn\": \"" + p +
+                               R"(", "nwwn": "25:00:00:05:1e:0a:0b:99", "vwwn": ")" + v2 +
                                R"(", "symbolicName": "vp2", "vfId": 0})";
     ASSERT_FALSE(isError(createVport(J(create))));
     EXPECT_TRUE(isError(createVport(J(create))));  // WWN now in use
@@ -85,7 +93,8 @@ TEST_F(State, VirtualPorts) {
     EXPECT_EQ("vp2", getVPort(J(pl + "}"))["symbolicName"].asString());
     EXPECT_TRUE(getDynamicVPortStatistics(J(pl + ", \"vfId\": 0}")).isArray());
 
-    const std::string del = "{\"pwwn\": \"" + p + R"(", "vfId": 0, "vportArray": [")" + kVport + "\", \"";
+    const std::string del =
+        "{\"pwwn\": \"" + p + R"(", "vfId": 0, "vportArray": [")" + kVport + "\", \"";
     EXPECT_TRUE(isError(deleteVport(J(del + "24:00:00:05:1e:0a:0b:77\"]}"))));  // all or nothing
     EXPECT_EQ(2u, count());
     ASSERT_FALSE(isError(deleteVport(J(del + v2 + "\"]}"))));
@@ -100,7 +109,8 @@ TEST_F(State, VnicsShowAsPciFunctions) {
     EXPECT_TRUE(isError(createvNIC(J(mac + ", \"minBandwidth\": 60, \"maxBandwidth\": 50}"))));
     auto functions = [] { return getAdapterPciFnData(K("indexStr", kCna))["pciFunctions"]; };
     const Json::ArrayIndex before = functions().size();
-    modifyvNIC(J(mac + ", \"vNICs\": [{\"pciFunctionIndex\": " + index + ", \"maxBandwidth\": 80}]}"));
+    modifyvNIC(
+        J(mac + ", \"vNICs\": [{\"pciFunctionIndex\": " + index + ", \"maxBandwidth\": 80}]}"));
     EXPECT_EQ(80, functions()[before - 1]["maxBandwidth"].asInt());
     EXPECT_TRUE(isError(deletevNICs(J(mac + ", \"pciFunctionIndices\": [99]}"))));
     ASSERT_FALSE(isError(deletevNICs(J(mac + ", \"pciFunctionIndices\": [" + index + "]}"))));
@@ -112,10 +122,12 @@ TEST_F(State, LunMaskingAndAdvancedIoProfiles) {
     const std::string scope = std::string(R"("lPortWwn": ")") + kFcPort0 + "\", \"rPortWwn\": \"";
     const std::string entry = "{" + scope + kDisk + R"(", "lunId": "3"})";
     auto mask = [&] { return getLunMaskData(J(port + "}")); };
-    setLunMaskData(J(port + ", \"removedLunMaskData\": [], \"addedLunMaskData\": [" + entry + "], \"clearLunMaskData\": false}"));
+    setLunMaskData(J(port + ", \"removedLunMaskData\": [], \"addedLunMaskData\": [" + entry +
+                     "], \"clearLunMaskData\": false}"));
     EXPECT_TRUE(mask()["lunMaskEnabled"].asBool());
     ASSERT_EQ(1u, mask()["lunMaskData"].size());
-    setLunMaskData(J(port + ", \"removedLunMaskData\": [" + entry + "], \"addedLunMaskData\": [], \"clearLunMaskData\": false}"));
+    setLunMaskData(J(port + ", \"removedLunMaskData\": [" + entry +
+                     "], \"addedLunMaskData\": [], \"clearLunMaskData\": false}"));
     EXPECT_EQ(0u, mask()["lunMaskData"].size());
     EXPECT_TRUE(isError(setLunMaskData(J(port + ", \"addedLunMaskData\": {}}"))));
 
@@ -129,9 +141,11 @@ TEST_F(State, LunMaskingAndAdvancedIoProfiles) {
 }
 
 bool allZero(const Json::Value& stats) {
-    if (!stats.isArray() || stats.size() == 0) return false;
+    if (!stats.isArray() || stats.size() == 0)
+        return false;
     for (const Json::Value& e : stats)
-        if (e["value"].asString() != "0") return false;
+        if (e["value"].asString() != "0")
+            return false;
     return true;
 }
 
@@ -147,15 +161,27 @@ TEST_F(State, StatisticsResets) {
         std::string resetReq;
     };
     const Case cases[] = {
-        {getDynamicPortStatistics, "{\"indexStr\": \"" + p + "\"}", resetStatisticsForPort, "{\"indexStr\": \"" + p + "\"}"},
-        {getDynamicFcpimStatistics, "{" + pl + ", \"rPortWwn\": \"" + r + "\"}", resetStatisticsForFcpim, "{" + pl + ", \"rPortWwn\": \"" + r + "\", \"vfId\": 0}"},
-        {getDynamicLogicalPortStatistics, "{" + pl + ", \"vfId\": 0}", resetStatisticsForLPort, "{\"pwwn\": \"" + p + "\", \"lwwn\": \"" + p + "\", \"vfId\": 0}"},
-        {getDynamicVPortStatistics, "{\"pPortWwn\": \"" + p + "\", \"lPortWwn\": \"" + kVport + "\", \"vfId\": 0}", resetStatisticsForVPort, "{\"pwwn\": \"" + p + "\", \"vwwn\": \"" + kVport + "\", \"vfId\": 0}"},
-        {getDynamicFirmwareStatistics, "{\"indexStr\": \"" + p + "\"}", resetFirmwareStatistics, "{\"indexStr\": \"" + std::string(kFcHba) + "\"}"},
-        {getDynamicvHBAStatistics, "{\"wwn\": \"" + p + "\"}", resetvHBAStatistics, "{\"wwn\": \"" + p + "\"}"},
-        {getDynamicLldpStatistics, "{\"mac\": \"" + mac + "\"}", resetLldpStatistics, "{\"mac\": \"" + mac + "\"}"},
-        {getDynamicAdvancedIoDataAtLun, "{" + pl + ", \"rPortWwn\": \"" + r + "\", \"lunId\": \"2\", \"vfId\": 0}", resetDataForAdvIoProf,
-         "{\"indexStr\": \"" + p + "\", \"lPortWwn\": \"" + p + "\", \"rPortWwn\": \"" + r + "\", \"lunId\": \"1\", \"endLunRange\": \"3\"}"},
+        {getDynamicPortStatistics, "{\"indexStr\": \"" + p + "\"}", resetStatisticsForPort,
+         "{\"indexStr\": \"" + p + "\"}"},
+        {getDynamicFcpimStatistics, "{" + pl + ", \"rPortWwn\": \"" + r + "\"}",
+         resetStatisticsForFcpim, "{" + pl + ", \"rPortWwn\": \"" + r + "\", \"vfId\": 0}"},
+        {getDynamicLogicalPortStatistics, "{" + pl + ", \"vfId\": 0}", resetStatisticsForLPort,
+         "{\"pwwn\": \"" + p + "\", \"lwwn\": \"" + p + "\", \"vfId\": 0}"},
+        {getDynamicVPortStatistics,
+         "{\"pPortWwn\": \"" + p + "\", \"lPortWwn\": \"" + kVport + "\", \"vfId\": 0}",
+         resetStatisticsForVPort,
+         "{\"pwwn\": \"" + p + "\", \"vwwn\": \"" + kVport + "\", \"vfId\": 0}"},
+        {getDynamicFirmwareStatistics, "{\"indexStr\": \"" + p + "\"}", resetFirmwareStatistics,
+         "{\"indexStr\": \"" + std::string(kFcHba) + "\"}"},
+        {getDynamicvHBAStatistics, "{\"wwn\": \"" + p + "\"}", resetvHBAStatistics,
+         "{\"wwn\": \"" + p + "\"}"},
+        {getDynamicLldpStatistics, "{\"mac\": \"" + mac + "\"}", resetLldpStatistics,
+         "{\"mac\": \"" + mac + "\"}"},
+        {getDynamicAdvancedIoDataAtLun,
+         "{" + pl + ", \"rPortWwn\": \"" + r + "\", \"lunId\": \"2\", \"vfId\": 0}",
+         resetDataForAdvIoProf,
+         "{\"indexStr\": \"" + p + "\", \"lPortWwn\": \"" + p + "\", \"rPortWwn\": \"" + r +
+             "\", \"lunId\": \"1\", \"endLunRange\": \"3\"}"},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.getReq);
@@ -167,9 +193,11 @@ TEST_F(State, StatisticsResets) {
         EXPECT_TRUE(allZero(c.get(J(c.getReq))));
     }
     // The FC-IM reset covers the I/O profile counters as well.
-    EXPECT_TRUE(allZero(getDynamicFcpimIopStatistics(J("{" + pl + ", \"rPortWwn\": \"" + r + "\", \"vfId\": 0}"))));
+    EXPECT_TRUE(allZero(
+        getDynamicFcpimIopStatistics(J("{" + pl + ", \"rPortWwn\": \"" + r + "\", \"vfId\": 0}"))));
     // A reset of one port leaves the other ports' counters alone.
-    EXPECT_FALSE(allZero(getDynamicPortStatistics(J(std::string("{\"indexStr\": \"") + kFcPort1 + "\"}"))));
+    EXPECT_FALSE(
+        allZero(getDynamicPortStatistics(J(std::string("{\"indexStr\": \"") + kFcPort1 + "\"}"))));
     // Loading the fixture again brings the counters back.
     tvrn_sim_load_fixture("default");
     EXPECT_FALSE(allZero(getDynamicPortStatistics(J("{\"indexStr\": \"" + p + "\"}"))));
@@ -198,8 +226,10 @@ TEST_F(State, DiagnosticRequests) {
     EXPECT_EQ(std::stoi(id) + 1, getRequestID());
     const Json::Value byId = K("requestID", id);
     const std::string post = "{\"requestID\": \"" + id + "\", \"function\": ";
-    ASSERT_FALSE(isError(postDiagnostics(J(post + "\"MemoryTest\", \"hbaWwn\": \"" + kDellHba + "\"}"))));
-    ASSERT_FALSE(isError(postDiagnostics(J(post + "\"QueueTest\", \"hbaWwn\": \"" + kFcHba + "\", \"portWwn\": \"" + kFcPort0 + "\"}"))));
+    ASSERT_FALSE(
+        isError(postDiagnostics(J(post + "\"MemoryTest\", \"hbaWwn\": \"" + kDellHba + "\"}"))));
+    ASSERT_FALSE(isError(postDiagnostics(J(post + "\"QueueTest\", \"hbaWwn\": \"" + kFcHba +
+                                           "\", \"portWwn\": \"" + kFcPort0 + "\"}"))));
     EXPECT_TRUE(isError(postDiagnostics(J(post + "\"NoSuchTest\"}"))));
     EXPECT_EQ("posted", getDiagnosticsResults(byId)["state"].asString());
     ASSERT_FALSE(isError(startTests(J("{\"requestID\": \"" + id + "\", \"stopOnError\": true}"))));
@@ -212,11 +242,13 @@ TEST_F(State, DiagnosticRequests) {
 
     // A request still posted (or running) can be cancelled.
     const std::string id2 = std::to_string(getRequestID());
-    postDiagnostics(J("{\"requestID\": " + id2 + ", \"function\": \"LEDTest\", \"portWwn\": \"" + kFcPort0 + "\"}"));
+    postDiagnostics(J("{\"requestID\": " + id2 + ", \"function\": \"LEDTest\", \"portWwn\": \"" +
+                      kFcPort0 + "\"}"));
     EXPECT_EQ("cancelled", cancelTests(K("requestID", id2))["state"].asString());
     EXPECT_TRUE(isError(startTests(J("{\"requestID\": \"" + id2 + "\", \"stopOnError\": false}"))));
 
-    setDport(J(std::string(R"({"requestID": "1", "portWwn": ")") + kFcPort0 + R"(", "state": true})"));
+    setDport(
+        J(std::string(R"({"requestID": "1", "portWwn": ")") + kFcPort0 + R"(", "state": true})"));
     EXPECT_TRUE(getDPortTestResult(K("portWwn", kFcPort0))["dportEnabled"].asBool());
 }
 
