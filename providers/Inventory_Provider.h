@@ -20,7 +20,7 @@
 #include "framework/Instance.h"
 #include "framework/Log.h"
 #include "framework/Meta_Lookup.h"
-#include "gateway/ProviderUtil.h"
+#include "gateway/ClassId.h"
 #include "inventory/FCHBAManager.h"
 #include "inventory/HostIdentityScope.h"
 #include "inventory/InventoryCommon.h"
