@@ -20,22 +20,22 @@ namespace detail {
 
 namespace {
 
-using B = const CMPIBroker *;
-using C = const CMPIContext *;
-using OP = const CMPIObjectPath *;
+using B = const CMPIBroker*;
+using C = const CMPIContext*;
+using OP = const CMPIObjectPath*;
 
-CMPIString *newString(HostImpl &h, std::string s) {
+CMPIString* newString(HostImpl& h, std::string s) {
     return &make<StringObj>(h.currentArena(), std::move(s))->c;
 }
 
-void setStatus(HostImpl &h, CMPIStatus *rc, const Status &s) {
+void setStatus(HostImpl& h, CMPIStatus* rc, const Status& s) {
     if (!rc)
         return;
     rc->rc = static_cast<CMPIrc>(s.rc);
     rc->msg = s.msg.empty() ? nullptr : newString(h, s.msg);
 }
 
-CMPIStatus toStatus(HostImpl &h, const Status &s) {
+CMPIStatus toStatus(HostImpl& h, const Status& s) {
     CMPIStatus st;
     setStatus(h, &st, s);
     return st;
@@ -43,16 +43,16 @@ CMPIStatus toStatus(HostImpl &h, const Status &s) {
 
 // Runs an up-call body with the host of `b`; no exception leaves it.
 template <class R, class F>
-R upcall(B b, CMPIStatus *rc, R fail, F &&f) noexcept {
+R upcall(B b, CMPIStatus* rc, R fail, F&& f) noexcept {
     try {
-        HostImpl *h = HostImpl::of(b);
+        HostImpl* h = HostImpl::of(b);
         if (!h) {
             setRc(rc, CMPI_RC_ERR_INVALID_HANDLE);
             return fail;
         }
         setRc(rc, CMPI_RC_OK);
         return f(*h);
-    } catch (const std::bad_alloc &) {
+    } catch (const std::bad_alloc&) {
         setRc(rc, CMPI_RC_ERROR_SYSTEM);
     } catch (...) {
         setRc(rc, CMPI_RC_ERR_FAILED);
@@ -61,20 +61,20 @@ R upcall(B b, CMPIStatus *rc, R fail, F &&f) noexcept {
 }
 
 template <class F>
-CMPIStatus upcallStatus(B b, F &&f) noexcept {
+CMPIStatus upcallStatus(B b, F&& f) noexcept {
     CMPIStatus st = status(CMPI_RC_OK);
     CMPIStatus r = upcall(b, &st, status(CMPI_RC_ERR_FAILED), std::forward<F>(f));
     return st.rc != CMPI_RC_OK ? st : r;
 }
 
-const ObjectPath *pathArg(OP op) {
-    auto *p = objectOf<PathObj>(op);
+const ObjectPath* pathArg(OP op) {
+    auto* p = objectOf<PathObj>(op);
     return p ? &p->path : nullptr;
 }
 
 // The path an up-call names, with its namespace filled in from the context.
-bool requestPath(HostImpl &h, OP op, C ctx, CMPIStatus *rc, ObjectPath &out) {
-    auto *p = objectOf<PathObj>(op);
+bool requestPath(HostImpl& h, OP op, C ctx, CMPIStatus* rc, ObjectPath& out) {
+    auto* p = objectOf<PathObj>(op);
     if (!p) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
         return false;
@@ -85,10 +85,10 @@ bool requestPath(HostImpl &h, OP op, C ctx, CMPIStatus *rc, ObjectPath &out) {
 }
 
 template <class T>
-CMPIEnumeration *enumeration(HostImpl &h, const std::vector<T> &items) {
+CMPIEnumeration* enumeration(HostImpl& h, const std::vector<T>& items) {
     std::vector<Value> vals;
     vals.reserve(items.size());
-    for (const auto &i : items) {
+    for (const auto& i : items) {
         if constexpr (std::is_same<T, Instance>::value)
             vals.push_back(Value::instance(i));
         else if constexpr (std::is_same<T, ObjectPath>::value)
@@ -102,20 +102,20 @@ CMPIEnumeration *enumeration(HostImpl &h, const std::vector<T> &items) {
 // ---------------------------------------------------------------------------
 // CMPIBrokerFT
 // ---------------------------------------------------------------------------
-CMPIContext *bPrepareAttachThread(B b, C ctx) {
-    return upcall(b, nullptr, static_cast<CMPIContext *>(nullptr), [&](HostImpl &h) {
-        auto *src = objectOf<ContextObj>(ctx);
+CMPIContext* bPrepareAttachThread(B b, C ctx) {
+    return upcall(b, nullptr, static_cast<CMPIContext*>(nullptr), [&](HostImpl& h) {
+        auto* src = objectOf<ContextObj>(ctx);
         PropertyVector entries = src ? src->entries : PropertyVector{};
         return &make<ContextObj>(h.prepared, std::move(entries))->c;
     });
 }
 
 CMPIStatus bAttachThread(B b, C ctx) {
-    return upcallStatus(b, [&](HostImpl &) {
+    return upcallStatus(b, [&](HostImpl&) {
         if (!objectOf<ContextObj>(ctx))
             return status(CMPI_RC_ERR_INVALID_HANDLE);
-        ThreadState &ts = threadState();
-        auto *a = new Arena;
+        ThreadState& ts = threadState();
+        auto* a = new Arena;
         ts.arenas.push_back(a);
         ts.attached.emplace_back(ctx, a);
         return status(CMPI_RC_OK);
@@ -123,12 +123,12 @@ CMPIStatus bAttachThread(B b, C ctx) {
 }
 
 CMPIStatus bDetachThread(B b, C ctx) {
-    return upcallStatus(b, [&](HostImpl &h) {
-        ThreadState &ts = threadState();
+    return upcallStatus(b, [&](HostImpl& h) {
+        ThreadState& ts = threadState();
         for (auto it = ts.attached.rbegin(); it != ts.attached.rend(); ++it) {
             if (it->first != ctx)
                 continue;
-            Arena *a = it->second;
+            Arena* a = it->second;
             ts.attached.erase(std::next(it).base());
             for (auto ai = ts.arenas.rbegin(); ai != ts.arenas.rend(); ++ai)
                 if (*ai == a) {
@@ -137,7 +137,7 @@ CMPIStatus bDetachThread(B b, C ctx) {
                 }
             delete a;
             // A context prepared for this thread ends with it.
-            auto *c = objectOf<ContextObj>(ctx);
+            auto* c = objectOf<ContextObj>(ctx);
             if (c && c->owner == &h.prepared)
                 destroy(c);
             return status(CMPI_RC_OK);
@@ -146,9 +146,9 @@ CMPIStatus bDetachThread(B b, C ctx) {
     });
 }
 
-CMPIStatus bDeliverIndication(B b, C, const char *ns, const CMPIInstance *ind) {
-    return upcallStatus(b, [&](HostImpl &h) {
-        auto *i = objectOf<InstanceObj>(ind);
+CMPIStatus bDeliverIndication(B b, C, const char* ns, const CMPIInstance* ind) {
+    return upcallStatus(b, [&](HostImpl& h) {
+        auto* i = objectOf<InstanceObj>(ind);
         if (!i)
             return status(CMPI_RC_ERR_INVALID_PARAMETER);
         h.deliver(ns ? ns : "", i->inst);
@@ -156,9 +156,9 @@ CMPIStatus bDeliverIndication(B b, C, const char *ns, const CMPIInstance *ind) {
     });
 }
 
-CMPIEnumeration *bEnumInstanceNames(B b, C ctx, OP op, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIEnumeration *>(nullptr),
-                  [&](HostImpl &h) -> CMPIEnumeration * {
+CMPIEnumeration* bEnumInstanceNames(B b, C ctx, OP op, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIEnumeration*>(nullptr),
+                  [&](HostImpl& h) -> CMPIEnumeration* {
                       ObjectPath p;
                       if (!requestPath(h, op, ctx, rc, p))
                           return nullptr;
@@ -169,9 +169,9 @@ CMPIEnumeration *bEnumInstanceNames(B b, C ctx, OP op, CMPIStatus *rc) {
                   });
 }
 
-CMPIEnumeration *bEnumInstances(B b, C ctx, OP op, const char **props, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIEnumeration *>(nullptr),
-                  [&](HostImpl &h) -> CMPIEnumeration * {
+CMPIEnumeration* bEnumInstances(B b, C ctx, OP op, const char** props, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIEnumeration*>(nullptr),
+                  [&](HostImpl& h) -> CMPIEnumeration* {
                       ObjectPath p;
                       if (!requestPath(h, op, ctx, rc, p))
                           return nullptr;
@@ -183,8 +183,8 @@ CMPIEnumeration *bEnumInstances(B b, C ctx, OP op, const char **props, CMPIStatu
                   });
 }
 
-CMPIInstance *bGetInstance(B b, C ctx, OP op, const char **props, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIInstance *>(nullptr), [&](HostImpl &h) -> CMPIInstance * {
+CMPIInstance* bGetInstance(B b, C ctx, OP op, const char** props, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIInstance*>(nullptr), [&](HostImpl& h) -> CMPIInstance* {
         ObjectPath p;
         if (!requestPath(h, op, ctx, rc, p))
             return nullptr;
@@ -195,11 +195,11 @@ CMPIInstance *bGetInstance(B b, C ctx, OP op, const char **props, CMPIStatus *rc
     });
 }
 
-CMPIObjectPath *bCreateInstance(B b, C ctx, OP op, const CMPIInstance *inst, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIObjectPath *>(nullptr),
-                  [&](HostImpl &h) -> CMPIObjectPath * {
+CMPIObjectPath* bCreateInstance(B b, C ctx, OP op, const CMPIInstance* inst, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIObjectPath*>(nullptr),
+                  [&](HostImpl& h) -> CMPIObjectPath* {
                       ObjectPath p;
-                      auto *i = objectOf<InstanceObj>(inst);
+                      auto* i = objectOf<InstanceObj>(inst);
                       if (!i) {
                           setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
                           return nullptr;
@@ -213,11 +213,11 @@ CMPIObjectPath *bCreateInstance(B b, C ctx, OP op, const CMPIInstance *inst, CMP
                   });
 }
 
-CMPIStatus bModifyInstance(B b, C ctx, OP op, const CMPIInstance *inst, const char **props) {
-    return upcallStatus(b, [&](HostImpl &h) {
+CMPIStatus bModifyInstance(B b, C ctx, OP op, const CMPIInstance* inst, const char** props) {
+    return upcallStatus(b, [&](HostImpl& h) {
         CMPIStatus st = status(CMPI_RC_OK);
         ObjectPath p;
-        auto *i = objectOf<InstanceObj>(inst);
+        auto* i = objectOf<InstanceObj>(inst);
         if (!i || !requestPath(h, op, ctx, &st, p))
             return status(CMPI_RC_ERR_INVALID_PARAMETER);
         return toStatus(h, h.modifyInstance(h.requestFrom(ctx), p, i->inst, propertyList(props)));
@@ -225,7 +225,7 @@ CMPIStatus bModifyInstance(B b, C ctx, OP op, const CMPIInstance *inst, const ch
 }
 
 CMPIStatus bDeleteInstance(B b, C ctx, OP op) {
-    return upcallStatus(b, [&](HostImpl &h) {
+    return upcallStatus(b, [&](HostImpl& h) {
         CMPIStatus st = status(CMPI_RC_OK);
         ObjectPath p;
         if (!requestPath(h, op, ctx, &st, p))
@@ -234,14 +234,14 @@ CMPIStatus bDeleteInstance(B b, C ctx, OP op) {
     });
 }
 
-CMPIEnumeration *bExecQuery(B, C, OP, const char *, const char *, CMPIStatus *rc) {
+CMPIEnumeration* bExecQuery(B, C, OP, const char*, const char*, CMPIStatus* rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
-CMPIEnumeration *associationUpcall(B b, C ctx, OP op, AssocQuery q, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIEnumeration *>(nullptr),
-                  [&](HostImpl &h) -> CMPIEnumeration * {
+CMPIEnumeration* associationUpcall(B b, C ctx, OP op, AssocQuery q, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIEnumeration*>(nullptr),
+                  [&](HostImpl& h) -> CMPIEnumeration* {
                       if (!requestPath(h, op, ctx, rc, q.source))
                           return nullptr;
                       std::vector<Value> out;
@@ -251,13 +251,13 @@ CMPIEnumeration *associationUpcall(B b, C ctx, OP op, AssocQuery q, CMPIStatus *
                   });
 }
 
-std::string str(const char *s) {
+std::string str(const char* s) {
     return s ? s : "";
 }
 
-CMPIEnumeration *bAssociators(B b, C ctx, OP op, const char *assocClass, const char *resultClass,
-                              const char *role, const char *resultRole, const char **props,
-                              CMPIStatus *rc) {
+CMPIEnumeration* bAssociators(B b, C ctx, OP op, const char* assocClass, const char* resultClass,
+                              const char* role, const char* resultRole, const char** props,
+                              CMPIStatus* rc) {
     return associationUpcall(b, ctx, op,
                              AssocQuery{AssocOp::Associators,
                                         {},
@@ -269,9 +269,9 @@ CMPIEnumeration *bAssociators(B b, C ctx, OP op, const char *assocClass, const c
                              rc);
 }
 
-CMPIEnumeration *bAssociatorNames(B b, C ctx, OP op, const char *assocClass,
-                                  const char *resultClass, const char *role, const char *resultRole,
-                                  CMPIStatus *rc) {
+CMPIEnumeration* bAssociatorNames(B b, C ctx, OP op, const char* assocClass,
+                                  const char* resultClass, const char* role, const char* resultRole,
+                                  CMPIStatus* rc) {
     return associationUpcall(b, ctx, op,
                              AssocQuery{AssocOp::AssociatorNames,
                                         {},
@@ -283,8 +283,8 @@ CMPIEnumeration *bAssociatorNames(B b, C ctx, OP op, const char *assocClass,
                              rc);
 }
 
-CMPIEnumeration *bReferences(B b, C ctx, OP op, const char *resultClass, const char *role,
-                             const char **props, CMPIStatus *rc) {
+CMPIEnumeration* bReferences(B b, C ctx, OP op, const char* resultClass, const char* role,
+                             const char** props, CMPIStatus* rc) {
     return associationUpcall(
         b, ctx, op,
         AssocQuery{
@@ -292,8 +292,8 @@ CMPIEnumeration *bReferences(B b, C ctx, OP op, const char *resultClass, const c
         rc);
 }
 
-CMPIEnumeration *bReferenceNames(B b, C ctx, OP op, const char *resultClass, const char *role,
-                                 CMPIStatus *rc) {
+CMPIEnumeration* bReferenceNames(B b, C ctx, OP op, const char* resultClass, const char* role,
+                                 CMPIStatus* rc) {
     return associationUpcall(
         b, ctx, op,
         AssocQuery{AssocOp::ReferenceNames, {}, str(resultClass), "", str(role), "", std::nullopt},
@@ -308,16 +308,16 @@ CMPIData noData() {
     return d;
 }
 
-CMPIData bInvokeMethod(B b, C ctx, OP op, const char *method, const CMPIArgs *in, CMPIArgs *out,
-                       CMPIStatus *rc) {
-    return upcall(b, rc, noData(), [&](HostImpl &h) {
+CMPIData bInvokeMethod(B b, C ctx, OP op, const char* method, const CMPIArgs* in, CMPIArgs* out,
+                       CMPIStatus* rc) {
+    return upcall(b, rc, noData(), [&](HostImpl& h) {
         ObjectPath p;
         if (!method || !requestPath(h, op, ctx, rc, p)) {
             setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
             return noData();
         }
         PropertyVector inArgs;
-        if (auto *a = objectOf<ArgsObj>(in))
+        if (auto* a = objectOf<ArgsObj>(in))
             inArgs = a->args;
         Value ret;
         PropertyVector outArgs;
@@ -325,15 +325,15 @@ CMPIData bInvokeMethod(B b, C ctx, OP op, const char *method, const CMPIArgs *in
         setStatus(h, rc, s);
         if (!s.ok())
             return noData();
-        if (auto *a = objectOf<ArgsObj>(out))
-            for (auto &o : outArgs)
+        if (auto* a = objectOf<ArgsObj>(out))
+            for (auto& o : outArgs)
                 setProperty(a->args, std::move(o.name), std::move(o.value));
         return toCMPI(ret, h.currentArena());
     });
 }
 
-CMPIStatus bSetProperty(B b, C ctx, OP op, const char *name, const CMPIValue *v, CMPIType t) {
-    return upcallStatus(b, [&](HostImpl &h) {
+CMPIStatus bSetProperty(B b, C ctx, OP op, const char* name, const CMPIValue* v, CMPIType t) {
+    return upcallStatus(b, [&](HostImpl& h) {
         CMPIStatus st = status(CMPI_RC_OK);
         ObjectPath p;
         if (!name || !requestPath(h, op, ctx, &st, p))
@@ -349,8 +349,8 @@ CMPIStatus bSetProperty(B b, C ctx, OP op, const char *name, const CMPIValue *v,
     });
 }
 
-CMPIData bGetProperty(B b, C ctx, OP op, const char *name, CMPIStatus *rc) {
-    return upcall(b, rc, noData(), [&](HostImpl &h) {
+CMPIData bGetProperty(B b, C ctx, OP op, const char* name, CMPIStatus* rc) {
+    return upcall(b, rc, noData(), [&](HostImpl& h) {
         ObjectPath p;
         if (!name || !requestPath(h, op, ctx, rc, p)) {
             setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -361,7 +361,7 @@ CMPIData bGetProperty(B b, C ctx, OP op, const char *name, CMPIStatus *rc) {
         setStatus(h, rc, s);
         if (!s.ok())
             return noData();
-        const Value *v = inst.get(name);
+        const Value* v = inst.get(name);
         if (!v) {
             setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
             return noData();
@@ -374,15 +374,15 @@ CMPIData bGetProperty(B b, C ctx, OP op, const char *name, CMPIStatus *rc) {
 // CMPIBrokerEncFT
 // ---------------------------------------------------------------------------
 template <class O, class... A>
-typename O::CType *newObject(B b, CMPIStatus *rc, A &&...args) {
+typename O::CType* newObject(B b, CMPIStatus* rc, A&&... args) {
     using CT = typename O::CType;
-    return upcall(b, rc, static_cast<CT *>(nullptr), [&](HostImpl &h) {
+    return upcall(b, rc, static_cast<CT*>(nullptr), [&](HostImpl& h) {
         return &make<O>(h.currentArena(), std::forward<A>(args)...)->c;
     });
 }
 
-CMPIInstance *eNewInstance(B b, OP op, CMPIStatus *rc) {
-    auto *p = objectOf<PathObj>(op);
+CMPIInstance* eNewInstance(B b, OP op, CMPIStatus* rc) {
+    auto* p = objectOf<PathObj>(op);
     if (!p) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
         return nullptr;
@@ -390,19 +390,19 @@ CMPIInstance *eNewInstance(B b, OP op, CMPIStatus *rc) {
     return newObject<InstanceObj>(b, rc, Instance(p->path));
 }
 
-CMPIObjectPath *eNewObjectPath(B b, const char *ns, const char *cn, CMPIStatus *rc) {
+CMPIObjectPath* eNewObjectPath(B b, const char* ns, const char* cn, CMPIStatus* rc) {
     return newObject<PathObj>(b, rc, ObjectPath(str(ns), str(cn)));
 }
 
-CMPIArgs *eNewArgs(B b, CMPIStatus *rc) {
+CMPIArgs* eNewArgs(B b, CMPIStatus* rc) {
     return newObject<ArgsObj>(b, rc);
 }
 
-CMPIString *eNewString(B b, const char *data, CMPIStatus *rc) {
+CMPIString* eNewString(B b, const char* data, CMPIStatus* rc) {
     return newObject<StringObj>(b, rc, str(data));
 }
 
-CMPIArray *eNewArray(B b, CMPICount max, CMPIType type, CMPIStatus *rc) {
+CMPIArray* eNewArray(B b, CMPICount max, CMPIType type, CMPIStatus* rc) {
     auto t = hostType(type);
     if (!t || (type & ~CMPI_ARRAY) == CMPI_null) {
         setRc(rc, CMPI_RC_ERR_INVALID_DATA_TYPE);
@@ -411,15 +411,15 @@ CMPIArray *eNewArray(B b, CMPICount max, CMPIType type, CMPIStatus *rc) {
     return newObject<ArrayObj>(b, rc, *t, std::vector<Value>(max, Value::null(*t)));
 }
 
-CMPIDateTime *eNewDateTime(B b, CMPIStatus *rc) {
+CMPIDateTime* eNewDateTime(B b, CMPIStatus* rc) {
     return newObject<DateTimeObj>(b, rc, DateTime::now());
 }
 
-CMPIDateTime *eNewDateTimeFromBinary(B b, CMPIUint64 bin, CMPIBoolean interval, CMPIStatus *rc) {
+CMPIDateTime* eNewDateTimeFromBinary(B b, CMPIUint64 bin, CMPIBoolean interval, CMPIStatus* rc) {
     return newObject<DateTimeObj>(b, rc, DateTime::fromBinary(bin, interval != 0));
 }
 
-CMPIDateTime *eNewDateTimeFromChars(B b, const char *text, CMPIStatus *rc) {
+CMPIDateTime* eNewDateTimeFromChars(B b, const char* text, CMPIStatus* rc) {
     auto dt = text ? DateTime::parse(text) : std::nullopt;
     if (!dt) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -428,17 +428,16 @@ CMPIDateTime *eNewDateTimeFromChars(B b, const char *text, CMPIStatus *rc) {
     return newObject<DateTimeObj>(b, rc, *dt);
 }
 
-CMPISelectExp *eNewSelectExp(B, const char *, const char *, CMPIArray **projection,
-                             CMPIStatus *rc) {
+CMPISelectExp* eNewSelectExp(B, const char*, const char*, CMPIArray** projection, CMPIStatus* rc) {
     if (projection)
         *projection = nullptr;
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
-CMPIBoolean eClassPathIsA(B b, OP op, const char *type, CMPIStatus *rc) {
-    return upcall(b, rc, CMPIBoolean(0), [&](HostImpl &h) {
-        const ObjectPath *p = pathArg(op);
+CMPIBoolean eClassPathIsA(B b, OP op, const char* type, CMPIStatus* rc) {
+    return upcall(b, rc, CMPIBoolean(0), [&](HostImpl& h) {
+        const ObjectPath* p = pathArg(op);
         if (!p || !type) {
             setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
             return CMPIBoolean(0);
@@ -448,38 +447,38 @@ CMPIBoolean eClassPathIsA(B b, OP op, const char *type, CMPIStatus *rc) {
 }
 
 // The kind of an encapsulated object given as `const void *`.
-const Encap *encapOf(const void *object) {
+const Encap* encapOf(const void* object) {
     if (!object)
         return nullptr;
-    const auto *shape = static_cast<const CMPIString *>(object);  // {hdl, ft}
-    const auto *e = static_cast<const Encap *>(shape->hdl);
+    const auto* shape = static_cast<const CMPIString*>(object);  // {hdl, ft}
+    const auto* e = static_cast<const Encap*>(shape->hdl);
     return e && e->magic == kMagic ? e : nullptr;
 }
 
-const char *typeNameOf(const Encap &e) {
-    static const char *const names[] = {
+const char* typeNameOf(const Encap& e) {
+    static const char* const names[] = {
         "CMPIString",      "CMPIArray",    "CMPIInstance", "CMPIObjectPath", "CMPIArgs",
         "CMPIEnumeration", "CMPIDateTime", "CMPIContext",  "CMPIResult",     "CMPISelectExp",
     };
     return names[static_cast<int>(e.kind)];
 }
 
-std::string describe(const Encap &e) {
+std::string describe(const Encap& e) {
     switch (e.kind) {
-        case Kind::String: return static_cast<const StringObj &>(e).s;
-        case Kind::ObjectPath: return static_cast<const PathObj &>(e).path.toString();
-        case Kind::Instance: return static_cast<const InstanceObj &>(e).inst.toString();
-        case Kind::DateTime: return static_cast<const DateTimeObj &>(e).dt.text();
+        case Kind::String: return static_cast<const StringObj&>(e).s;
+        case Kind::ObjectPath: return static_cast<const PathObj&>(e).path.toString();
+        case Kind::Instance: return static_cast<const InstanceObj&>(e).inst.toString();
+        case Kind::DateTime: return static_cast<const DateTimeObj&>(e).dt.text();
         case Kind::Array: {
-            const auto &a = static_cast<const ArrayObj &>(e);
+            const auto& a = static_cast<const ArrayObj&>(e);
             return Value::array(a.elem, a.items).toString();
         }
         case Kind::Args:
         case Kind::Context: {
-            const auto &list = e.kind == Kind::Args ? static_cast<const ArgsObj &>(e).args
-                                                    : static_cast<const ContextObj &>(e).entries;
+            const auto& list = e.kind == Kind::Args ? static_cast<const ArgsObj&>(e).args
+                                                    : static_cast<const ContextObj&>(e).entries;
             std::string s;
-            for (const auto &p : list)
+            for (const auto& p : list)
                 s += (s.empty() ? "" : ", ") + p.name + "=" + p.value.toString();
             return s;
         }
@@ -487,9 +486,9 @@ std::string describe(const Encap &e) {
     }
 }
 
-CMPIString *eToString(B b, const void *object, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIString *>(nullptr), [&](HostImpl &h) -> CMPIString * {
-        const Encap *e = encapOf(object);
+CMPIString* eToString(B b, const void* object, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIString*>(nullptr), [&](HostImpl& h) -> CMPIString* {
+        const Encap* e = encapOf(object);
         if (!e) {
             setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
             return nullptr;
@@ -498,8 +497,8 @@ CMPIString *eToString(B b, const void *object, CMPIStatus *rc) {
     });
 }
 
-CMPIBoolean eIsOfType(B, const void *object, const char *type, CMPIStatus *rc) {
-    const Encap *e = encapOf(object);
+CMPIBoolean eIsOfType(B, const void* object, const char* type, CMPIStatus* rc) {
+    const Encap* e = encapOf(object);
     if (!e || !type) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
         return 0;
@@ -508,9 +507,9 @@ CMPIBoolean eIsOfType(B, const void *object, const char *type, CMPIStatus *rc) {
     return std::strcmp(typeNameOf(*e), type) == 0;
 }
 
-CMPIString *eGetType(B b, const void *object, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIString *>(nullptr), [&](HostImpl &h) -> CMPIString * {
-        const Encap *e = encapOf(object);
+CMPIString* eGetType(B b, const void* object, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIString*>(nullptr), [&](HostImpl& h) -> CMPIString* {
+        const Encap* e = encapOf(object);
         if (!e) {
             setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
             return nullptr;
@@ -520,7 +519,7 @@ CMPIString *eGetType(B b, const void *object, CMPIStatus *rc) {
 }
 
 // Replaces $0..$9 in `def` by the (type, value) pairs of the argument list.
-std::string formatMessage(const char *def, CMPICount count, va_list ap) {
+std::string formatMessage(const char* def, CMPICount count, va_list ap) {
     std::vector<std::string> args;
     for (CMPICount i = 0; i < count && i < 10; ++i) {
         const int type = va_arg(ap, int);
@@ -532,16 +531,16 @@ std::string formatMessage(const char *def, CMPICount count, va_list ap) {
             case CMPI_real64: args.push_back(Value::real64(va_arg(ap, double)).toString()); break;
             case CMPI_boolean: args.push_back(va_arg(ap, int) ? "true" : "false"); break;
             case CMPI_chars: {
-                const char *s = va_arg(ap, const char *);
+                const char* s = va_arg(ap, const char*);
                 args.push_back(s ? s : "");
                 break;
             }
-            case CMPI_string: args.push_back(readString(va_arg(ap, const CMPIString *))); break;
+            case CMPI_string: args.push_back(readString(va_arg(ap, const CMPIString*))); break;
             default: i = count;  // unknown tag: the rest cannot be read safely
         }
     }
     std::string out;
-    for (const char *p = def ? def : ""; *p; ++p) {
+    for (const char* p = def ? def : ""; *p; ++p) {
         if (p[0] == '$' && p[1] >= '0' && p[1] <= '9') {
             const size_t n = static_cast<size_t>(p[1] - '0');
             out += n < args.size() ? args[n] : std::string("$") + p[1];
@@ -553,7 +552,7 @@ std::string formatMessage(const char *def, CMPICount count, va_list ap) {
     return out;
 }
 
-CMPIString *eGetMessage(B b, const char *, const char *defMsg, CMPIStatus *rc, CMPICount count,
+CMPIString* eGetMessage(B b, const char*, const char* defMsg, CMPIStatus* rc, CMPICount count,
                         ...) {
     va_list ap;
     va_start(ap, count);
@@ -563,23 +562,23 @@ CMPIString *eGetMessage(B b, const char *, const char *defMsg, CMPIStatus *rc, C
     } catch (...) {
     }
     va_end(ap);
-    return upcall(b, rc, static_cast<CMPIString *>(nullptr),
-                  [&](HostImpl &h) { return newString(h, text); });
+    return upcall(b, rc, static_cast<CMPIString*>(nullptr),
+                  [&](HostImpl& h) { return newString(h, text); });
 }
 
 #ifdef CMPI_VER_100
-CMPIStatus eLogMessage(B b, CMPISeverity severity, const char *id, const char *text,
-                       const CMPIString *string) {
-    return upcallStatus(b, [&](HostImpl &h) {
+CMPIStatus eLogMessage(B b, CMPISeverity severity, const char* id, const char* text,
+                       const CMPIString* string) {
+    return upcallStatus(b, [&](HostImpl& h) {
         h.log("log[" + std::to_string(severity) + "] " + str(id) + ": " +
               (text ? std::string(text) : readString(string)));
         return status(CMPI_RC_OK);
     });
 }
 
-CMPIStatus eTrace(B b, CMPILevel level, const char *component, const char *text,
-                  const CMPIString *string) {
-    return upcallStatus(b, [&](HostImpl &h) {
+CMPIStatus eTrace(B b, CMPILevel level, const char* component, const char* text,
+                  const CMPIString* string) {
+    return upcallStatus(b, [&](HostImpl& h) {
         h.log("trace[" + std::to_string(level) + "] " + str(component) + ": " +
               (text ? std::string(text) : readString(string)));
         return status(CMPI_RC_OK);
@@ -588,13 +587,13 @@ CMPIStatus eTrace(B b, CMPILevel level, const char *component, const char *text,
 #endif
 
 #ifdef CMPI_VER_200
-CMPIError *eNewCMPIError(B, const char *, const char *, const char *, const CMPIErrorSeverity,
-                         const CMPIErrorProbableCause, const CMPIrc, CMPIStatus *rc) {
+CMPIError* eNewCMPIError(B, const char*, const char*, const char*, const CMPIErrorSeverity,
+                         const CMPIErrorProbableCause, const CMPIrc, CMPIStatus* rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
-CMPIStatus eOpenMessageFile(B, const char *, CMPIMsgFileHandle *handle) {
+CMPIStatus eOpenMessageFile(B, const char*, CMPIMsgFileHandle* handle) {
     // No message catalogues: every look-up yields the default message.
     if (handle)
         *handle = nullptr;
@@ -605,8 +604,8 @@ CMPIStatus eCloseMessageFile(B, const CMPIMsgFileHandle) {
     return status(CMPI_RC_OK);
 }
 
-CMPIString *eGetMessage2(B b, const char *, const CMPIMsgFileHandle, const char *defMsg,
-                         CMPIStatus *rc, CMPICount count, ...) {
+CMPIString* eGetMessage2(B b, const char*, const CMPIMsgFileHandle, const char* defMsg,
+                         CMPIStatus* rc, CMPICount count, ...) {
     va_list ap;
     va_start(ap, count);
     std::string text;
@@ -615,28 +614,28 @@ CMPIString *eGetMessage2(B b, const char *, const CMPIMsgFileHandle, const char 
     } catch (...) {
     }
     va_end(ap);
-    return upcall(b, rc, static_cast<CMPIString *>(nullptr),
-                  [&](HostImpl &h) { return newString(h, text); });
+    return upcall(b, rc, static_cast<CMPIString*>(nullptr),
+                  [&](HostImpl& h) { return newString(h, text); });
 }
 #endif
 
 // ---------------------------------------------------------------------------
 // CMPIBrokerExtFT: POSIX threads
 // ---------------------------------------------------------------------------
-static_assert(sizeof(pthread_t) <= sizeof(void *), "thread handle fits CMPI_THREAD_TYPE");
+static_assert(sizeof(pthread_t) <= sizeof(void*), "thread handle fits CMPI_THREAD_TYPE");
 static_assert(sizeof(pthread_key_t) == sizeof(CMPI_THREAD_KEY_TYPE), "thread key type");
 
-char *xResolveFileName(const char *name) {
+char* xResolveFileName(const char* name) {
     if (!name)
         return nullptr;
     const size_t n = std::strlen(name) + sizeof "lib.so";
-    char *r = static_cast<char *>(std::malloc(n));  // the caller frees it
+    char* r = static_cast<char*>(std::malloc(n));  // the caller frees it
     if (r)
         std::snprintf(r, n, "lib%s.so", name);
     return r;
 }
 
-CMPI_THREAD_TYPE xNewThread(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL *start)(void *), void *parm,
+CMPI_THREAD_TYPE xNewThread(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL* start)(void*), void* parm,
                             int detached) {
     pthread_t t;
     if (pthread_create(&t, nullptr, start, parm) != 0)
@@ -646,7 +645,7 @@ CMPI_THREAD_TYPE xNewThread(CMPI_THREAD_RETURN(CMPI_THREAD_CDECL *start)(void *)
     return reinterpret_cast<CMPI_THREAD_TYPE>(t);
 }
 
-int xJoinThread(CMPI_THREAD_TYPE t, CMPI_THREAD_RETURN *ret) {
+int xJoinThread(CMPI_THREAD_TYPE t, CMPI_THREAD_RETURN* ret) {
     return pthread_join(reinterpret_cast<pthread_t>(t), ret);
 }
 
@@ -665,7 +664,7 @@ int xThreadSleep(CMPIUint32 msec) {
     return 0;
 }
 
-int xThreadOnce(int *once, void (*init)(void)) {
+int xThreadOnce(int* once, void (*init)(void)) {
     static pthread_mutex_t m = PTHREAD_MUTEX_INITIALIZER;
     pthread_mutex_lock(&m);
     if (*once == 0) {
@@ -676,7 +675,7 @@ int xThreadOnce(int *once, void (*init)(void)) {
     return 0;
 }
 
-int xCreateThreadKey(CMPI_THREAD_KEY_TYPE *key, void (*cleanup)(void *)) {
+int xCreateThreadKey(CMPI_THREAD_KEY_TYPE* key, void (*cleanup)(void*)) {
     pthread_key_t k;
     const int r = pthread_key_create(&k, cleanup);
     if (r == 0)
@@ -687,16 +686,16 @@ int xCreateThreadKey(CMPI_THREAD_KEY_TYPE *key, void (*cleanup)(void *)) {
 int xDestroyThreadKey(CMPI_THREAD_KEY_TYPE key) {
     return pthread_key_delete(key);
 }
-void *xGetThreadSpecific(CMPI_THREAD_KEY_TYPE key) {
+void* xGetThreadSpecific(CMPI_THREAD_KEY_TYPE key) {
     return pthread_getspecific(key);
 }
-int xSetThreadSpecific(CMPI_THREAD_KEY_TYPE key, void *v) {
+int xSetThreadSpecific(CMPI_THREAD_KEY_TYPE key, void* v) {
     return pthread_setspecific(key, v);
 }
 
 // Broker mutexes are recursive.
 CMPI_MUTEX_TYPE xNewMutex(int) {
-    auto *m = new (std::nothrow) pthread_mutex_t;
+    auto* m = new (std::nothrow) pthread_mutex_t;
     if (!m)
         return nullptr;
     pthread_mutexattr_t a;
@@ -708,7 +707,7 @@ CMPI_MUTEX_TYPE xNewMutex(int) {
 }
 
 void xDestroyMutex(CMPI_MUTEX_TYPE m) {
-    auto *pm = static_cast<pthread_mutex_t *>(m);
+    auto* pm = static_cast<pthread_mutex_t*>(m);
     if (!pm)
         return;
     pthread_mutex_destroy(pm);
@@ -716,21 +715,21 @@ void xDestroyMutex(CMPI_MUTEX_TYPE m) {
 }
 
 void xLockMutex(CMPI_MUTEX_TYPE m) {
-    pthread_mutex_lock(static_cast<pthread_mutex_t *>(m));
+    pthread_mutex_lock(static_cast<pthread_mutex_t*>(m));
 }
 void xUnlockMutex(CMPI_MUTEX_TYPE m) {
-    pthread_mutex_unlock(static_cast<pthread_mutex_t *>(m));
+    pthread_mutex_unlock(static_cast<pthread_mutex_t*>(m));
 }
 
 CMPI_COND_TYPE xNewCondition(int) {
-    auto *c = new (std::nothrow) pthread_cond_t;
+    auto* c = new (std::nothrow) pthread_cond_t;
     if (c)
         pthread_cond_init(c, nullptr);
     return c;
 }
 
 void xDestroyCondition(CMPI_COND_TYPE c) {
-    auto *pc = static_cast<pthread_cond_t *>(c);
+    auto* pc = static_cast<pthread_cond_t*>(c);
     if (!pc)
         return;
     pthread_cond_destroy(pc);
@@ -738,16 +737,16 @@ void xDestroyCondition(CMPI_COND_TYPE c) {
 }
 
 int xCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m) {
-    return pthread_cond_wait(static_cast<pthread_cond_t *>(c), static_cast<pthread_mutex_t *>(m));
+    return pthread_cond_wait(static_cast<pthread_cond_t*>(c), static_cast<pthread_mutex_t*>(m));
 }
 
-int xTimedCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m, struct timespec *wait) {
-    return pthread_cond_timedwait(static_cast<pthread_cond_t *>(c),
-                                  static_cast<pthread_mutex_t *>(m), wait);
+int xTimedCondWait(CMPI_COND_TYPE c, CMPI_MUTEX_TYPE m, struct timespec* wait) {
+    return pthread_cond_timedwait(static_cast<pthread_cond_t*>(c), static_cast<pthread_mutex_t*>(m),
+                                  wait);
 }
 
 int xSignalCondition(CMPI_COND_TYPE c) {
-    return pthread_cond_signal(static_cast<pthread_cond_t *>(c));
+    return pthread_cond_signal(static_cast<pthread_cond_t*>(c));
 }
 
 // ---------------------------------------------------------------------------
@@ -762,10 +761,10 @@ struct GcMark : Node {
 };
 
 std::mutex gMemMutex;
-std::unordered_map<void *, struct MemBlock *> gBlocks;
+std::unordered_map<void*, struct MemBlock*> gBlocks;
 
 struct MemBlock : Node {
-    explicit MemBlock(void *p) : ptr(p) {
+    explicit MemBlock(void* p) : ptr(p) {
         std::lock_guard<std::mutex> g(gMemMutex);
         gBlocks[ptr] = this;
     }
@@ -776,33 +775,33 @@ struct MemBlock : Node {
         }
         std::free(ptr);
     }
-    void *ptr;
+    void* ptr;
 };
 
-MemBlock *blockOf(void *p) {
+MemBlock* blockOf(void* p) {
     std::lock_guard<std::mutex> g(gMemMutex);
     auto it = gBlocks.find(p);
     return it == gBlocks.end() ? nullptr : it->second;
 }
 
-CMPIGcStat *mMark(B b, CMPIStatus *rc) {
-    return upcall(b, rc, static_cast<CMPIGcStat *>(nullptr), [&](HostImpl &h) {
-        return static_cast<CMPIGcStat *>(make<GcMark>(h.currentArena()));
+CMPIGcStat* mMark(B b, CMPIStatus* rc) {
+    return upcall(b, rc, static_cast<CMPIGcStat*>(nullptr), [&](HostImpl& h) {
+        return static_cast<CMPIGcStat*>(make<GcMark>(h.currentArena()));
     });
 }
 
-CMPIStatus mRelease(B, const CMPIGcStat *gc) {
-    auto *m = static_cast<GcMark *>(const_cast<CMPIGcStat *>(gc));
+CMPIStatus mRelease(B, const CMPIGcStat* gc) {
+    auto* m = static_cast<GcMark*>(const_cast<CMPIGcStat*>(gc));
     if (!m || m->magic != kMarkMagic || !m->owner)
         return status(CMPI_RC_ERR_INVALID_HANDLE);
     m->owner->freeAfter(m->seq - 1);  // the mark and everything made after it
     return status(CMPI_RC_OK);
 }
 
-void *adoptBlock(B b, void *p) {
+void* adoptBlock(B b, void* p) {
     if (!p)
         return nullptr;
-    HostImpl *h = HostImpl::of(b);
+    HostImpl* h = HostImpl::of(b);
     if (!h) {
         std::free(p);
         return nullptr;
@@ -816,25 +815,25 @@ void *adoptBlock(B b, void *p) {
     }
 }
 
-void *mMalloc(B b, size_t n) {
+void* mMalloc(B b, size_t n) {
     return adoptBlock(b, std::malloc(n));
 }
-void *mCalloc(B b, size_t n, size_t s) {
+void* mCalloc(B b, size_t n, size_t s) {
     return adoptBlock(b, std::calloc(n, s));
 }
-char *mStrDup(B b, const char *s) {
-    return s ? static_cast<char *>(adoptBlock(b, strdup(s))) : nullptr;
+char* mStrDup(B b, const char* s) {
+    return s ? static_cast<char*>(adoptBlock(b, strdup(s))) : nullptr;
 }
 
-void mFree(B, void *p) {
-    if (MemBlock *blk = p ? blockOf(p) : nullptr)
+void mFree(B, void* p) {
+    if (MemBlock* blk = p ? blockOf(p) : nullptr)
         destroy(blk);
 }
 
-void *mRealloc(B b, void *p, size_t n) {
+void* mRealloc(B b, void* p, size_t n) {
     if (!p)
         return mMalloc(b, n);
-    MemBlock *blk = blockOf(p);
+    MemBlock* blk = blockOf(p);
     if (!blk)
         return nullptr;
     std::lock_guard<std::mutex> g(gMemMutex);
@@ -843,7 +842,7 @@ void *mRealloc(B b, void *p, size_t n) {
     } catch (...) {
         return nullptr;
     }
-    void *q = std::realloc(p, n);
+    void* q = std::realloc(p, n);
     if (!q)
         return nullptr;
     gBlocks.erase(p);
@@ -853,8 +852,8 @@ void *mRealloc(B b, void *p, size_t n) {
 }
 
 template <class O>
-void mFreeObject(B, typename O::CType *c) {
-    if (O *o = objectOf<O>(c))
+void mFreeObject(B, typename O::CType* c) {
+    if (O* o = objectOf<O>(c))
         destroy(o);
 }
 #endif
@@ -947,7 +946,7 @@ CMPIBrokerMemFT gBrokerMemFT = {
 };
 #endif
 
-void initBroker(HostImpl &h) {
+void initBroker(HostImpl& h) {
     h.broker.hdl = &h;
     h.broker.bft = &gBrokerFT;
     h.broker.eft = &gBrokerEncFT;
@@ -959,10 +958,10 @@ void initBroker(HostImpl &h) {
 #endif
 }
 
-HostImpl *HostImpl::of(const CMPIBroker *b) {
+HostImpl* HostImpl::of(const CMPIBroker* b) {
     if (!b || b->bft != &gBrokerFT || !b->hdl)
         return nullptr;
-    return static_cast<HostImpl *>(b->hdl);
+    return static_cast<HostImpl*>(b->hdl);
 }
 
 }  // namespace detail

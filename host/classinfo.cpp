@@ -19,7 +19,7 @@ const uint32 KIND_FLAGS = FLAG_PROPERTY | FLAG_REFERENCE | FLAG_METHOD | FLAG_CL
 
 // "[A, B (x), C] " from the flags, or nothing. `embedded` names the class of
 // an EmbeddedInstance; a parameter always states In.
-std::string qualifiers(uint32 flags, const Meta_Class *embedded = nullptr, bool parameter = false) {
+std::string qualifiers(uint32 flags, const Meta_Class* embedded = nullptr, bool parameter = false) {
     std::string s;
     for (int bit = 0; bit < 32; ++bit) {
         const uint32 flag = 1u << bit;
@@ -45,7 +45,7 @@ std::string arrayMark(sint16 subscript) {
 }
 
 template <class T>
-T load(const void *p) {
+T load(const void* p) {
     T v;
     std::memcpy(&v, p, sizeof v);
     return v;
@@ -53,7 +53,7 @@ T load(const void *p) {
 
 // The value of a default stored as a T of the property's type (a string or
 // date-time as its C string).
-Value storedValue(int type, const void *p) {
+Value storedValue(int type, const void* p) {
     switch (type) {
         case BOOLEAN: return Value::boolean(load<boolean>(p));
         case UINT8: return Value::uint8(load<uint8>(p));
@@ -67,9 +67,9 @@ Value storedValue(int type, const void *p) {
         case REAL32: return Value::real32(load<real32>(p));
         case REAL64: return Value::real64(load<real64>(p));
         case CHAR16: return Value::char16(load<char16>(p).code);
-        case STRING: return Value::string(load<const char *>(p));
+        case STRING: return Value::string(load<const char*>(p));
         case DATETIME: {
-            const char *text = load<const char *>(p);
+            const char* text = load<const char*>(p);
             const auto dt = DateTime::parse(text);
             return dt ? Value::dateTime(*dt) : Value::null(Type::DateTime);
         }
@@ -78,41 +78,41 @@ Value storedValue(int type, const void *p) {
 }
 
 size_t storedSize(int type) {
-    return type == STRING || type == DATETIME ? sizeof(const char *) : type_size(type);
+    return type == STRING || type == DATETIME ? sizeof(const char*) : type_size(type);
 }
 
 // The property's default as a MOF literal.
-std::string defaultValue(const Meta_Property *mp) {
-    const void *value = mp->value;
+std::string defaultValue(const Meta_Property* mp) {
+    const void* value = mp->value;
     if (!type_name(mp->type))
         return "NULL";
     if (!mp->subscript)
         return mofValue(storedValue(mp->type, value));
     // Every Meta_Value_Array<T> has the same layout: elements, then count.
-    const auto *array = static_cast<const Meta_Value_Array<unsigned char> *>(value);
+    const auto* array = static_cast<const Meta_Value_Array<unsigned char>*>(value);
     std::vector<Value> elements;
     for (size_t i = 0; i < array->num_elements; ++i)
         elements.push_back(storedValue(mp->type, array->elements + i * storedSize(mp->type)));
     return mofValue(Value::array(*typeFromName(type_name(mp->type)), elements));
 }
 
-const char *typeName(int type) {
-    const char *name = type_name(type);
+const char* typeName(int type) {
+    const char* name = type_name(type);
     return name ? name : "void";
 }
 
 // A property, reference or parameter: "[qualifiers] type Name[] = default".
-std::string declaration(const Meta_Feature *mf, bool parameter) {
+std::string declaration(const Meta_Feature* mf, bool parameter) {
     if (mf->flags & FLAG_REFERENCE) {
-        const auto *mr = reinterpret_cast<const Meta_Reference *>(mf);
-        const char *cls = mr->meta_class ? mr->meta_class->name : "CIM_ManagedElement";
+        const auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+        const char* cls = mr->meta_class ? mr->meta_class->name : "CIM_ManagedElement";
         const std::string type = mf->flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)
                                      ? std::string("string")
                                      : std::string(cls) + " REF";
         return qualifiers(mf->flags, mr->meta_class, parameter) + type + ' ' + mf->name +
                arrayMark(mr->subscript);
     }
-    const auto *mp = reinterpret_cast<const Meta_Property *>(mf);
+    const auto* mp = reinterpret_cast<const Meta_Property*>(mf);
     std::string s = qualifiers(mf->flags, nullptr, parameter) + typeName(mp->type) + ' ' +
                     mf->name + arrayMark(mp->subscript);
     if (mp->value)
@@ -122,10 +122,10 @@ std::string declaration(const Meta_Feature *mf, bool parameter) {
 
 // "[qualifiers] type Name([In] type A, ...)"; the return value is the
 // parameter named return_value.
-std::string methodDeclaration(const Meta_Method *mm) {
+std::string methodDeclaration(const Meta_Method* mm) {
     std::string params;
     for (size_t i = 0; i < mm->num_meta_features; ++i) {
-        const Meta_Feature *p = mm->meta_features[i];
+        const Meta_Feature* p = mm->meta_features[i];
         if (std::strcmp(p->name, "return_value") == 0)
             continue;
         params += (params.empty() ? "" : ", ") + declaration(p, true);
@@ -135,25 +135,25 @@ std::string methodDeclaration(const Meta_Method *mm) {
 
 }  // namespace
 
-std::vector<std::string> classNames(const Meta_Repository &repository) {
+std::vector<std::string> classNames(const Meta_Repository& repository) {
     std::vector<std::string> names;
     for (size_t i = 0; i < repository.num_meta_classes; ++i)
         names.push_back(repository.meta_classes[i]->name);
     return names;
 }
 
-std::string classMof(const Meta_Class &mc) {
+std::string classMof(const Meta_Class& mc) {
     std::string s = qualifiers(mc.flags);
     if (!s.empty())
         s.back() = '\n';
     s += std::string("class ") + mc.name;
-    if (const Meta_Class *super = super_meta_class_of(&mc))
+    if (const Meta_Class* super = super_meta_class_of(&mc))
         s += std::string(" : ") + super->name;
     s += " {\n";
     for (size_t i = 0; i < mc.num_meta_features; ++i) {
-        const Meta_Feature *mf = mc.meta_features[i];
+        const Meta_Feature* mf = mc.meta_features[i];
         s += "    ";
-        s += mf->flags & FLAG_METHOD ? methodDeclaration(reinterpret_cast<const Meta_Method *>(mf))
+        s += mf->flags & FLAG_METHOD ? methodDeclaration(reinterpret_cast<const Meta_Method*>(mf))
                                      : declaration(mf, false);
         s += ";\n";
     }
@@ -164,14 +164,14 @@ std::vector<std::string> RepositoryCatalog::classNames() const {
     return classinfo::classNames(repository_);
 }
 
-std::optional<std::string> RepositoryCatalog::classMof(const std::string &name) const {
-    const Meta_Class *mc = find_meta_class(&repository_, name.c_str());
+std::optional<std::string> RepositoryCatalog::classMof(const std::string& name) const {
+    const Meta_Class* mc = find_meta_class(&repository_, name.c_str());
     if (!mc)
         return std::nullopt;
     return classinfo::classMof(*mc);
 }
 
-const cli::ClassCatalog &moduleCatalog() {
+const cli::ClassCatalog& moduleCatalog() {
     static const RepositoryCatalog catalog(__meta_repository);
     return catalog;
 }

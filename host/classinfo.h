@@ -17,7 +17,7 @@ namespace tvrnhost {
 namespace classinfo {
 
 // The class names in repository order (a superclass before its subclasses).
-std::vector<std::string> classNames(const CPTA::Meta_Repository &repository);
+std::vector<std::string> classNames(const CPTA::Meta_Repository& repository);
 
 // The class declaration:
 //
@@ -33,20 +33,20 @@ std::vector<std::string> classNames(const CPTA::Meta_Repository &repository);
 // Qualifiers follow the order of the flag bits. Embedded objects and
 // instances are strings qualified EmbeddedObject or EmbeddedInstance
 // ("Class"). Every parameter states In: `In` or `In (false)`.
-std::string classMof(const CPTA::Meta_Class &meta_class);
+std::string classMof(const CPTA::Meta_Class& meta_class);
 
 class RepositoryCatalog : public cli::ClassCatalog {
 public:
-    explicit RepositoryCatalog(const CPTA::Meta_Repository &repository) : repository_(repository) {}
+    explicit RepositoryCatalog(const CPTA::Meta_Repository& repository) : repository_(repository) {}
     std::vector<std::string> classNames() const override;
-    std::optional<std::string> classMof(const std::string &name) const override;
+    std::optional<std::string> classMof(const std::string& name) const override;
 
 private:
-    const CPTA::Meta_Repository &repository_;
+    const CPTA::Meta_Repository& repository_;
 };
 
 // The catalog over the module's own repository.
-const cli::ClassCatalog &moduleCatalog();
+const cli::ClassCatalog& moduleCatalog();
 
 }  // namespace classinfo
 }  // namespace tvrnhost

@@ -16,7 +16,7 @@
 namespace tvrnhost {
 namespace cli {
 
-Defaults defaultsFor(const std::string &exePath) {
+Defaults defaultsFor(const std::string& exePath) {
     Defaults d;
     const size_t slash = exePath.rfind('/');
     const std::string dir = slash == std::string::npos ? "." : exePath.substr(0, slash);
@@ -30,11 +30,11 @@ Defaults defaultsFor(const std::string &exePath) {
 // ---------------------------------------------------------------------------
 // Printing
 // ---------------------------------------------------------------------------
-std::string formatInstance(const Instance &inst) {
+std::string formatInstance(const Instance& inst) {
     return "// " + inst.path().toString() + '\n' + mofInstance(inst);
 }
 
-std::string formatInstances(const std::vector<Instance> &items) {
+std::string formatInstances(const std::vector<Instance>& items) {
     std::string s;
     for (size_t i = 0; i < items.size(); ++i) {
         if (i)
@@ -44,21 +44,21 @@ std::string formatInstances(const std::vector<Instance> &items) {
     return s;
 }
 
-std::string formatPaths(const std::vector<ObjectPath> &items) {
+std::string formatPaths(const std::vector<ObjectPath>& items) {
     std::string s;
-    for (const auto &p : items)
+    for (const auto& p : items)
         s += p.toString() + '\n';
     return s;
 }
 
-std::string formatMethodResult(const MethodResult &r) {
+std::string formatMethodResult(const MethodResult& r) {
     std::string s = "ReturnValue = " + mofValue(r.returnValue) + ";\n";
-    for (const auto &arg : r.out)
+    for (const auto& arg : r.out)
         s += arg.name + " = " + mofValue(arg.value) + ";\n";
     return s;
 }
 
-std::string formatFailure(const Status &st) {
+std::string formatFailure(const Status& st) {
     std::string s = "tvrncli: " + rcName(st.rc) + " (" + std::to_string(st.rc) + ")";
     if (!st.msg.empty()) {
         std::string msg = st.msg;
@@ -77,7 +77,7 @@ namespace {
 struct CommandArgs {
     std::vector<std::string> positional;
     std::map<std::string, std::string> options;
-    std::string option(const std::string &name) const {
+    std::string option(const std::string& name) const {
         auto it = options.find(name);
         return it == options.end() ? std::string() : it->second;
     }
@@ -88,17 +88,17 @@ struct CommandArgs {
 };
 
 struct Env {
-    Host &host;
-    const Invocation &inv;
+    Host& host;
+    const Invocation& inv;
     std::ostream &out, &err;
 };
 
-using Handler = int (*)(Env &, const CommandArgs &);
+using Handler = int (*)(Env&, const CommandArgs&);
 
 struct Command {
-    const char *name;
-    const char *synopsis;  // the arguments, as in the help text
-    const char *summary;
+    const char* name;
+    const char* synopsis;  // the arguments, as in the help text
+    const char* summary;
     std::vector<std::string> options;  // --name VALUE options it accepts
     size_t minArgs, maxArgs;           // positional arguments
     bool usesModule;
@@ -106,29 +106,29 @@ struct Command {
     Handler run;
 };
 
-int failed(std::ostream &err, const Status &st) {
+int failed(std::ostream& err, const Status& st) {
     err << formatFailure(st) << '\n';
     return 1;
 }
 
 // Prints what a request returned, or its failure.
 template <class R, class Print>
-int report(Env &e, const R &r, Print print) {
+int report(Env& e, const R& r, Print print) {
     if (!r.ok())
         return failed(e.err, r);
     e.out << print(r);
     return 0;
 }
 
-int reportStatus(Env &e, const Status &st) {
+int reportStatus(Env& e, const Status& st) {
     return st.ok() ? 0 : failed(e.err, st);
 }
 
-ObjectPath pathArg(const Env &e, const std::string &text) {
+ObjectPath pathArg(const Env& e, const std::string& text) {
     ObjectPath p;
     try {
         p = ObjectPath::parse(text);
-    } catch (const ParseError &x) {
+    } catch (const ParseError& x) {
         std::string why = x.what();
         const std::string prefix = "object path: ";
         if (why.compare(0, prefix.size(), prefix) == 0)
@@ -140,52 +140,52 @@ ObjectPath pathArg(const Env &e, const std::string &text) {
     return p;
 }
 
-const auto printInstances = [](const auto &r) { return formatInstances(r.items); };
-const auto printPaths = [](const auto &r) { return formatPaths(r.items); };
+const auto printInstances = [](const auto& r) { return formatInstances(r.items); };
+const auto printPaths = [](const auto& r) { return formatPaths(r.items); };
 
-int cmdEnumerate(Env &e, const CommandArgs &a) {
+int cmdEnumerate(Env& e, const CommandArgs& a) {
     return report(e, e.host.enumerateInstances(e.inv.nameSpace, a.positional[0], e.inv.props),
                   printInstances);
 }
 
-int cmdEnumerateNames(Env &e, const CommandArgs &a) {
+int cmdEnumerateNames(Env& e, const CommandArgs& a) {
     return report(e, e.host.enumerateInstanceNames(e.inv.nameSpace, a.positional[0]), printPaths);
 }
 
-int cmdGet(Env &e, const CommandArgs &a) {
+int cmdGet(Env& e, const CommandArgs& a) {
     return report(e, e.host.getInstance(pathArg(e, a.positional[0]), e.inv.props),
-                  [](const InstanceResult &r) { return formatInstance(r.instance); });
+                  [](const InstanceResult& r) { return formatInstance(r.instance); });
 }
 
-int cmdDelete(Env &e, const CommandArgs &a) {
+int cmdDelete(Env& e, const CommandArgs& a) {
     return reportStatus(e, e.host.deleteInstance(pathArg(e, a.positional[0])));
 }
 
 // The instance of `ci` and `mi`: keys from the path, then the assignments.
-Instance assignedInstance(Env &e, const CommandArgs &a, std::vector<std::string> &names) {
+Instance assignedInstance(Env& e, const CommandArgs& a, std::vector<std::string>& names) {
     Instance inst(pathArg(e, a.positional[0]));
-    for (const auto &k : inst.path().keys())
+    for (const auto& k : inst.path().keys())
         inst.set(k.name, k.value);
-    for (auto &prop : parseAssignments(a.from(1))) {
+    for (auto& prop : parseAssignments(a.from(1))) {
         names.push_back(prop.name);
         inst.set(prop.name, prop.value);
     }
     return inst;
 }
 
-int cmdCreate(Env &e, const CommandArgs &a) {
+int cmdCreate(Env& e, const CommandArgs& a) {
     std::vector<std::string> names;
     return report(e, e.host.createInstance(assignedInstance(e, a, names)),
-                  [](const PathResult &r) { return r.path.toString() + '\n'; });
+                  [](const PathResult& r) { return r.path.toString() + '\n'; });
 }
 
-int cmdModify(Env &e, const CommandArgs &a) {
+int cmdModify(Env& e, const CommandArgs& a) {
     std::vector<std::string> names;
     const Instance inst = assignedInstance(e, a, names);
     return reportStatus(e, e.host.modifyInstance(inst, names));
 }
 
-int cmdAssociators(Env &e, const CommandArgs &a) {
+int cmdAssociators(Env& e, const CommandArgs& a) {
     return report(
         e,
         e.host.associators(pathArg(e, a.positional[0]), a.option("assoc"), a.option("result-class"),
@@ -193,7 +193,7 @@ int cmdAssociators(Env &e, const CommandArgs &a) {
         printInstances);
 }
 
-int cmdAssociatorNames(Env &e, const CommandArgs &a) {
+int cmdAssociatorNames(Env& e, const CommandArgs& a) {
     return report(
         e,
         e.host.associatorNames(pathArg(e, a.positional[0]), a.option("assoc"),
@@ -201,30 +201,30 @@ int cmdAssociatorNames(Env &e, const CommandArgs &a) {
         printPaths);
 }
 
-int cmdReferences(Env &e, const CommandArgs &a) {
+int cmdReferences(Env& e, const CommandArgs& a) {
     return report(e,
                   e.host.references(pathArg(e, a.positional[0]), a.option("result-class"),
                                     a.option("role"), e.inv.props),
                   printInstances);
 }
 
-int cmdReferenceNames(Env &e, const CommandArgs &a) {
+int cmdReferenceNames(Env& e, const CommandArgs& a) {
     return report(e,
                   e.host.referenceNames(pathArg(e, a.positional[0]), a.option("result-class"),
                                         a.option("role")),
                   printPaths);
 }
 
-int cmdCallMethod(Env &e, const CommandArgs &a) {
+int cmdCallMethod(Env& e, const CommandArgs& a) {
     const ObjectPath p = pathArg(e, a.positional[0]);
     const PropertyVector in = parseAssignments(a.from(2));
     return report(e, e.host.invokeMethod(p, a.positional[1], in), formatMethodResult);
 }
 
-int cmdIndications(Env &e, const CommandArgs &a) {
+int cmdIndications(Env& e, const CommandArgs& a) {
     double seconds = 10;
     if (a.positional.size() == 2) {
-        char *end = nullptr;
+        char* end = nullptr;
         seconds = std::strtod(a.positional[1].c_str(), &end);
         if (!end || *end || seconds < 0)
             throw ParseError("SECONDS must be a non-negative number");
@@ -250,23 +250,23 @@ int cmdIndications(Env &e, const CommandArgs &a) {
     return reportStatus(e, e.host.unsubscribe(ns, cls));
 }
 
-const ClassCatalog &catalog(const Env &e) {
+const ClassCatalog& catalog(const Env& e) {
     static const struct None : ClassCatalog {
         std::vector<std::string> classNames() const override { return {}; }
-        std::optional<std::string> classMof(const std::string &) const override {
+        std::optional<std::string> classMof(const std::string&) const override {
             return std::nullopt;
         }
     } none;
     return e.inv.catalog ? *e.inv.catalog : none;
 }
 
-int cmdClasses(Env &e, const CommandArgs &) {
-    for (const auto &name : catalog(e).classNames())
+int cmdClasses(Env& e, const CommandArgs&) {
+    for (const auto& name : catalog(e).classNames())
         e.out << name << '\n';
     return 0;
 }
 
-int cmdGetClass(Env &e, const CommandArgs &a) {
+int cmdGetClass(Env& e, const CommandArgs& a) {
     const auto mof = catalog(e).classMof(a.positional[0]);
     if (!mof)
         return failed(e.err, Status{CMPI_RC_ERR_INVALID_CLASS, "no class " + a.positional[0]});
@@ -274,7 +274,7 @@ int cmdGetClass(Env &e, const CommandArgs &a) {
     return 0;
 }
 
-int cmdHelp(Env &e, const CommandArgs &) {
+int cmdHelp(Env& e, const CommandArgs&) {
     e.out << usage();
     return 0;
 }
@@ -353,8 +353,8 @@ const Command kCommands[] = {
     {"help", "", "this text", {}, 0, 0, false, false, cmdHelp},
 };
 
-const Command *findCommand(const std::string &name) {
-    for (const auto &c : kCommands)
+const Command* findCommand(const std::string& name) {
+    for (const auto& c : kCommands)
         if (name == c.name)
             return &c;
     return nullptr;
@@ -363,8 +363,8 @@ const Command *findCommand(const std::string &name) {
 // Notes on the argument kinds, shown with the usage of the commands that
 // take them.
 const struct {
-    const char *word;
-    const char *note;
+    const char* word;
+    const char* note;
 } kNotes[] = {
     {"PATH", "PATH: [//host/][namespace:]Class.Key=\"value\",Key2=5 (namespace defaults to -n)\n"},
     {"VALUE",
@@ -373,21 +373,21 @@ const struct {
      "       string; a reference is a quoted PATH\n"},
 };
 
-std::string commandUsage(const Command &c) {
+std::string commandUsage(const Command& c) {
     std::string s = std::string("usage: tvrncli [OPTIONS] ") + c.name;
     if (*c.synopsis)
         s += std::string(" ") + c.synopsis;
     s += '\n';
-    for (const auto &n : kNotes)
+    for (const auto& n : kNotes)
         if (std::string(c.synopsis).find(n.word) != std::string::npos)
             s += n.note;
     return s;
 }
 
-CommandArgs splitArgs(const Command &c, const std::vector<std::string> &args) {
+CommandArgs splitArgs(const Command& c, const std::vector<std::string>& args) {
     CommandArgs r;
     for (size_t i = 0; i < args.size(); ++i) {
-        const std::string &a = args[i];
+        const std::string& a = args[i];
         if (a.compare(0, 2, "--") != 0) {
             r.positional.push_back(a);
             continue;
@@ -404,7 +404,7 @@ CommandArgs splitArgs(const Command &c, const std::vector<std::string> &args) {
     return r;
 }
 
-std::vector<std::string> splitList(const std::string &s) {
+std::vector<std::string> splitList(const std::string& s) {
     std::vector<std::string> r;
     std::stringstream ss(s);
     std::string item;
@@ -414,7 +414,7 @@ std::vector<std::string> splitList(const std::string &s) {
     return r;
 }
 
-std::string readFile(const std::string &path) {
+std::string readFile(const std::string& path) {
     std::ifstream f(path);
     if (!f)
         throw ParseError(path + ": cannot open");
@@ -443,7 +443,7 @@ std::string usage() {
         "\n"
         "commands:\n";
     const size_t column = 32;
-    for (const auto &c : kCommands) {
+    for (const auto& c : kCommands) {
         if (c.hidden)
             continue;
         std::string line = std::string("  ") + c.name + (*c.synopsis ? " " : "") + c.synopsis;
@@ -454,19 +454,19 @@ std::string usage() {
         s += line + c.summary + '\n';
     }
     s += '\n';
-    for (const auto &n : kNotes)
+    for (const auto& n : kNotes)
         s += n.note;
     return s;
 }
 
-bool usesModule(const std::string &command) {
-    const Command *c = findCommand(command);
+bool usesModule(const std::string& command) {
+    const Command* c = findCommand(command);
     return c && c->usesModule;
 }
 
-PropertyVector parseAssignments(const std::vector<std::string> &args) {
+PropertyVector parseAssignments(const std::vector<std::string>& args) {
     PropertyVector r;
-    for (const auto &a : args) {
+    for (const auto& a : args) {
         const size_t eq = a.find('=');
         if (eq == std::string::npos || eq == 0)
             throw ParseError("expected NAME=VALUE: " + a);
@@ -475,27 +475,27 @@ PropertyVector parseAssignments(const std::vector<std::string> &args) {
             throw ParseError("given twice: " + name);
         try {
             r.push_back(Property{name, parseValue(a.substr(eq + 1))});
-        } catch (const ParseError &e) {
+        } catch (const ParseError& e) {
             throw ParseError(name + ": " + e.what());
         }
     }
     return r;
 }
 
-Invocation parseInvocation(const std::vector<std::string> &args, const Defaults &d) {
+Invocation parseInvocation(const std::vector<std::string>& args, const Defaults& d) {
     Invocation inv;
     inv.module = d.module;
     inv.reg = d.reg;
     inv.nameSpace = d.nameSpace;
     inv.catalog = d.catalog;
     size_t i = 0;
-    auto value = [&](const std::string &opt) -> std::string {
+    auto value = [&](const std::string& opt) -> std::string {
         if (i + 1 >= args.size())
             throw ParseError(opt + " needs a value");
         return args[++i];
     };
     for (; i < args.size(); ++i) {
-        const std::string &a = args[i];
+        const std::string& a = args[i];
         if (a == "--module")
             inv.module = value(a);
         else if (a == "--reg")
@@ -523,15 +523,15 @@ Invocation parseInvocation(const std::vector<std::string> &args, const Defaults 
     return inv;
 }
 
-void seedStores(Host &host, const Invocation &inv) {
-    for (const auto &file : inv.seeds) {
+void seedStores(Host& host, const Invocation& inv) {
+    for (const auto& file : inv.seeds) {
         std::vector<Instance> insts;
         try {
             insts = parseInstances(readFile(file));
-        } catch (const ParseError &e) {
+        } catch (const ParseError& e) {
             throw ParseError(file + ": " + e.what());
         }
-        for (auto &inst : insts) {
+        for (auto& inst : insts) {
             const std::string ns =
                 inst.path().nameSpace().empty() ? inv.nameSpace : inst.path().nameSpace();
             if (!host.store(ns).add(inst))
@@ -540,8 +540,8 @@ void seedStores(Host &host, const Invocation &inv) {
     }
 }
 
-int execute(Host &host, const Invocation &inv, std::ostream &out, std::ostream &err) {
-    const Command *c = findCommand(inv.command);
+int execute(Host& host, const Invocation& inv, std::ostream& out, std::ostream& err) {
+    const Command* c = findCommand(inv.command);
     if (!c) {
         err << "tvrncli: unknown command '" << inv.command << "' (see tvrncli help)\n";
         return 2;
@@ -549,18 +549,18 @@ int execute(Host &host, const Invocation &inv, std::ostream &out, std::ostream &
     Env env{host, inv, out, err};
     try {
         return c->run(env, splitArgs(*c, inv.args));
-    } catch (const ParseError &e) {
+    } catch (const ParseError& e) {
         err << "tvrncli: " << e.what() << '\n' << commandUsage(*c);
         return 2;
     }
 }
 
-int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &err,
-        const Defaults &d) {
+int run(const std::vector<std::string>& args, std::ostream& out, std::ostream& err,
+        const Defaults& d) {
     Invocation inv;
     try {
         inv = parseInvocation(args, d);
-    } catch (const ParseError &e) {
+    } catch (const ParseError& e) {
         err << "tvrncli: " << e.what() << "\n" << usage();
         return 2;
     }
@@ -574,7 +574,7 @@ int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &e
         return failed(err, st);
     try {
         seedStores(host, inv);
-    } catch (const ParseError &e) {
+    } catch (const ParseError& e) {
         err << "tvrncli: " << e.what() << "\n";
         return 2;
     }
@@ -585,7 +585,7 @@ int run(const std::vector<std::string> &args, std::ostream &out, std::ostream &e
     return rc;
 }
 
-int main(int argc, char **argv, const ClassCatalog *catalog) {
+int main(int argc, char** argv, const ClassCatalog* catalog) {
     std::string exe = argc > 0 ? argv[0] : "tvrncli";
     char buf[PATH_MAX];
     const ssize_t n = readlink("/proc/self/exe", buf, sizeof buf - 1);
@@ -595,7 +595,7 @@ int main(int argc, char **argv, const ClassCatalog *catalog) {
     d.catalog = catalog;
     try {
         return run(std::vector<std::string>(argv + 1, argv + argc), std::cout, std::cerr, d);
-    } catch (const std::exception &e) {
+    } catch (const std::exception& e) {
         return failed(std::cerr, Status{CMPI_RC_ERR_FAILED, e.what()});
     }
 }

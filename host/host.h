@@ -55,7 +55,7 @@ struct PathResult : Status {
 struct MethodResult : Status {
     Value returnValue;
     PropertyVector out;
-    const Value *outArg(std::string_view name) const { return findProperty(out, name); }
+    const Value* outArg(std::string_view name) const { return findProperty(out, name); }
 };
 
 struct Indication {
@@ -80,12 +80,12 @@ public:
     // False (and nothing stored) when an instance with the same path exists.
     // The instance takes the store's namespace.
     virtual bool add(Instance inst) = 0;
-    virtual bool remove(const ObjectPath &path) = 0;
-    virtual std::optional<Instance> find(const ObjectPath &path) const = 0;
+    virtual bool remove(const ObjectPath& path) = 0;
+    virtual std::optional<Instance> find(const ObjectPath& path) const = 0;
     virtual std::vector<Instance> all() const = 0;
     // Makes a class known without instances (enumerations then answer
     // empty rather than CMPI_RC_ERR_INVALID_CLASS).
-    virtual void defineClass(const std::string &className) = 0;
+    virtual void defineClass(const std::string& className) = 0;
     virtual void clear() = 0;
 };
 
@@ -104,59 +104,59 @@ public:
     Host();
     explicit Host(HostOptions options);
     ~Host();  // unloads (terminating cleanup) if still loaded
-    Host(const Host &) = delete;
-    Host &operator=(const Host &) = delete;
+    Host(const Host&) = delete;
+    Host& operator=(const Host&) = delete;
 
     // Reads the registration file and opens the library at `modulePath`,
     // which serves registrations whose location is its name
     // (lib<location>.so); other locations are looked up next to it. May be
     // called again to add further modules.
-    Status load(const std::string &modulePath, const std::string &registrationFile);
+    Status load(const std::string& modulePath, const std::string& registrationFile);
     bool loaded() const;
     std::vector<Registration> registrations() const;
 
-    Result<Instance> enumerateInstances(const std::string &ns, const std::string &className,
-                                        const PropertyList &props = std::nullopt);
-    Result<ObjectPath> enumerateInstanceNames(const std::string &ns, const std::string &className);
-    InstanceResult getInstance(const ObjectPath &path, const PropertyList &props = std::nullopt);
+    Result<Instance> enumerateInstances(const std::string& ns, const std::string& className,
+                                        const PropertyList& props = std::nullopt);
+    Result<ObjectPath> enumerateInstanceNames(const std::string& ns, const std::string& className);
+    InstanceResult getInstance(const ObjectPath& path, const PropertyList& props = std::nullopt);
     // The class, namespace and keys come from inst.path().
-    PathResult createInstance(const Instance &inst);
-    Status modifyInstance(const Instance &inst, const PropertyList &props = std::nullopt);
-    Status deleteInstance(const ObjectPath &path);
+    PathResult createInstance(const Instance& inst);
+    Status modifyInstance(const Instance& inst, const PropertyList& props = std::nullopt);
+    Status deleteInstance(const ObjectPath& path);
 
-    Result<Instance> associators(const ObjectPath &path, const std::string &assocClass = "",
-                                 const std::string &resultClass = "", const std::string &role = "",
-                                 const std::string &resultRole = "",
-                                 const PropertyList &props = std::nullopt);
-    Result<ObjectPath> associatorNames(const ObjectPath &path, const std::string &assocClass = "",
-                                       const std::string &resultClass = "",
-                                       const std::string &role = "",
-                                       const std::string &resultRole = "");
+    Result<Instance> associators(const ObjectPath& path, const std::string& assocClass = "",
+                                 const std::string& resultClass = "", const std::string& role = "",
+                                 const std::string& resultRole = "",
+                                 const PropertyList& props = std::nullopt);
+    Result<ObjectPath> associatorNames(const ObjectPath& path, const std::string& assocClass = "",
+                                       const std::string& resultClass = "",
+                                       const std::string& role = "",
+                                       const std::string& resultRole = "");
     // `resultClass` is the association class, as in CMPI.
-    Result<Instance> references(const ObjectPath &path, const std::string &resultClass = "",
-                                const std::string &role = "",
-                                const PropertyList &props = std::nullopt);
-    Result<ObjectPath> referenceNames(const ObjectPath &path, const std::string &resultClass = "",
-                                      const std::string &role = "");
+    Result<Instance> references(const ObjectPath& path, const std::string& resultClass = "",
+                                const std::string& role = "",
+                                const PropertyList& props = std::nullopt);
+    Result<ObjectPath> referenceNames(const ObjectPath& path, const std::string& resultClass = "",
+                                      const std::string& role = "");
 
-    MethodResult invokeMethod(const ObjectPath &path, const std::string &method,
-                              const PropertyVector &in = {});
+    MethodResult invokeMethod(const ObjectPath& path, const std::string& method,
+                              const PropertyVector& in = {});
 
     // Activates an indication filter on `className` in namespace `ns` with
     // the provider that serves the class (authorizeFilter, mustPoll,
     // activateFilter, and enableIndications for the first filter).
-    Status subscribe(const std::string &ns, const std::string &className);
-    Status unsubscribe(const std::string &ns, const std::string &className);
+    Status subscribe(const std::string& ns, const std::string& className);
+    Status unsubscribe(const std::string& ns, const std::string& className);
     // Indications delivered so far, in order of delivery.
     std::vector<Indication> indications() const;
     void clearIndications();
     // Waits until at least `count` indications have been delivered.
     bool waitForIndications(std::size_t count, std::chrono::milliseconds timeout) const;
 
-    InstanceStore &store(const std::string &ns);
+    InstanceStore& store(const std::string& ns);
     // Declares `sub` a subclass of `super` (used by enumerations, class-path
     // checks and association filters).
-    void addSubclass(const std::string &sub, const std::string &super);
+    void addSubclass(const std::string& sub, const std::string& super);
 
     // Calls cleanup on every MI created so far. MIs that agree are dropped
     // (the next request creates them again); the others stay. With
@@ -170,7 +170,7 @@ public:
     std::vector<std::string> logMessages() const;
 
     // The broker handed to providers (for tests that call it directly).
-    const _CMPIBroker *broker() const;
+    const _CMPIBroker* broker() const;
 
     // Encapsulated objects made by any host's broker and not yet freed.
     static std::size_t liveObjects();

@@ -8,7 +8,7 @@ namespace {
 
 // Escapes that MOF names; other control characters use \xHHHH (four digits,
 // so that a following hex digit is not read as part of the escape).
-const char *namedEscape(char c) {
+const char* namedEscape(char c) {
     switch (c) {
         case '\b': return "\\b";
         case '\t': return "\\t";
@@ -24,11 +24,11 @@ const char *namedEscape(char c) {
 
 // Appends one character of a literal quoted with `quote`: a byte of a
 // string (bytes of UTF-8 sequences pass unchanged) or a char16 code.
-void appendEscaped(std::string &out, unsigned code, char quote) {
+void appendEscaped(std::string& out, unsigned code, char quote) {
     const char c = static_cast<char>(code);
     const char otherQuote = quote == '"' ? '\'' : '"';
     if (code < 0x80 && c != otherQuote) {
-        if (const char *e = namedEscape(c)) {
+        if (const char* e = namedEscape(c)) {
             out += e;
             return;
         }
@@ -43,9 +43,9 @@ void appendEscaped(std::string &out, unsigned code, char quote) {
     out += buf;
 }
 
-std::string properties(const Instance &inst, const char *first, const char *sep, const char *last);
+std::string properties(const Instance& inst, const char* first, const char* sep, const char* last);
 
-void appendScalar(std::string &out, const Value &v) {
+void appendScalar(std::string& out, const Value& v) {
     switch (v.type()) {
         case Type::Boolean: out += v.asBool() ? "true" : "false"; break;
         case Type::Char16:
@@ -57,7 +57,7 @@ void appendScalar(std::string &out, const Value &v) {
         case Type::DateTime: out += mofString(v.asDateTime().text()); break;
         case Type::Reference: out += mofString(v.asReference().toString()); break;
         case Type::Instance: {
-            const Instance &inst = v.asInstance();
+            const Instance& inst = v.asInstance();
             out += mofString("instance of " + inst.className() + " {" +
                              properties(inst, " ", " ", " ") + "};");
             break;
@@ -66,7 +66,7 @@ void appendScalar(std::string &out, const Value &v) {
     }
 }
 
-void appendValue(std::string &out, const Value &v) {
+void appendValue(std::string& out, const Value& v) {
     if (v.isNull()) {
         out += "NULL";
         return;
@@ -76,8 +76,8 @@ void appendValue(std::string &out, const Value &v) {
         return;
     }
     out += '{';
-    const char *sep = "";
-    for (const auto &e : v.elements()) {
+    const char* sep = "";
+    for (const auto& e : v.elements()) {
         out += sep;
         sep = ", ";
         appendValue(out, e);
@@ -87,9 +87,9 @@ void appendValue(std::string &out, const Value &v) {
 
 // The non-null properties as "<first><Name> = <value>;<sep>..." ending in
 // `last` instead of the final `sep`; empty when there are none.
-std::string properties(const Instance &inst, const char *first, const char *sep, const char *last) {
+std::string properties(const Instance& inst, const char* first, const char* sep, const char* last) {
     std::string body;
-    for (const auto &p : inst.properties()) {
+    for (const auto& p : inst.properties()) {
         if (p.value.isNull())
             continue;
         body += body.empty() ? first : sep;
@@ -113,13 +113,13 @@ std::string mofString(std::string_view s) {
     return out;
 }
 
-std::string mofValue(const Value &v) {
+std::string mofValue(const Value& v) {
     std::string out;
     appendValue(out, v);
     return out;
 }
 
-std::string mofInstance(const Instance &inst) {
+std::string mofInstance(const Instance& inst) {
     return "instance of " + inst.className() + " {\n" + properties(inst, "    ", "\n    ", "\n") +
            "};\n";
 }

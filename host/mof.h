@@ -26,11 +26,11 @@ std::string mofString(std::string_view s);
 // A value as a MOF literal: 5, -1, 2.5, true, 'c', "text"; date-times and
 // references (object paths) as quoted text; arrays as {a, b}; NULL. An
 // embedded instance is its MOF text on one line, quoted.
-std::string mofValue(const Value &v);
+std::string mofValue(const Value& v);
 
 // "instance of <Class> {", one "    <Name> = <value>;" line per non-null
 // property, "};" (every line ends in a newline).
-std::string mofInstance(const Instance &inst);
+std::string mofInstance(const Instance& inst);
 
 }  // namespace tvrnhost
 

@@ -23,7 +23,7 @@ Arena::~Arena() {
     freeAll();
 }
 
-void Arena::adopt(Node *n) {
+void Arena::adopt(Node* n) {
     std::lock_guard<std::mutex> g(m_);
     n->owner = this;
     n->seq = nextSeq_++;
@@ -33,7 +33,7 @@ void Arena::adopt(Node *n) {
     head_.prev = n;
 }
 
-void Arena::disown(Node *n) {
+void Arena::disown(Node* n) {
     std::lock_guard<std::mutex> g(m_);
     n->prev->next = n->next;
     n->next->prev = n->prev;
@@ -50,7 +50,7 @@ void Arena::freeAfter(std::uint64_t seq) {
     // Freeing a node may free its children (other arenas), never this one's
     // nodes, so unlink under the lock and delete outside it.
     for (;;) {
-        Node *n;
+        Node* n;
         {
             std::lock_guard<std::mutex> g(m_);
             n = head_.prev;
@@ -68,13 +68,13 @@ void Arena::freeAll() {
     freeAfter(0);
 }
 
-void destroy(Node *n) {
+void destroy(Node* n) {
     if (n->owner)
         n->owner->disown(n);
     delete n;
 }
 
-ThreadState &threadState() {
+ThreadState& threadState() {
     thread_local ThreadState state;
     return state;
 }
@@ -101,13 +101,13 @@ const TypePair kTypePairs[] = {
 // type (CMSetProperty(i, "N", &u16, CMPI_uint16)) rather than of a whole
 // CMPIValue, so only that many bytes are read, without alignment demands.
 template <class T>
-T read(const void *p) {
+T read(const void* p) {
     T v;
     std::memcpy(&v, p, sizeof v);
     return v;
 }
 
-std::uint64_t integerBits(const void *v, Type t) {
+std::uint64_t integerBits(const void* v, Type t) {
     switch (t) {
         case Type::Uint8: return read<CMPIUint8>(v);
         case Type::Sint8:
@@ -123,7 +123,7 @@ std::uint64_t integerBits(const void *v, Type t) {
     }
 }
 
-void setIntegerBits(CMPIValue &v, Type t, std::uint64_t bits) {
+void setIntegerBits(CMPIValue& v, Type t, std::uint64_t bits) {
     switch (t) {
         case Type::Uint8: v.uint8 = static_cast<CMPIUint8>(bits); break;
         case Type::Sint8: v.sint8 = static_cast<CMPISint8>(bits); break;
@@ -136,48 +136,48 @@ void setIntegerBits(CMPIValue &v, Type t, std::uint64_t bits) {
     }
 }
 
-CMPIrc scalarFromCMPI(const void *v, Type t, Value &out) {
+CMPIrc scalarFromCMPI(const void* v, Type t, Value& out) {
     switch (t) {
         case Type::Boolean: out = Value::boolean(read<CMPIBoolean>(v) != 0); break;
         case Type::Real32: out = Value::real32(read<CMPIReal32>(v)); break;
         case Type::Real64: out = Value::real64(read<CMPIReal64>(v)); break;
         case Type::Char16: out = Value::char16(read<CMPIChar16>(v)); break;
         case Type::String: {
-            auto *s = read<const CMPIString *>(v);
+            auto* s = read<const CMPIString*>(v);
             out = s ? Value::string(readString(s)) : Value::null(Type::String);
             break;
         }
         case Type::DateTime: {
-            auto *h = read<const CMPIDateTime *>(v);
+            auto* h = read<const CMPIDateTime*>(v);
             if (!h) {
                 out = Value::null(t);
                 break;
             }
-            auto *d = objectOf<DateTimeObj>(h);
+            auto* d = objectOf<DateTimeObj>(h);
             if (!d)
                 return CMPI_RC_ERR_INVALID_HANDLE;
             out = Value::dateTime(d->dt);
             break;
         }
         case Type::Reference: {
-            auto *h = read<const CMPIObjectPath *>(v);
+            auto* h = read<const CMPIObjectPath*>(v);
             if (!h) {
                 out = Value::null(t);
                 break;
             }
-            auto *p = objectOf<PathObj>(h);
+            auto* p = objectOf<PathObj>(h);
             if (!p)
                 return CMPI_RC_ERR_INVALID_HANDLE;
             out = Value::reference(p->path);
             break;
         }
         case Type::Instance: {
-            auto *h = read<const CMPIInstance *>(v);
+            auto* h = read<const CMPIInstance*>(v);
             if (!h) {
                 out = Value::null(t);
                 break;
             }
-            auto *i = objectOf<InstanceObj>(h);
+            auto* i = objectOf<InstanceObj>(h);
             if (!i)
                 return CMPI_RC_ERR_INVALID_HANDLE;
             out = Value::instance(i->inst);
@@ -191,7 +191,7 @@ CMPIrc scalarFromCMPI(const void *v, Type t, Value &out) {
 }  // namespace
 
 CMPIType cmpiType(Type t, bool array) {
-    for (const auto &p : kTypePairs)
+    for (const auto& p : kTypePairs)
         if (p.host == t)
             return static_cast<CMPIType>(array ? (p.cmpi | CMPI_ARRAY) : p.cmpi);
     return CMPI_null;
@@ -201,22 +201,22 @@ std::optional<Type> hostType(CMPIType t) {
     const CMPIType scalar = static_cast<CMPIType>(t & ~CMPI_ARRAY);
     if (scalar == CMPI_chars)
         return Type::String;
-    for (const auto &p : kTypePairs)
+    for (const auto& p : kTypePairs)
         if (p.cmpi == scalar)
             return p.host;
     return std::nullopt;
 }
 
-std::string readString(const CMPIString *s) {
+std::string readString(const CMPIString* s) {
     if (!s || !s->ft)
         return std::string();
-    if (auto *o = objectOf<StringObj>(s))
+    if (auto* o = objectOf<StringObj>(s))
         return o->s;
-    const char *p = s->ft->getCharPtr(s, nullptr);
+    const char* p = s->ft->getCharPtr(s, nullptr);
     return p ? p : "";
 }
 
-CMPIrc fromCMPI(const CMPIValue *v, CMPIType ct, Value &out) {
+CMPIrc fromCMPI(const CMPIValue* v, CMPIType ct, Value& out) {
     if (ct == CMPI_null) {
         out = Value();
         return CMPI_RC_OK;
@@ -231,17 +231,17 @@ CMPIrc fromCMPI(const CMPIValue *v, CMPIType ct, Value &out) {
     }
     if (ct == CMPI_chars) {
         // By convention the value pointer itself is the C string.
-        out = Value::string(reinterpret_cast<const char *>(v));
+        out = Value::string(reinterpret_cast<const char*>(v));
         return CMPI_RC_OK;
     }
     if (!array)
         return scalarFromCMPI(v, *t, out);
-    auto *h = read<const CMPIArray *>(v);
+    auto* h = read<const CMPIArray*>(v);
     if (!h) {
         out = Value::null(*t, true);
         return CMPI_RC_OK;
     }
-    auto *a = objectOf<ArrayObj>(h);
+    auto* a = objectOf<ArrayObj>(h);
     if (!a)
         return CMPI_RC_ERR_INVALID_HANDLE;
     if (a->elem != *t)
@@ -250,7 +250,7 @@ CMPIrc fromCMPI(const CMPIValue *v, CMPIType ct, Value &out) {
     return CMPI_RC_OK;
 }
 
-CMPIData toCMPI(const Value &v, Arena &owner) {
+CMPIData toCMPI(const Value& v, Arena& owner) {
     CMPIData d;
     std::memset(&d, 0, sizeof d);
     d.type = cmpiType(v.type(), v.isArray());
@@ -277,16 +277,16 @@ CMPIData toCMPI(const Value &v, Arena &owner) {
     return d;
 }
 
-CPropertyList::CPropertyList(const PropertyList &p) : on_(p.has_value()) {
+CPropertyList::CPropertyList(const PropertyList& p) : on_(p.has_value()) {
     if (!on_)
         return;
     names_ = *p;
-    for (const auto &n : names_)
+    for (const auto& n : names_)
         ptrs_.push_back(n.c_str());
     ptrs_.push_back(nullptr);
 }
 
-PropertyList propertyList(const char **props) {
+PropertyList propertyList(const char** props) {
     if (!props)
         return std::nullopt;
     std::vector<std::string> r;
@@ -309,16 +309,16 @@ CMPIData noData(CMPIValueState extra = CMPI_notFound) {
 }
 
 template <class O, class R, class F>
-R guard(const typename O::CType *c, CMPIStatus *rc, R fail, F &&f) noexcept {
+R guard(const typename O::CType* c, CMPIStatus* rc, R fail, F&& f) noexcept {
     try {
-        O *o = objectOf<O>(c);
+        O* o = objectOf<O>(c);
         if (!o) {
             setRc(rc, CMPI_RC_ERR_INVALID_HANDLE);
             return fail;
         }
         setRc(rc, CMPI_RC_OK);
         return f(*o);
-    } catch (const std::bad_alloc &) {
+    } catch (const std::bad_alloc&) {
         setRc(rc, CMPI_RC_ERROR_SYSTEM);
     } catch (...) {
         setRc(rc, CMPI_RC_ERR_FAILED);
@@ -328,15 +328,15 @@ R guard(const typename O::CType *c, CMPIStatus *rc, R fail, F &&f) noexcept {
 
 // For slots returning CMPIStatus; `f` returns the code.
 template <class O, class F>
-CMPIStatus guardStatus(const typename O::CType *c, F &&f) noexcept {
+CMPIStatus guardStatus(const typename O::CType* c, F&& f) noexcept {
     CMPIStatus st = status(CMPI_RC_OK);
     const CMPIrc rc = guard<O>(c, &st, CMPI_RC_ERR_INVALID_HANDLE, std::forward<F>(f));
     return status(st.rc != CMPI_RC_OK ? st.rc : rc);
 }
 
 template <class O>
-CMPIStatus releaseSlot(typename O::CType *c) noexcept {
-    O *o = objectOf<O>(c);
+CMPIStatus releaseSlot(typename O::CType* c) noexcept {
+    O* o = objectOf<O>(c);
     if (!o)
         return status(CMPI_RC_ERR_INVALID_HANDLE);
     destroy(o);
@@ -344,10 +344,10 @@ CMPIStatus releaseSlot(typename O::CType *c) noexcept {
 }
 
 template <class O>
-typename O::CType *cloneSlot(const typename O::CType *c, CMPIStatus *rc) noexcept {
+typename O::CType* cloneSlot(const typename O::CType* c, CMPIStatus* rc) noexcept {
     using CT = typename O::CType;
-    return guard<O>(c, rc, static_cast<CT *>(nullptr), [&](O &o) -> CT * {
-        O *n = o.clone();
+    return guard<O>(c, rc, static_cast<CT*>(nullptr), [&](O& o) -> CT* {
+        O* n = o.clone();
         if (!n) {
             setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
             return nullptr;
@@ -356,19 +356,19 @@ typename O::CType *cloneSlot(const typename O::CType *c, CMPIStatus *rc) noexcep
     });
 }
 
-CMPIString *newChildString(Encap &parent, std::string s) {
+CMPIString* newChildString(Encap& parent, std::string s) {
     return &make<StringObj>(parent.children, std::move(s))->c;
 }
 
 // Named value lists: instance properties, path keys, arguments, context
 // entries.
-CMPIData namedGet(Encap &o, const PropertyVector &v, const char *name, CMPIStatus *rc,
+CMPIData namedGet(Encap& o, const PropertyVector& v, const char* name, CMPIStatus* rc,
                   CMPIrc missing, CMPIValueState extra) {
     if (!name) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
         return noData();
     }
-    const Value *val = findProperty(v, name);
+    const Value* val = findProperty(v, name);
     if (!val) {
         setRc(rc, missing);
         return noData();
@@ -378,8 +378,8 @@ CMPIData namedGet(Encap &o, const PropertyVector &v, const char *name, CMPIStatu
     return d;
 }
 
-CMPIData namedGetAt(Encap &o, const PropertyVector &v, CMPICount i, CMPIString **name,
-                    CMPIStatus *rc, CMPIrc missing, CMPIValueState extra) {
+CMPIData namedGetAt(Encap& o, const PropertyVector& v, CMPICount i, CMPIString** name,
+                    CMPIStatus* rc, CMPIrc missing, CMPIValueState extra) {
     if (i >= v.size()) {
         if (name)
             *name = nullptr;
@@ -393,7 +393,7 @@ CMPIData namedGetAt(Encap &o, const PropertyVector &v, CMPICount i, CMPIString *
     return d;
 }
 
-CMPIrc namedSet(PropertyVector &v, const char *name, const CMPIValue *value, CMPIType type) {
+CMPIrc namedSet(PropertyVector& v, const char* name, const CMPIValue* value, CMPIType type) {
     if (!name || !*name)
         return CMPI_RC_ERR_INVALID_PARAMETER;
     Value val;
@@ -407,26 +407,26 @@ CMPIrc namedSet(PropertyVector &v, const char *name, const CMPIValue *value, CMP
 // ---------------------------------------------------------------------------
 // String
 // ---------------------------------------------------------------------------
-const char *stringGetCharPtr(const CMPIString *s, CMPIStatus *rc) {
-    return guard<StringObj>(s, rc, static_cast<const char *>(nullptr),
-                            [](StringObj &o) { return o.s.c_str(); });
+const char* stringGetCharPtr(const CMPIString* s, CMPIStatus* rc) {
+    return guard<StringObj>(s, rc, static_cast<const char*>(nullptr),
+                            [](StringObj& o) { return o.s.c_str(); });
 }
 
 // ---------------------------------------------------------------------------
 // Array
 // ---------------------------------------------------------------------------
-CMPICount arrayGetSize(const CMPIArray *a, CMPIStatus *rc) {
+CMPICount arrayGetSize(const CMPIArray* a, CMPIStatus* rc) {
     return guard<ArrayObj>(a, rc, CMPICount(0),
-                           [](ArrayObj &o) { return static_cast<CMPICount>(o.items.size()); });
+                           [](ArrayObj& o) { return static_cast<CMPICount>(o.items.size()); });
 }
 
-CMPIType arrayGetSimpleType(const CMPIArray *a, CMPIStatus *rc) {
+CMPIType arrayGetSimpleType(const CMPIArray* a, CMPIStatus* rc) {
     return guard<ArrayObj>(a, rc, CMPIType(CMPI_null),
-                           [](ArrayObj &o) { return cmpiType(o.elem, false); });
+                           [](ArrayObj& o) { return cmpiType(o.elem, false); });
 }
 
-CMPIData arrayGetElementAt(const CMPIArray *a, CMPICount i, CMPIStatus *rc) {
-    return guard<ArrayObj>(a, rc, noData(), [&](ArrayObj &o) {
+CMPIData arrayGetElementAt(const CMPIArray* a, CMPICount i, CMPIStatus* rc) {
+    return guard<ArrayObj>(a, rc, noData(), [&](ArrayObj& o) {
         if (i >= o.items.size()) {
             setRc(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
             return noData();
@@ -435,8 +435,8 @@ CMPIData arrayGetElementAt(const CMPIArray *a, CMPICount i, CMPIStatus *rc) {
     });
 }
 
-CMPIStatus arraySetElementAt(CMPIArray *a, CMPICount i, const CMPIValue *v, CMPIType t) {
-    return guardStatus<ArrayObj>(a, [&](ArrayObj &o) {
+CMPIStatus arraySetElementAt(CMPIArray* a, CMPICount i, const CMPIValue* v, CMPIType t) {
+    return guardStatus<ArrayObj>(a, [&](ArrayObj& o) {
         if (i >= o.items.size())
             return CMPI_RC_ERR_NO_SUCH_PROPERTY;
         const CMPIType scalar = static_cast<CMPIType>(t & ~CMPI_ARRAY);
@@ -453,29 +453,29 @@ CMPIStatus arraySetElementAt(CMPIArray *a, CMPICount i, const CMPIValue *v, CMPI
 // ---------------------------------------------------------------------------
 // Instance
 // ---------------------------------------------------------------------------
-CMPIData instGetProperty(const CMPIInstance *i, const char *name, CMPIStatus *rc) {
-    return guard<InstanceObj>(i, rc, noData(), [&](InstanceObj &o) {
+CMPIData instGetProperty(const CMPIInstance* i, const char* name, CMPIStatus* rc) {
+    return guard<InstanceObj>(i, rc, noData(), [&](InstanceObj& o) {
         return namedGet(o, o.inst.properties(), name, rc, CMPI_RC_ERR_NO_SUCH_PROPERTY,
                         CMPI_goodValue);
     });
 }
 
-CMPIData instGetPropertyAt(const CMPIInstance *i, CMPICount n, CMPIString **name, CMPIStatus *rc) {
-    return guard<InstanceObj>(i, rc, noData(), [&](InstanceObj &o) {
+CMPIData instGetPropertyAt(const CMPIInstance* i, CMPICount n, CMPIString** name, CMPIStatus* rc) {
+    return guard<InstanceObj>(i, rc, noData(), [&](InstanceObj& o) {
         return namedGetAt(o, o.inst.properties(), n, name, rc, CMPI_RC_ERR_NO_SUCH_PROPERTY,
                           CMPI_goodValue);
     });
 }
 
-CMPICount instGetPropertyCount(const CMPIInstance *i, CMPIStatus *rc) {
-    return guard<InstanceObj>(i, rc, CMPICount(0), [](InstanceObj &o) {
+CMPICount instGetPropertyCount(const CMPIInstance* i, CMPIStatus* rc) {
+    return guard<InstanceObj>(i, rc, CMPICount(0), [](InstanceObj& o) {
         return static_cast<CMPICount>(o.inst.properties().size());
     });
 }
 
-CMPIStatus instSetProperty(const CMPIInstance *i, const char *name, const CMPIValue *v,
+CMPIStatus instSetProperty(const CMPIInstance* i, const char* name, const CMPIValue* v,
                            CMPIType t) {
-    return guardStatus<InstanceObj>(i, [&](InstanceObj &o) {
+    return guardStatus<InstanceObj>(i, [&](InstanceObj& o) {
         if (!name || !*name)
             return CMPI_RC_ERR_INVALID_PARAMETER;
         Value val;
@@ -491,44 +491,44 @@ CMPIStatus instSetProperty(const CMPIInstance *i, const char *name, const CMPIVa
     });
 }
 
-CMPIStatus instSetPropertyWithOrigin(const CMPIInstance *i, const char *name, const CMPIValue *v,
-                                     CMPIType t, const char *) {
+CMPIStatus instSetPropertyWithOrigin(const CMPIInstance* i, const char* name, const CMPIValue* v,
+                                     CMPIType t, const char*) {
     return instSetProperty(i, name, v, t);
 }
 
-CMPIObjectPath *instGetObjectPath(const CMPIInstance *i, CMPIStatus *rc) {
-    return guard<InstanceObj>(i, rc, static_cast<CMPIObjectPath *>(nullptr), [](InstanceObj &o) {
+CMPIObjectPath* instGetObjectPath(const CMPIInstance* i, CMPIStatus* rc) {
+    return guard<InstanceObj>(i, rc, static_cast<CMPIObjectPath*>(nullptr), [](InstanceObj& o) {
         return &make<PathObj>(o.children, o.inst.path())->c;
     });
 }
 
-CMPIStatus instSetPropertyFilter(CMPIInstance *i, const char **props, const char **keys) {
-    return guardStatus<InstanceObj>(i, [&](InstanceObj &o) {
+CMPIStatus instSetPropertyFilter(CMPIInstance* i, const char** props, const char** keys) {
+    return guardStatus<InstanceObj>(i, [&](InstanceObj& o) {
         if (!props) {
             o.filter.reset();
             return CMPI_RC_OK;
         }
         std::set<std::string> allowed;
-        for (const char **p = props; *p; ++p)
+        for (const char** p = props; *p; ++p)
             allowed.insert(toLower(*p));
-        for (const char **k = keys; k && *k; ++k)
+        for (const char** k = keys; k && *k; ++k)
             allowed.insert(toLower(*k));
-        for (const auto &k : o.inst.path().keys())
+        for (const auto& k : o.inst.path().keys())
             allowed.insert(toLower(k.name));
         o.filter = std::move(allowed);
         std::vector<std::string> drop;
-        for (const auto &p : o.inst.properties())
+        for (const auto& p : o.inst.properties())
             if (!o.admits(p.name))
                 drop.push_back(p.name);
-        for (const auto &n : drop)
+        for (const auto& n : drop)
             o.inst.remove(n);
         return CMPI_RC_OK;
     });
 }
 
-CMPIStatus instSetObjectPath(CMPIInstance *i, const CMPIObjectPath *op) {
-    return guardStatus<InstanceObj>(i, [&](InstanceObj &o) {
-        auto *p = objectOf<PathObj>(op);
+CMPIStatus instSetObjectPath(CMPIInstance* i, const CMPIObjectPath* op) {
+    return guardStatus<InstanceObj>(i, [&](InstanceObj& o) {
+        auto* p = objectOf<PathObj>(op);
         if (!p)
             return CMPI_RC_ERR_INVALID_HANDLE;
         o.inst.setPath(p->path);
@@ -540,43 +540,43 @@ CMPIStatus instSetObjectPath(CMPIInstance *i, const CMPIObjectPath *op) {
 // Object path
 // ---------------------------------------------------------------------------
 template <class Set>
-CMPIStatus pathSet(CMPIObjectPath *op, const char *text, Set set) {
-    return guardStatus<PathObj>(op, [&](PathObj &o) {
+CMPIStatus pathSet(CMPIObjectPath* op, const char* text, Set set) {
+    return guardStatus<PathObj>(op, [&](PathObj& o) {
         set(o.path, std::string(text ? text : ""));
         return CMPI_RC_OK;
     });
 }
 
 template <class Get>
-CMPIString *pathGet(const CMPIObjectPath *op, CMPIStatus *rc, Get get) {
-    return guard<PathObj>(op, rc, static_cast<CMPIString *>(nullptr),
-                          [&](PathObj &o) { return newChildString(o, get(o.path)); });
+CMPIString* pathGet(const CMPIObjectPath* op, CMPIStatus* rc, Get get) {
+    return guard<PathObj>(op, rc, static_cast<CMPIString*>(nullptr),
+                          [&](PathObj& o) { return newChildString(o, get(o.path)); });
 }
 
-CMPIStatus pathSetNameSpace(CMPIObjectPath *op, const char *ns) {
-    return pathSet(op, ns, [](ObjectPath &p, std::string s) { p.setNameSpace(std::move(s)); });
+CMPIStatus pathSetNameSpace(CMPIObjectPath* op, const char* ns) {
+    return pathSet(op, ns, [](ObjectPath& p, std::string s) { p.setNameSpace(std::move(s)); });
 }
-CMPIString *pathGetNameSpace(const CMPIObjectPath *op, CMPIStatus *rc) {
-    return pathGet(op, rc, [](const ObjectPath &p) { return p.nameSpace(); });
+CMPIString* pathGetNameSpace(const CMPIObjectPath* op, CMPIStatus* rc) {
+    return pathGet(op, rc, [](const ObjectPath& p) { return p.nameSpace(); });
 }
-CMPIStatus pathSetHostname(CMPIObjectPath *op, const char *hn) {
-    return pathSet(op, hn, [](ObjectPath &p, std::string s) { p.setHost(std::move(s)); });
+CMPIStatus pathSetHostname(CMPIObjectPath* op, const char* hn) {
+    return pathSet(op, hn, [](ObjectPath& p, std::string s) { p.setHost(std::move(s)); });
 }
-CMPIString *pathGetHostname(const CMPIObjectPath *op, CMPIStatus *rc) {
-    return pathGet(op, rc, [](const ObjectPath &p) { return p.host(); });
+CMPIString* pathGetHostname(const CMPIObjectPath* op, CMPIStatus* rc) {
+    return pathGet(op, rc, [](const ObjectPath& p) { return p.host(); });
 }
-CMPIStatus pathSetClassName(CMPIObjectPath *op, const char *cn) {
-    return pathSet(op, cn, [](ObjectPath &p, std::string s) { p.setClassName(std::move(s)); });
+CMPIStatus pathSetClassName(CMPIObjectPath* op, const char* cn) {
+    return pathSet(op, cn, [](ObjectPath& p, std::string s) { p.setClassName(std::move(s)); });
 }
-CMPIString *pathGetClassName(const CMPIObjectPath *op, CMPIStatus *rc) {
-    return pathGet(op, rc, [](const ObjectPath &p) { return p.className(); });
+CMPIString* pathGetClassName(const CMPIObjectPath* op, CMPIStatus* rc) {
+    return pathGet(op, rc, [](const ObjectPath& p) { return p.className(); });
 }
-CMPIString *pathToString(const CMPIObjectPath *op, CMPIStatus *rc) {
-    return pathGet(op, rc, [](const ObjectPath &p) { return p.toString(); });
+CMPIString* pathToString(const CMPIObjectPath* op, CMPIStatus* rc) {
+    return pathGet(op, rc, [](const ObjectPath& p) { return p.toString(); });
 }
 
-CMPIStatus pathAddKey(CMPIObjectPath *op, const char *name, const CMPIValue *v, CMPIType t) {
-    return guardStatus<PathObj>(op, [&](PathObj &o) {
+CMPIStatus pathAddKey(CMPIObjectPath* op, const char* name, const CMPIValue* v, CMPIType t) {
+    return guardStatus<PathObj>(op, [&](PathObj& o) {
         if (!name || !*name)
             return CMPI_RC_ERR_INVALID_PARAMETER;
         Value val;
@@ -587,26 +587,26 @@ CMPIStatus pathAddKey(CMPIObjectPath *op, const char *name, const CMPIValue *v, 
     });
 }
 
-CMPIData pathGetKey(const CMPIObjectPath *op, const char *name, CMPIStatus *rc) {
-    return guard<PathObj>(op, rc, noData(), [&](PathObj &o) {
+CMPIData pathGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc) {
+    return guard<PathObj>(op, rc, noData(), [&](PathObj& o) {
         return namedGet(o, o.path.keys(), name, rc, CMPI_RC_ERR_NOT_FOUND, CMPI_keyValue);
     });
 }
 
-CMPIData pathGetKeyAt(const CMPIObjectPath *op, CMPICount i, CMPIString **name, CMPIStatus *rc) {
-    return guard<PathObj>(op, rc, noData(), [&](PathObj &o) {
+CMPIData pathGetKeyAt(const CMPIObjectPath* op, CMPICount i, CMPIString** name, CMPIStatus* rc) {
+    return guard<PathObj>(op, rc, noData(), [&](PathObj& o) {
         return namedGetAt(o, o.path.keys(), i, name, rc, CMPI_RC_ERR_NOT_FOUND, CMPI_keyValue);
     });
 }
 
-CMPICount pathGetKeyCount(const CMPIObjectPath *op, CMPIStatus *rc) {
+CMPICount pathGetKeyCount(const CMPIObjectPath* op, CMPIStatus* rc) {
     return guard<PathObj>(op, rc, CMPICount(0),
-                          [](PathObj &o) { return static_cast<CMPICount>(o.path.keys().size()); });
+                          [](PathObj& o) { return static_cast<CMPICount>(o.path.keys().size()); });
 }
 
-CMPIStatus pathSetNameSpaceFrom(CMPIObjectPath *op, const CMPIObjectPath *src) {
-    return guardStatus<PathObj>(op, [&](PathObj &o) {
-        auto *s = objectOf<PathObj>(src);
+CMPIStatus pathSetNameSpaceFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
+    return guardStatus<PathObj>(op, [&](PathObj& o) {
+        auto* s = objectOf<PathObj>(src);
         if (!s)
             return CMPI_RC_ERR_INVALID_HANDLE;
         o.path.setNameSpace(s->path.nameSpace());
@@ -614,9 +614,9 @@ CMPIStatus pathSetNameSpaceFrom(CMPIObjectPath *op, const CMPIObjectPath *src) {
     });
 }
 
-CMPIStatus pathSetHostAndNameSpaceFrom(CMPIObjectPath *op, const CMPIObjectPath *src) {
-    return guardStatus<PathObj>(op, [&](PathObj &o) {
-        auto *s = objectOf<PathObj>(src);
+CMPIStatus pathSetHostAndNameSpaceFrom(CMPIObjectPath* op, const CMPIObjectPath* src) {
+    return guardStatus<PathObj>(op, [&](PathObj& o) {
+        auto* s = objectOf<PathObj>(src);
         if (!s)
             return CMPI_RC_ERR_INVALID_HANDLE;
         o.path.setNameSpace(s->path.nameSpace());
@@ -626,16 +626,16 @@ CMPIStatus pathSetHostAndNameSpaceFrom(CMPIObjectPath *op, const CMPIObjectPath 
 }
 
 // The host keeps no class definitions, hence no qualifiers.
-CMPIData pathClassQualifier(const CMPIObjectPath *, const char *, CMPIStatus *rc) {
+CMPIData pathClassQualifier(const CMPIObjectPath*, const char*, CMPIStatus* rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return noData();
 }
-CMPIData pathPropertyQualifier(const CMPIObjectPath *, const char *, const char *, CMPIStatus *rc) {
+CMPIData pathPropertyQualifier(const CMPIObjectPath*, const char*, const char*, CMPIStatus* rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return noData();
 }
-CMPIData pathParameterQualifier(const CMPIObjectPath *, const char *, const char *, const char *,
-                                CMPIStatus *rc) {
+CMPIData pathParameterQualifier(const CMPIObjectPath*, const char*, const char*, const char*,
+                                CMPIStatus* rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return noData();
 }
@@ -645,31 +645,31 @@ CMPIData pathParameterQualifier(const CMPIObjectPath *, const char *, const char
 // ---------------------------------------------------------------------------
 template <class O, class C>
 struct NamedListSlots {
-    static PropertyVector &list(O &o);
-    static CMPIStatus add(const C *c, const char *name, const CMPIValue *v, CMPIType t) {
-        return guardStatus<O>(c, [&](O &o) { return namedSet(list(o), name, v, t); });
+    static PropertyVector& list(O& o);
+    static CMPIStatus add(const C* c, const char* name, const CMPIValue* v, CMPIType t) {
+        return guardStatus<O>(c, [&](O& o) { return namedSet(list(o), name, v, t); });
     }
-    static CMPIData get(const C *c, const char *name, CMPIStatus *rc) {
-        return guard<O>(c, rc, noData(), [&](O &o) {
+    static CMPIData get(const C* c, const char* name, CMPIStatus* rc) {
+        return guard<O>(c, rc, noData(), [&](O& o) {
             return namedGet(o, list(o), name, rc, CMPI_RC_ERR_NOT_FOUND, CMPI_goodValue);
         });
     }
-    static CMPIData getAt(const C *c, CMPICount i, CMPIString **name, CMPIStatus *rc) {
-        return guard<O>(c, rc, noData(), [&](O &o) {
+    static CMPIData getAt(const C* c, CMPICount i, CMPIString** name, CMPIStatus* rc) {
+        return guard<O>(c, rc, noData(), [&](O& o) {
             return namedGetAt(o, list(o), i, name, rc, CMPI_RC_ERR_NOT_FOUND, CMPI_goodValue);
         });
     }
-    static CMPICount count(const C *c, CMPIStatus *rc) {
+    static CMPICount count(const C* c, CMPIStatus* rc) {
         return guard<O>(c, rc, CMPICount(0),
-                        [](O &o) { return static_cast<CMPICount>(list(o).size()); });
+                        [](O& o) { return static_cast<CMPICount>(list(o).size()); });
     }
 };
 template <>
-PropertyVector &NamedListSlots<ArgsObj, CMPIArgs>::list(ArgsObj &o) {
+PropertyVector& NamedListSlots<ArgsObj, CMPIArgs>::list(ArgsObj& o) {
     return o.args;
 }
 template <>
-PropertyVector &NamedListSlots<ContextObj, CMPIContext>::list(ContextObj &o) {
+PropertyVector& NamedListSlots<ContextObj, CMPIContext>::list(ContextObj& o) {
     return o.entries;
 }
 using ArgsSlots = NamedListSlots<ArgsObj, CMPIArgs>;
@@ -678,8 +678,8 @@ using ContextSlots = NamedListSlots<ContextObj, CMPIContext>;
 // ---------------------------------------------------------------------------
 // Enumeration
 // ---------------------------------------------------------------------------
-CMPIData enumGetNext(const CMPIEnumeration *e, CMPIStatus *rc) {
-    return guard<EnumObj>(e, rc, noData(), [&](EnumObj &o) {
+CMPIData enumGetNext(const CMPIEnumeration* e, CMPIStatus* rc) {
+    return guard<EnumObj>(e, rc, noData(), [&](EnumObj& o) {
         if (o.pos >= o.items.size()) {
             setRc(rc, CMPI_RC_NO_MORE_ELEMENTS);
             return noData();
@@ -688,13 +688,13 @@ CMPIData enumGetNext(const CMPIEnumeration *e, CMPIStatus *rc) {
     });
 }
 
-CMPIBoolean enumHasNext(const CMPIEnumeration *e, CMPIStatus *rc) {
+CMPIBoolean enumHasNext(const CMPIEnumeration* e, CMPIStatus* rc) {
     return guard<EnumObj>(e, rc, CMPIBoolean(0),
-                          [](EnumObj &o) { return CMPIBoolean(o.pos < o.items.size()); });
+                          [](EnumObj& o) { return CMPIBoolean(o.pos < o.items.size()); });
 }
 
-CMPIArray *enumToArray(const CMPIEnumeration *e, CMPIStatus *rc) {
-    return guard<EnumObj>(e, rc, static_cast<CMPIArray *>(nullptr), [](EnumObj &o) {
+CMPIArray* enumToArray(const CMPIEnumeration* e, CMPIStatus* rc) {
+    return guard<EnumObj>(e, rc, static_cast<CMPIArray*>(nullptr), [](EnumObj& o) {
         const Type t = o.items.empty() ? Type::Instance : o.items.front().type();
         return &make<ArrayObj>(o.children, t, o.items)->c;
     });
@@ -703,27 +703,27 @@ CMPIArray *enumToArray(const CMPIEnumeration *e, CMPIStatus *rc) {
 // ---------------------------------------------------------------------------
 // Date-time
 // ---------------------------------------------------------------------------
-CMPIUint64 dtGetBinary(const CMPIDateTime *d, CMPIStatus *rc) {
+CMPIUint64 dtGetBinary(const CMPIDateTime* d, CMPIStatus* rc) {
     return guard<DateTimeObj>(d, rc, CMPIUint64(0),
-                              [](DateTimeObj &o) { return CMPIUint64(o.dt.toBinary()); });
+                              [](DateTimeObj& o) { return CMPIUint64(o.dt.toBinary()); });
 }
 
-CMPIString *dtGetString(const CMPIDateTime *d, CMPIStatus *rc) {
-    return guard<DateTimeObj>(d, rc, static_cast<CMPIString *>(nullptr),
-                              [](DateTimeObj &o) { return newChildString(o, o.dt.text()); });
+CMPIString* dtGetString(const CMPIDateTime* d, CMPIStatus* rc) {
+    return guard<DateTimeObj>(d, rc, static_cast<CMPIString*>(nullptr),
+                              [](DateTimeObj& o) { return newChildString(o, o.dt.text()); });
 }
 
-CMPIBoolean dtIsInterval(const CMPIDateTime *d, CMPIStatus *rc) {
+CMPIBoolean dtIsInterval(const CMPIDateTime* d, CMPIStatus* rc) {
     return guard<DateTimeObj>(d, rc, CMPIBoolean(0),
-                              [](DateTimeObj &o) { return CMPIBoolean(o.dt.isInterval()); });
+                              [](DateTimeObj& o) { return CMPIBoolean(o.dt.isInterval()); });
 }
 
 // ---------------------------------------------------------------------------
 // Result
 // ---------------------------------------------------------------------------
 template <class F>
-CMPIStatus resultAppend(const CMPIResult *r, F make) {
-    return guardStatus<ResultObj>(r, [&](ResultObj &o) {
+CMPIStatus resultAppend(const CMPIResult* r, F make) {
+    return guardStatus<ResultObj>(r, [&](ResultObj& o) {
         Value v;
         const CMPIrc rc = make(v);
         if (rc == CMPI_RC_OK) {
@@ -734,13 +734,13 @@ CMPIStatus resultAppend(const CMPIResult *r, F make) {
     });
 }
 
-CMPIStatus resultReturnData(const CMPIResult *r, const CMPIValue *v, CMPIType t) {
-    return resultAppend(r, [&](Value &out) { return fromCMPI(v, t, out); });
+CMPIStatus resultReturnData(const CMPIResult* r, const CMPIValue* v, CMPIType t) {
+    return resultAppend(r, [&](Value& out) { return fromCMPI(v, t, out); });
 }
 
-CMPIStatus resultReturnInstance(const CMPIResult *r, const CMPIInstance *i) {
-    return resultAppend(r, [&](Value &out) {
-        auto *o = objectOf<InstanceObj>(i);
+CMPIStatus resultReturnInstance(const CMPIResult* r, const CMPIInstance* i) {
+    return resultAppend(r, [&](Value& out) {
+        auto* o = objectOf<InstanceObj>(i);
         if (!o)
             return CMPI_RC_ERR_INVALID_HANDLE;
         out = Value::instance(o->inst);
@@ -748,9 +748,9 @@ CMPIStatus resultReturnInstance(const CMPIResult *r, const CMPIInstance *i) {
     });
 }
 
-CMPIStatus resultReturnObjectPath(const CMPIResult *r, const CMPIObjectPath *op) {
-    return resultAppend(r, [&](Value &out) {
-        auto *o = objectOf<PathObj>(op);
+CMPIStatus resultReturnObjectPath(const CMPIResult* r, const CMPIObjectPath* op) {
+    return resultAppend(r, [&](Value& out) {
+        auto* o = objectOf<PathObj>(op);
         if (!o)
             return CMPI_RC_ERR_INVALID_HANDLE;
         out = Value::reference(o->path);
@@ -758,8 +758,8 @@ CMPIStatus resultReturnObjectPath(const CMPIResult *r, const CMPIObjectPath *op)
     });
 }
 
-CMPIStatus resultReturnDone(const CMPIResult *r) {
-    return guardStatus<ResultObj>(r, [](ResultObj &o) {
+CMPIStatus resultReturnDone(const CMPIResult* r) {
+    return guardStatus<ResultObj>(r, [](ResultObj& o) {
         std::lock_guard<std::mutex> g(o.m);
         o.done = true;
         return CMPI_RC_OK;
@@ -767,7 +767,7 @@ CMPIStatus resultReturnDone(const CMPIResult *r) {
 }
 
 #ifdef CMPI_VER_200
-CMPIStatus resultReturnError(const CMPIResult *, const CMPIError *) {
+CMPIStatus resultReturnError(const CMPIResult*, const CMPIError*) {
     return status(CMPI_RC_ERR_NOT_SUPPORTED);
 }
 #endif
@@ -775,31 +775,30 @@ CMPIStatus resultReturnError(const CMPIResult *, const CMPIError *) {
 // ---------------------------------------------------------------------------
 // Select expression (indication filters): matches every instance.
 // ---------------------------------------------------------------------------
-CMPIBoolean seEvaluate(const CMPISelectExp *se, const CMPIInstance *, CMPIStatus *rc) {
+CMPIBoolean seEvaluate(const CMPISelectExp* se, const CMPIInstance*, CMPIStatus* rc) {
     return guard<SelectExpObj>(se, rc, CMPIBoolean(0),
-                               [](SelectExpObj &) { return CMPIBoolean(1); });
+                               [](SelectExpObj&) { return CMPIBoolean(1); });
 }
 
-CMPIString *seGetString(const CMPISelectExp *se, CMPIStatus *rc) {
-    return guard<SelectExpObj>(se, rc, static_cast<CMPIString *>(nullptr),
-                               [](SelectExpObj &o) { return newChildString(o, o.query); });
+CMPIString* seGetString(const CMPISelectExp* se, CMPIStatus* rc) {
+    return guard<SelectExpObj>(se, rc, static_cast<CMPIString*>(nullptr),
+                               [](SelectExpObj& o) { return newChildString(o, o.query); });
 }
 
-CMPISelectCond *seGetCond(const CMPISelectExp *, CMPIStatus *rc) {
+CMPISelectCond* seGetCond(const CMPISelectExp*, CMPIStatus* rc) {
     setRc(rc, CMPI_RC_ERR_NOT_SUPPORTED);
     return nullptr;
 }
 
 #ifdef CMPI_VER_87
-CMPIBoolean seEvaluateUsingAccessor(const CMPISelectExp *se, CMPIAccessor *, void *,
-                                    CMPIStatus *rc) {
+CMPIBoolean seEvaluateUsingAccessor(const CMPISelectExp* se, CMPIAccessor*, void*, CMPIStatus* rc) {
     return seEvaluate(se, nullptr, rc);
 }
 #endif
 
 }  // namespace
 
-bool InstanceObj::admits(const std::string &name) const {
+bool InstanceObj::admits(const std::string& name) const {
     return !filter || filter->count(toLower(name)) != 0;
 }
 

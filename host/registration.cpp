@@ -36,7 +36,7 @@ std::vector<std::string> words(std::string_view s) {
 }
 
 struct KindName {
-    const char *name;
+    const char* name;
     MIKind kind;
 };
 const KindName kKindNames[] = {
@@ -51,13 +51,13 @@ const KindName kKindNames[] = {
 std::vector<Registration> parseRegistrations(std::string_view text) {
     std::vector<Registration> regs;
     int lineNo = 0;
-    auto fail = [&](const std::string &what) -> void {
+    auto fail = [&](const std::string& what) -> void {
         throw ParseError("line " + std::to_string(lineNo) + ": " + what);
     };
     auto finish = [&]() {
         if (regs.empty())
             return;
-        const Registration &r = regs.back();
+        const Registration& r = regs.back();
         lineNo = r.line;
         if (r.provider.empty())
             fail("[" + r.className + "] has no provider");
@@ -99,7 +99,7 @@ std::vector<Registration> parseRegistrations(std::string_view text) {
             fail("expected 'key: value'");
         if (regs.empty())
             fail("entry before the first [Class] header");
-        Registration &r = regs.back();
+        Registration& r = regs.back();
         const std::string key = toLower(trim(line.substr(0, colon)));
         const std::string_view value = trim(line.substr(colon + 1));
         if (key == "provider") {
@@ -107,9 +107,9 @@ std::vector<Registration> parseRegistrations(std::string_view text) {
         } else if (key == "location") {
             r.location = std::string(value);
         } else if (key == "type") {
-            for (const auto &w : words(value)) {
+            for (const auto& w : words(value)) {
                 bool known = false;
-                for (const auto &k : kKindNames)
+                for (const auto& k : kKindNames)
                     if (equalsIgnoreCase(w, k.name)) {
                         r.kinds |= k.kind;
                         known = true;
@@ -118,7 +118,7 @@ std::vector<Registration> parseRegistrations(std::string_view text) {
                     fail("unknown provider type '" + w + "'");
             }
         } else if (key == "namespace") {
-            for (auto &w : words(value))
+            for (auto& w : words(value))
                 r.namespaces.push_back(std::move(w));
         } else {
             fail("unknown entry '" + key + "'");
@@ -128,7 +128,7 @@ std::vector<Registration> parseRegistrations(std::string_view text) {
     return regs;
 }
 
-std::vector<Registration> readRegistrationFile(const std::string &path) {
+std::vector<Registration> readRegistrationFile(const std::string& path) {
     std::ifstream f(path);
     if (!f)
         throw ParseError(path + ": cannot open");
@@ -136,7 +136,7 @@ std::vector<Registration> readRegistrationFile(const std::string &path) {
     ss << f.rdbuf();
     try {
         return parseRegistrations(ss.str());
-    } catch (const ParseError &e) {
+    } catch (const ParseError& e) {
         throw ParseError(path + ": " + e.what());
     }
 }

@@ -36,7 +36,7 @@ struct Registration {
 
 // Throws ParseError (value.h) naming the line.
 std::vector<Registration> parseRegistrations(std::string_view text);
-std::vector<Registration> readRegistrationFile(const std::string &path);
+std::vector<Registration> readRegistrationFile(const std::string& path);
 
 }  // namespace tvrnhost
 

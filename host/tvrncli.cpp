@@ -2,6 +2,6 @@
 #include "host/classinfo.h"
 #include "host/cli.h"
 
-int main(int argc, char **argv) {
+int main(int argc, char** argv) {
     return tvrnhost::cli::main(argc, argv, &tvrnhost::classinfo::moduleCatalog());
 }

@@ -20,7 +20,7 @@ namespace {
 
 struct TypeInfo {
     Type type;
-    const char *name;
+    const char* name;
     int bits;  // width of integer types, 0 otherwise
     bool isSigned;
 };
@@ -36,18 +36,18 @@ const TypeInfo kTypes[] = {
     {Type::Reference, "ref", 0, false},   {Type::Instance, "instance", 0, false},
 };
 
-const TypeInfo &info(Type t) {
+const TypeInfo& info(Type t) {
     return kTypes[static_cast<int>(t)];
 }
 
 }  // namespace
 
-const char *typeName(Type t) {
+const char* typeName(Type t) {
     return info(t).name;
 }
 
 std::optional<Type> typeFromName(std::string_view name) {
-    for (const auto &ti : kTypes)
+    for (const auto& ti : kTypes)
         if (equalsIgnoreCase(name, ti.name))
             return ti.type;
     return std::nullopt;
@@ -72,7 +72,7 @@ bool equalsIgnoreCase(std::string_view a, std::string_view b) {
 
 std::string toLower(std::string_view s) {
     std::string r(s);
-    for (auto &c : r)
+    for (auto& c : r)
         c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
     return r;
 }
@@ -82,7 +82,7 @@ std::string toLower(std::string_view s) {
 // ---------------------------------------------------------------------------
 namespace {
 
-bool digitsAt(std::string_view s, size_t pos, size_t n, std::uint64_t &out) {
+bool digitsAt(std::string_view s, size_t pos, size_t n, std::uint64_t& out) {
     out = 0;
     for (size_t i = pos; i < pos + n; ++i) {
         if (!std::isdigit(static_cast<unsigned char>(s[i])))
@@ -202,7 +202,7 @@ Value Value::boolean(bool b) {
 }
 
 Value Value::integer(Type t, std::uint64_t bits) {
-    const TypeInfo &ti = info(t);
+    const TypeInfo& ti = info(t);
     if (!ti.bits)
         throw std::invalid_argument("not an integer type");
     Value v = null(t);
@@ -267,7 +267,7 @@ Value Value::instance(Instance i) {
 }
 
 Value Value::array(Type element, std::vector<Value> elements) {
-    for (const auto &e : elements)
+    for (const auto& e : elements)
         if (e.type_ != element || e.array_)
             throw std::invalid_argument("array element of another type");
     Value v = null(element, true);
@@ -276,17 +276,17 @@ Value Value::array(Type element, std::vector<Value> elements) {
     return v;
 }
 
-const ObjectPath &Value::asReference() const {
+const ObjectPath& Value::asReference() const {
     static const ObjectPath empty;
     return ref_ ? *ref_ : empty;
 }
 
-const Instance &Value::asInstance() const {
+const Instance& Value::asInstance() const {
     static const Instance empty;
     return inst_ ? *inst_ : empty;
 }
 
-bool Value::operator==(const Value &o) const {
+bool Value::operator==(const Value& o) const {
     if (type_ != o.type_ || array_ != o.array_ || null_ != o.null_)
         return false;
     if (null_)
@@ -304,19 +304,19 @@ bool Value::operator==(const Value &o) const {
     }
 }
 
-bool Property::operator==(const Property &o) const {
+bool Property::operator==(const Property& o) const {
     return equalsIgnoreCase(name, o.name) && value == o.value;
 }
 
-const Value *findProperty(const PropertyVector &v, std::string_view name) {
-    for (const auto &p : v)
+const Value* findProperty(const PropertyVector& v, std::string_view name) {
+    for (const auto& p : v)
         if (equalsIgnoreCase(p.name, name))
             return &p.value;
     return nullptr;
 }
 
-void setProperty(PropertyVector &v, std::string name, Value value) {
-    for (auto &p : v)
+void setProperty(PropertyVector& v, std::string name, Value value) {
+    for (auto& p : v)
         if (equalsIgnoreCase(p.name, name)) {
             p.value = std::move(value);
             return;
@@ -327,22 +327,22 @@ void setProperty(PropertyVector &v, std::string name, Value value) {
 namespace {
 
 // Property sets are equal regardless of order.
-bool sameProperties(const PropertyVector &a, const PropertyVector &b) {
+bool sameProperties(const PropertyVector& a, const PropertyVector& b) {
     if (a.size() != b.size())
         return false;
-    for (const auto &p : a) {
-        const Value *q = findProperty(b, p.name);
+    for (const auto& p : a) {
+        const Value* q = findProperty(b, p.name);
         if (!q || *q != p.value)
             return false;
     }
     return true;
 }
 
-std::vector<const Property *> sortedByName(const PropertyVector &v) {
-    std::vector<const Property *> r;
-    for (const auto &p : v)
+std::vector<const Property*> sortedByName(const PropertyVector& v) {
+    std::vector<const Property*> r;
+    for (const auto& p : v)
         r.push_back(&p);
-    std::stable_sort(r.begin(), r.end(), [](const Property *a, const Property *b) {
+    std::stable_sort(r.begin(), r.end(), [](const Property* a, const Property* b) {
         return toLower(a->name) < toLower(b->name);
     });
     return r;
@@ -355,7 +355,7 @@ std::vector<const Property *> sortedByName(const PropertyVector &v) {
 // ---------------------------------------------------------------------------
 namespace {
 
-void appendQuoted(std::string &out, std::string_view s) {
+void appendQuoted(std::string& out, std::string_view s) {
     out += '"';
     for (char c : s) {
         switch (c) {
@@ -378,7 +378,7 @@ void appendQuoted(std::string &out, std::string_view s) {
 }
 
 template <class F>
-void appendReal(std::string &out, F f) {
+void appendReal(std::string& out, F f) {
     if (std::isnan(f)) {
         out += "NaN";
         return;
@@ -395,9 +395,9 @@ void appendReal(std::string &out, F f) {
         out += ".0";
 }
 
-void appendInstanceBody(std::string &out, const Instance &inst, int indent);
+void appendInstanceBody(std::string& out, const Instance& inst, int indent);
 
-void appendScalar(std::string &out, const Value &v, int indent) {
+void appendScalar(std::string& out, const Value& v, int indent) {
     switch (v.type()) {
         case Type::Boolean: out += v.asBool() ? "TRUE" : "FALSE"; break;
         case Type::Real32: appendReal(out, static_cast<float>(v.asReal())); break;
@@ -428,7 +428,7 @@ void appendScalar(std::string &out, const Value &v, int indent) {
     }
 }
 
-void appendValue(std::string &out, const Value &v, int indent) {
+void appendValue(std::string& out, const Value& v, int indent) {
     if (v.isNull()) {
         out += "NULL";
         return;
@@ -439,7 +439,7 @@ void appendValue(std::string &out, const Value &v, int indent) {
     }
     out += '{';
     bool first = true;
-    for (const auto &e : v.elements()) {
+    for (const auto& e : v.elements()) {
         if (!first)
             out += ", ";
         first = false;
@@ -448,9 +448,9 @@ void appendValue(std::string &out, const Value &v, int indent) {
     out += '}';
 }
 
-void appendDeclarations(std::string &out, const PropertyVector &props, int indent) {
+void appendDeclarations(std::string& out, const PropertyVector& props, int indent) {
     const std::string pad(static_cast<size_t>(indent), ' ');
-    for (const Property *p : sortedByName(props)) {
+    for (const Property* p : sortedByName(props)) {
         out += pad;
         out += typeName(p->value.type());
         if (p->value.isArray())
@@ -464,7 +464,7 @@ void appendDeclarations(std::string &out, const PropertyVector &props, int inden
 }
 
 // "<path> {\n<declarations>}" with the closing brace at `indent - 4`.
-void appendInstanceBody(std::string &out, const Instance &inst, int indent) {
+void appendInstanceBody(std::string& out, const Instance& inst, int indent) {
     out += inst.path().toString();
     out += " {\n";
     appendDeclarations(out, inst.properties(), indent + 4);
@@ -483,7 +483,7 @@ std::string Value::toString() const {
 // ---------------------------------------------------------------------------
 // ObjectPath
 // ---------------------------------------------------------------------------
-ObjectPath &ObjectPath::addKey(std::string name, Value v) {
+ObjectPath& ObjectPath::addKey(std::string name, Value v) {
     setProperty(keys_, std::move(name), std::move(v));
     return *this;
 }
@@ -501,7 +501,7 @@ std::string ObjectPath::toString() const {
     }
     s += class_;
     char sep = '.';
-    for (const Property *k : sortedByName(keys_)) {
+    for (const Property* k : sortedByName(keys_)) {
         s += sep;
         sep = ',';
         s += k->name;
@@ -511,14 +511,14 @@ std::string ObjectPath::toString() const {
     return s;
 }
 
-bool ObjectPath::operator==(const ObjectPath &o) const {
+bool ObjectPath::operator==(const ObjectPath& o) const {
     return equalsIgnoreCase(host_, o.host_) && equalsIgnoreCase(ns_, o.ns_) &&
            equalsIgnoreCase(class_, o.class_) && sameProperties(keys_, o.keys_);
 }
 
 namespace {
 
-bool sameKeyValue(const Value &a, const Value &b) {
+bool sameKeyValue(const Value& a, const Value& b) {
     if (a.isNull() || b.isNull() || a.isArray() || b.isArray())
         return a == b;
     if (isInteger(a.type()) && isInteger(b.type())) {
@@ -533,15 +533,15 @@ bool sameKeyValue(const Value &a, const Value &b) {
 
 }  // namespace
 
-bool ObjectPath::identifies(const ObjectPath &o) const {
+bool ObjectPath::identifies(const ObjectPath& o) const {
     if (!equalsIgnoreCase(class_, o.class_))
         return false;
     if (!ns_.empty() && !o.ns_.empty() && !equalsIgnoreCase(ns_, o.ns_))
         return false;
     if (keys_.size() != o.keys_.size())
         return false;
-    for (const auto &k : keys_) {
-        const Value *v = o.key(k.name);
+    for (const auto& k : keys_) {
+        const Value* v = o.key(k.name);
         if (!v || !sameKeyValue(k.value, *v))
             return false;
     }
@@ -551,19 +551,19 @@ bool ObjectPath::identifies(const ObjectPath &o) const {
 // ---------------------------------------------------------------------------
 // Instance
 // ---------------------------------------------------------------------------
-Instance &Instance::set(std::string name, Value v) {
+Instance& Instance::set(std::string name, Value v) {
     setProperty(props_, std::move(name), std::move(v));
     return *this;
 }
 
-Instance &Instance::setKey(std::string name, Value v) {
+Instance& Instance::setKey(std::string name, Value v) {
     path_.addKey(name, v);
     return set(std::move(name), std::move(v));
 }
 
 bool Instance::remove(std::string_view name) {
     auto it = std::find_if(props_.begin(), props_.end(),
-                           [&](const Property &p) { return equalsIgnoreCase(p.name, name); });
+                           [&](const Property& p) { return equalsIgnoreCase(p.name, name); });
     if (it == props_.end())
         return false;
     props_.erase(it);
@@ -577,23 +577,23 @@ std::string Instance::toString() const {
     return s;
 }
 
-bool Instance::operator==(const Instance &o) const {
+bool Instance::operator==(const Instance& o) const {
     return path_ == o.path_ && sameProperties(props_, o.props_);
 }
 
-std::string declarations(const PropertyVector &props, int indent) {
+std::string declarations(const PropertyVector& props, int indent) {
     std::string s;
     appendDeclarations(s, props, indent);
     return s;
 }
 
-std::ostream &operator<<(std::ostream &os, const Value &v) {
+std::ostream& operator<<(std::ostream& os, const Value& v) {
     return os << v.toString();
 }
-std::ostream &operator<<(std::ostream &os, const ObjectPath &p) {
+std::ostream& operator<<(std::ostream& os, const ObjectPath& p) {
     return os << p.toString();
 }
-std::ostream &operator<<(std::ostream &os, const Instance &i) {
+std::ostream& operator<<(std::ostream& os, const Instance& i) {
     return os << i.toString();
 }
 
@@ -613,7 +613,7 @@ class Parser {
 public:
     explicit Parser(std::string_view s) : s_(s) {}
 
-    [[noreturn]] void fail(const std::string &what) const {
+    [[noreturn]] void fail(const std::string& what) const {
         size_t line = 1;
         for (size_t i = 0; i < pos_ && i < s_.size(); ++i)
             line += s_[i] == '\n';
@@ -778,8 +778,8 @@ public:
 
 private:
     Value typedScalar(Type t);
-    Value integerFrom(const std::string &tok, Type t);
-    Value realFrom(const std::string &tok, Type t);
+    Value integerFrom(const std::string& tok, Type t);
+    Value realFrom(const std::string& tok, Type t);
 
     std::string_view s_;
     size_t pos_ = 0;
@@ -787,7 +787,7 @@ private:
 
 const char kValueStops[] = ",;}{";
 
-bool parseUnsigned(std::string_view tok, std::uint64_t &out) {
+bool parseUnsigned(std::string_view tok, std::uint64_t& out) {
     int base = 10;
     if (tok.size() > 2 && tok[0] == '0' && (tok[1] == 'x' || tok[1] == 'X')) {
         base = 16;
@@ -811,13 +811,13 @@ bool looksReal(std::string_view tok) {
         return true;
     if (tok.find_first_of(".eE") == std::string_view::npos)
         return false;
-    char *end = nullptr;
+    char* end = nullptr;
     std::string t(tok);
     std::strtod(t.c_str(), &end);
     return end && *end == '\0' && !t.empty();
 }
 
-Value Parser::integerFrom(const std::string &tok, Type t) {
+Value Parser::integerFrom(const std::string& tok, Type t) {
     std::string_view v = tok;
     bool neg = false;
     if (!v.empty() && (v[0] == '-' || v[0] == '+')) {
@@ -827,7 +827,7 @@ Value Parser::integerFrom(const std::string &tok, Type t) {
     std::uint64_t mag;
     if (!parseUnsigned(v, mag))
         fail("not an integer: " + tok);
-    const TypeInfo &ti = info(t);
+    const TypeInfo& ti = info(t);
     if (ti.isSigned) {
         const std::uint64_t max =
             ti.bits == 64 ? std::uint64_t(INT64_MAX) : (std::uint64_t(1) << (ti.bits - 1)) - 1;
@@ -841,7 +841,7 @@ Value Parser::integerFrom(const std::string &tok, Type t) {
     return Value::integer(t, mag);
 }
 
-Value Parser::realFrom(const std::string &tok, Type t) {
+Value Parser::realFrom(const std::string& tok, Type t) {
     double d;
     if (tok == "NaN")
         d = std::numeric_limits<double>::quiet_NaN();
@@ -850,7 +850,7 @@ Value Parser::realFrom(const std::string &tok, Type t) {
     else if (tok == "-INF")
         d = -std::numeric_limits<double>::infinity();
     else {
-        char *end = nullptr;
+        char* end = nullptr;
         d = std::strtod(tok.c_str(), &end);
         if (!end || *end != '\0')
             fail("not a real number: " + tok);
@@ -874,7 +874,7 @@ Value Parser::typedScalar(Type t) {
         case Type::Char16: {
             const std::string s = quoted('\'');
             // Decode one UTF-8 character.
-            const auto *u = reinterpret_cast<const unsigned char *>(s.data());
+            const auto* u = reinterpret_cast<const unsigned char*>(s.data());
             if (s.size() == 1 && u[0] < 0x80)
                 return Value::char16(u[0]);
             if (s.size() == 2 && (u[0] & 0xE0) == 0xC0)
@@ -897,7 +897,7 @@ Value Parser::typedScalar(Type t) {
             const std::string s = quoted();
             try {
                 return Value::reference(ObjectPath::parse(s));
-            } catch (const ParseError &e) {
+            } catch (const ParseError& e) {
                 fail(std::string("bad reference: ") + e.what());
             }
         }
@@ -957,7 +957,7 @@ Value Parser::guessedValue(bool topLevel) {
             ObjectPath p = ObjectPath::parse(s);
             if (!p.keys().empty())
                 return Value::reference(std::move(p));
-        } catch (const ParseError &) {
+        } catch (const ParseError&) {
         }
         return Value::string(s);
     }
@@ -970,7 +970,7 @@ Value Parser::guessedValue(bool topLevel) {
             expect('}');
         }
         std::optional<Type> t;
-        for (const auto &e : elems) {
+        for (const auto& e : elems) {
             if (e.isArray())
                 fail("nested arrays are not allowed");
             if (e.isNull())
@@ -980,7 +980,7 @@ Value Parser::guessedValue(bool topLevel) {
             t = e.type();
         }
         const Type et = t.value_or(Type::String);
-        for (auto &e : elems)
+        for (auto& e : elems)
             if (e.isNull())
                 e = Value::null(et);
         return Value::array(et, std::move(elems));
@@ -1003,7 +1003,7 @@ Instance Parser::instanceBody() {
     Instance inst;
     try {
         inst.setPath(ObjectPath::parse(pathText));
-    } catch (const ParseError &e) {
+    } catch (const ParseError& e) {
         fail(std::string("bad instance path: ") + e.what());
     }
     expect('{');

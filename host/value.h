@@ -48,7 +48,7 @@ enum class Type : std::uint8_t {
 };
 
 // "boolean", "uint8", ..., "char16", "string", "datetime", "ref", "instance".
-const char *typeName(Type t);
+const char* typeName(Type t);
 std::optional<Type> typeFromName(std::string_view name);
 bool isSignedInteger(Type t);
 bool isUnsignedInteger(Type t);
@@ -70,12 +70,12 @@ public:
     static DateTime fromBinary(std::uint64_t usec, bool interval);
     static DateTime now();
 
-    const std::string &text() const { return text_; }
+    const std::string& text() const { return text_; }
     bool isInterval() const { return text_[21] == ':'; }
     std::uint64_t toBinary() const;
 
-    bool operator==(const DateTime &o) const { return text_ == o.text_; }
-    bool operator!=(const DateTime &o) const { return !(*this == o); }
+    bool operator==(const DateTime& o) const { return text_ == o.text_; }
+    bool operator!=(const DateTime& o) const { return !(*this == o); }
 
 private:
     explicit DateTime(std::string text) : text_(std::move(text)) {}
@@ -120,17 +120,17 @@ public:
     std::int64_t asSint() const { return static_cast<std::int64_t>(bits_); }
     double asReal() const { return real_; }
     std::uint16_t asChar16() const { return static_cast<std::uint16_t>(bits_); }
-    const std::string &asString() const { return str_; }
-    const DateTime &asDateTime() const { return dt_; }
-    const ObjectPath &asReference() const;
-    const Instance &asInstance() const;
-    const std::vector<Value> &elements() const { return elems_; }
+    const std::string& asString() const { return str_; }
+    const DateTime& asDateTime() const { return dt_; }
+    const ObjectPath& asReference() const;
+    const Instance& asInstance() const;
+    const std::vector<Value>& elements() const { return elems_; }
 
     // The value alone in the text form ("NULL", 5, "text", {1, 2}, ...).
     std::string toString() const;
 
-    bool operator==(const Value &o) const;
-    bool operator!=(const Value &o) const { return !(*this == o); }
+    bool operator==(const Value& o) const;
+    bool operator!=(const Value& o) const { return !(*this == o); }
 
 private:
     Type type_ = Type::String;
@@ -148,14 +148,14 @@ private:
 struct Property {
     std::string name;
     Value value;
-    bool operator==(const Property &o) const;
-    bool operator!=(const Property &o) const { return !(*this == o); }
+    bool operator==(const Property& o) const;
+    bool operator!=(const Property& o) const { return !(*this == o); }
 };
 using PropertyVector = std::vector<Property>;
 
 // Case-insensitive look-up and replacement in a property vector.
-const Value *findProperty(const PropertyVector &v, std::string_view name);
-void setProperty(PropertyVector &v, std::string name, Value value);
+const Value* findProperty(const PropertyVector& v, std::string_view name);
+void setProperty(PropertyVector& v, std::string name, Value value);
 bool equalsIgnoreCase(std::string_view a, std::string_view b);
 std::string toLower(std::string_view s);
 
@@ -167,37 +167,37 @@ public:
     // Throws ParseError.
     static ObjectPath parse(std::string_view text);
 
-    const std::string &host() const { return host_; }
-    const std::string &nameSpace() const { return ns_; }
-    const std::string &className() const { return class_; }
-    ObjectPath &setHost(std::string h) {
+    const std::string& host() const { return host_; }
+    const std::string& nameSpace() const { return ns_; }
+    const std::string& className() const { return class_; }
+    ObjectPath& setHost(std::string h) {
         host_ = std::move(h);
         return *this;
     }
-    ObjectPath &setNameSpace(std::string n) {
+    ObjectPath& setNameSpace(std::string n) {
         ns_ = std::move(n);
         return *this;
     }
-    ObjectPath &setClassName(std::string c) {
+    ObjectPath& setClassName(std::string c) {
         class_ = std::move(c);
         return *this;
     }
 
-    ObjectPath &addKey(std::string name, Value v);  // replaces a key of that name
-    const Value *key(std::string_view name) const { return findProperty(keys_, name); }
-    const PropertyVector &keys() const { return keys_; }
+    ObjectPath& addKey(std::string name, Value v);  // replaces a key of that name
+    const Value* key(std::string_view name) const { return findProperty(keys_, name); }
+    const PropertyVector& keys() const { return keys_; }
     void clearKeys() { keys_.clear(); }
 
     std::string toString() const;
 
     // Exact: same host, namespace and class (case-insensitive) and the same
     // keys with equal values of the same types.
-    bool operator==(const ObjectPath &o) const;
-    bool operator!=(const ObjectPath &o) const { return !(*this == o); }
+    bool operator==(const ObjectPath& o) const;
+    bool operator!=(const ObjectPath& o) const { return !(*this == o); }
     // What a server means by "the same object": class and keys, with
     // integer keys compared by value whatever their width, and namespaces
     // compared only when both are given. Hosts are ignored.
-    bool identifies(const ObjectPath &o) const;
+    bool identifies(const ObjectPath& o) const;
 
 private:
     std::string host_, ns_, class_;
@@ -211,22 +211,22 @@ public:
     Instance(std::string nameSpace, std::string className)
         : path_(std::move(nameSpace), std::move(className)) {}
 
-    const std::string &className() const { return path_.className(); }
-    const ObjectPath &path() const { return path_; }
-    ObjectPath &path() { return path_; }
+    const std::string& className() const { return path_.className(); }
+    const ObjectPath& path() const { return path_; }
+    ObjectPath& path() { return path_; }
     void setPath(ObjectPath p) { path_ = std::move(p); }
 
-    Instance &set(std::string name, Value v);
+    Instance& set(std::string name, Value v);
     // Sets the property and the key of the same name in the path.
-    Instance &setKey(std::string name, Value v);
-    const Value *get(std::string_view name) const { return findProperty(props_, name); }
+    Instance& setKey(std::string name, Value v);
+    const Value* get(std::string_view name) const { return findProperty(props_, name); }
     bool remove(std::string_view name);
-    const PropertyVector &properties() const { return props_; }
+    const PropertyVector& properties() const { return props_; }
 
     std::string toString() const;
 
-    bool operator==(const Instance &o) const;
-    bool operator!=(const Instance &o) const { return !(*this == o); }
+    bool operator==(const Instance& o) const;
+    bool operator!=(const Instance& o) const { return !(*this == o); }
 
 private:
     ObjectPath path_;
@@ -249,11 +249,11 @@ Value parseValue(std::string_view text, std::optional<Type> type = std::nullopt,
 
 // Property declarations in the instance text form, one per line, sorted by
 // name: `<type>[] <Name> = <value>;`, each line indented by `indent`.
-std::string declarations(const PropertyVector &props, int indent = 0);
+std::string declarations(const PropertyVector& props, int indent = 0);
 
-std::ostream &operator<<(std::ostream &os, const Value &v);
-std::ostream &operator<<(std::ostream &os, const ObjectPath &p);
-std::ostream &operator<<(std::ostream &os, const Instance &i);
+std::ostream& operator<<(std::ostream& os, const Value& v);
+std::ostream& operator<<(std::ostream& os, const ObjectPath& p);
+std::ostream& operator<<(std::ostream& os, const Instance& i);
 
 }  // namespace tvrnhost
 

@@ -264,7 +264,7 @@ typedef double CMPIReal64;
 
 /* Pointer plus length, for opaque data carried in a CMPIValue. */
 typedef struct _CMPIValuePtr {
-    void *ptr;
+    void* ptr;
     CMPICount length;
 } CMPIValuePtr;
 
@@ -283,15 +283,15 @@ typedef union _CMPIValue {
     CMPIBoolean boolean;
     CMPIChar16 char16;
 
-    CMPIInstance *inst;
-    CMPIObjectPath *ref;
-    CMPIArgs *args;
-    CMPISelectExp *filter;
-    CMPIEnumeration *Enum;
-    CMPIArray *array;
-    CMPIString *string;
-    char *chars;
-    CMPIDateTime *dateTime;
+    CMPIInstance* inst;
+    CMPIObjectPath* ref;
+    CMPIArgs* args;
+    CMPISelectExp* filter;
+    CMPIEnumeration* Enum;
+    CMPIArray* array;
+    CMPIString* string;
+    char* chars;
+    CMPIDateTime* dateTime;
     CMPIValuePtr dataPtr;
 
     CMPISint8 Byte;
@@ -423,7 +423,7 @@ typedef struct _CMPIData {
 
 #ifdef CMPI_VER_87
 /* Callback through which a query evaluation fetches named values. */
-typedef CMPIData CMPIAccessor(const char *, void *parm);
+typedef CMPIData CMPIAccessor(const char*, void* parm);
 #endif
 
 /* Broker capabilities, compared with CMPIBrokerFT.brokerCapabilities. */
@@ -503,7 +503,7 @@ typedef enum _CMPIrc {
 /* Outcome of a call: a code and an optional message owned by the broker. */
 typedef struct _CMPIStatus {
     CMPIrc rc;
-    CMPIString *msg;
+    CMPIString* msg;
 } CMPIStatus;
 
 /* ------------------------------------------------------------------------
@@ -541,7 +541,7 @@ typedef enum _CMPILevel { CMPI_LEV_INFO = 1, CMPI_LEV_WARNING = 2, CMPI_LEV_VERB
 typedef enum _CMPISelectCondType { CMPI_COND_DOC = 0, CMPI_COND_COD = 1 } CMPISelectCondType;
 
 /* Opaque handle of an open message file. */
-typedef void *CMPIMsgFileHandle;
+typedef void* CMPIMsgFileHandle;
 
 /* Opaque marker of the broker's memory management (see CMPIBrokerMemFT). */
 typedef void CMPIGcStat;

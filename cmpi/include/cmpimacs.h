@@ -78,7 +78,7 @@
  * ------------------------------------------------------------------------ */
 
 /* True when o, or its handle, is NULL. */
-#define CMIsNullObject(o) ((o) == NULL || *((void **)(o)) == NULL)
+#define CMIsNullObject(o) ((o) == NULL || *((void**)(o)) == NULL)
 
 /* These take a CMPIData object, not a pointer. */
 #define CMIsNullValue(v) ((v.state) & CMPI_nullValue)
@@ -102,9 +102,9 @@
 #define CMNewDateTimeFromChars(b, d, rc) ((b)->eft->newDateTimeFromChars((b), (d), (rc)))
 #define CMNewSelectExp(b, q, l, p, rc) ((b)->eft->newSelectExp((b), (q), (l), (p), (rc)))
 #define CMClassPathIsA(b, p, pn, rc) ((b)->eft->classPathIsA((b), (p), (pn), (rc)))
-#define CDToString(b, o, rc) ((b)->eft->toString((b), (void *)(o), (rc)))
-#define CDIsOfType(b, o, t, rc) (b)->eft->isOfType((b), (void *)(o), (t), (rc))
-#define CDGetType(b, o, rc) ((b)->eft->getType((b), (void *)(o), (rc)))
+#define CDToString(b, o, rc) ((b)->eft->toString((b), (void*)(o), (rc)))
+#define CDIsOfType(b, o, t, rc) (b)->eft->isOfType((b), (void*)(o), (t), (rc))
+#define CDGetType(b, o, rc) ((b)->eft->getType((b), (void*)(o), (rc)))
 
 #ifdef CMPI_VER_85
 /* parms is a CMFmtArgsN(...) expansion: the count, then (type, value) pairs. */
@@ -135,8 +135,8 @@
 #define CMFmtUint64(v) CMPI_uint64, ((CMPIUint64)v)
 #define CMFmtReal(v) CMPI_real64, ((double)v)
 #define CMFmtBoolean(v) CMPI_boolean, ((int)v)
-#define CMFmtChars(v) CMPI_chars, ((char *)v)
-#define CMFmtString(v) CMPI_string, ((CMPIString *)v)
+#define CMFmtChars(v) CMPI_chars, ((char*)v)
+#define CMFmtString(v) CMPI_string, ((CMPIString*)v)
 
 #define CMFmtArgs0() 0
 #define CMFmtArgs1(v1) 1, v1
@@ -158,7 +158,7 @@
 
 #define CMGetProperty(i, n, rc) ((i)->ft->getProperty((i), (n), (rc)))
 #define CMGetPropertyAt(i, num, s, rc) ((i)->ft->getPropertyAt((i), (num), (s), (rc)))
-#define CMSetProperty(i, n, v, t) ((i)->ft->setProperty((i), (n), (CMPIValue *)(v), (t)))
+#define CMSetProperty(i, n, v, t) ((i)->ft->setProperty((i), (n), (CMPIValue*)(v), (t)))
 #define CMGetPropertyCount(i, rc) ((i)->ft->getPropertyCount((i), (rc)))
 #define CMGetObjectPath(i, rc) ((i)->ft->getObjectPath((i), (rc)))
 #ifdef CMPI_VER_100
@@ -167,7 +167,7 @@
 #define CMSetPropertyFilter(i, pl, k) ((i)->ft->setPropertyFilter((i), (pl), (k)))
 #ifdef CMPI_VER_200
 #define CMSetPropertyWithOrigin(i, n, v, t, o) \
-    ((i)->ft->setPropertyWithOrigin((i), (n), (CMPIValue *)(v), (t), (o)))
+    ((i)->ft->setPropertyWithOrigin((i), (n), (CMPIValue*)(v), (t), (o)))
 #endif
 
 /* ------------------------------------------------------------------------
@@ -180,7 +180,7 @@
 #define CMGetNameSpace(p, rc) ((p)->ft->getNameSpace((p), (rc)))
 #define CMSetClassName(p, n) ((p)->ft->setClassName((p), (n)))
 #define CMGetClassName(p, rc) ((p)->ft->getClassName((p), (rc)))
-#define CMAddKey(p, n, v, t) ((p)->ft->addKey((p), (n), (CMPIValue *)(v), (t)))
+#define CMAddKey(p, n, v, t) ((p)->ft->addKey((p), (n), (CMPIValue*)(v), (t)))
 #define CMGetKey(p, n, rc) ((p)->ft->getKey((p), (n), (rc)))
 #define CMGetKeyAt(p, i, n, rc) ((p)->ft->getKeyAt((p), (i), (n), (rc)))
 #define CMGetKeyCount(p, rc) ((p)->ft->getKeyCount((p), (rc)))
@@ -205,9 +205,9 @@
 #define CMGetArrayCount(a, rc) ((a)->ft->getSize((a), (rc)))
 #define CMGetArrayType(a, rc) ((a)->ft->getSimpleType((a), (rc)))
 #define CMGetArrayElementAt(a, n, rc) ((a)->ft->getElementAt((a), (n), (rc)))
-#define CMSetArrayElementAt(a, n, v, t) ((a)->ft->setElementAt((a), (n), (CMPIValue *)(v), (t)))
+#define CMSetArrayElementAt(a, n, v, t) ((a)->ft->setElementAt((a), (n), (CMPIValue*)(v), (t)))
 
-#define CMAddArg(a, n, v, t) ((a)->ft->addArg((a), (n), (CMPIValue *)(v), (t)))
+#define CMAddArg(a, n, v, t) ((a)->ft->addArg((a), (n), (CMPIValue*)(v), (t)))
 #define CMGetArg(a, n, rc) ((a)->ft->getArg((a), (n), (rc)))
 #define CMGetArgAt(a, p, n, rc) ((a)->ft->getArgAt((a), (p), (n), (rc)))
 #define CMGetArgCount(a, rc) ((a)->ft->getArgCount((a), (rc)))
@@ -260,7 +260,7 @@
 #define CMToArray(n, rc) ((n)->ft->toArray((n), (rc)))
 
 /* These only call the result slot; they do not return from the caller. */
-#define CMReturnData(r, v, t) ((r)->ft->returnData((r), (CMPIValue *)(v), (t)))
+#define CMReturnData(r, v, t) ((r)->ft->returnData((r), (CMPIValue*)(v), (t)))
 #define CMReturnInstance(r, i) ((r)->ft->returnInstance((r), (i)))
 #define CMReturnObjectPath(r, o) ((r)->ft->returnObjectPath((r), (o)))
 #define CMReturnDone(r) ((r)->ft->returnDone((r)))
@@ -271,7 +271,7 @@
 #define CMGetContextEntry(c, n, rc) ((c)->ft->getEntry((c), (n), (rc)))
 #define CMGetContextEntryAt(c, p, n, rc) ((c)->ft->getEntryAt((c), (p), (n), (rc)))
 #define CMGetContextEntryCount(c, rc) ((c)->ft->getEntryCount((c), (rc)))
-#define CMAddContextEntry(c, n, v, t) ((c)->ft->addEntry((c), (n), (CMPIValue *)(v), (t)))
+#define CMAddContextEntry(c, n, v, t) ((c)->ft->addEntry((c), (n), (CMPIValue*)(v), (t)))
 
 /* ------------------------------------------------------------------------
  * Query objects
@@ -295,7 +295,7 @@
 
 #define CMGetPredicateData(p, t, o, n, v) ((p)->ft->getData((p), (t), (o), (n), (v)))
 #if defined(CMPI_VER_87) && !defined(CMPI_VER_100)
-#define CMEvaluatePredicate(p, v, t, rc) ((p)->ft->evaluate((p), (CMPIValue *)(v), (t), (rc)))
+#define CMEvaluatePredicate(p, v, t, rc) ((p)->ft->evaluate((p), (CMPIValue*)(v), (t), (rc)))
 #endif
 #ifdef CMPI_VER_100
 #define CMEvaluatePredicateUsingAccessor(p, a, parm, rc) \
@@ -342,7 +342,7 @@
 #define CBInvokeMethod(b, c, p, m, ai, ao, rc) \
     ((b)->bft->invokeMethod((b), (c), (p), (m), (ai), (ao), (rc)))
 #define CBSetProperty(b, c, p, n, v, t) \
-    ((b)->bft->setProperty((b), (c), (p), (n), (CMPIValue *)(v), (t)))
+    ((b)->bft->setProperty((b), (c), (p), (n), (CMPIValue*)(v), (t)))
 #define CBGetProperty(b, c, p, n, rc) (b)->bft->getProperty((b), (c), (p), (n), (rc))
 
 /* ------------------------------------------------------------------------
@@ -367,8 +367,8 @@
         pfx##EnumInstanceNames,      pfx##EnumInstances,  pfx##GetInstance, pfx##CreateInstance,   \
         CMInstanceMIStubChange(pfx), pfx##DeleteInstance, pfx##ExecQuery,                          \
     };                                                                                             \
-    CMPI_EXTERN_C CMPIInstanceMI *pn##_Create_InstanceMI(const CMPIBroker *brkr,                   \
-                                                         const CMPIContext *ctx, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIInstanceMI* pn##_Create_InstanceMI(const CMPIBroker* brkr,                   \
+                                                         const CMPIContext* ctx, CMPIStatus* rc) { \
         static CMPIInstanceMI mi = {NULL, &instMIFT__};                                            \
         (void)ctx;                                                                                 \
         (void)rc;                                                                                  \
@@ -382,8 +382,8 @@
         CMPICurrentVersion, CMPICurrentVersion,   "association" #pn, pfx##AssociationCleanup, \
         pfx##Associators,   pfx##AssociatorNames, pfx##References,   pfx##ReferenceNames,     \
     };                                                                                        \
-    CMPI_EXTERN_C CMPIAssociationMI *pn##_Create_AssociationMI(                               \
-        const CMPIBroker *brkr, const CMPIContext *ctx, CMPIStatus *rc) {                     \
+    CMPI_EXTERN_C CMPIAssociationMI* pn##_Create_AssociationMI(                               \
+        const CMPIBroker* brkr, const CMPIContext* ctx, CMPIStatus* rc) {                     \
         static CMPIAssociationMI mi = {NULL, &assocMIFT__};                                   \
         (void)ctx;                                                                            \
         (void)rc;                                                                             \
@@ -398,8 +398,8 @@
             CMPICurrentVersion, CMPICurrentVersion, "method" #pn,                              \
             pfx##MethodCleanup, pfx##InvokeMethod,                                             \
     };                                                                                         \
-    CMPI_EXTERN_C CMPIMethodMI *pn##_Create_MethodMI(const CMPIBroker *brkr,                   \
-                                                     const CMPIContext *ctx, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIMethodMI* pn##_Create_MethodMI(const CMPIBroker* brkr,                   \
+                                                     const CMPIContext* ctx, CMPIStatus* rc) { \
         static CMPIMethodMI mi = {NULL, &methMIFT__};                                          \
         (void)ctx;                                                                             \
         (void)rc;                                                                              \
@@ -413,8 +413,8 @@
         CMPICurrentVersion,   CMPICurrentVersion, "property" #pn,                                  \
         pfx##PropertyCleanup, pfx##SetProperty,   pfx##GetProperty,                                \
     };                                                                                             \
-    CMPI_EXTERN_C CMPIPropertyMI *pn##_Create_PropertyMI(const CMPIBroker *brkr,                   \
-                                                         const CMPIContext *ctx, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIPropertyMI* pn##_Create_PropertyMI(const CMPIBroker* brkr,                   \
+                                                         const CMPIContext* ctx, CMPIStatus* rc) { \
         static CMPIPropertyMI mi = {NULL, &propMIFT__};                                            \
         (void)ctx;                                                                                 \
         (void)rc;                                                                                  \
@@ -434,8 +434,8 @@
         CMPICurrentVersion,     CMPICurrentVersion,    "Indication" #pn,                   \
         pfx##IndicationCleanup, pfx##AuthorizeFilter,  pfx##MustPoll,                      \
         pfx##ActivateFilter,    pfx##DeActivateFilter, CMIndicationMIStubExtensions(pfx)}; \
-    CMPI_EXTERN_C CMPIIndicationMI *pn##_Create_IndicationMI(                              \
-        const CMPIBroker *brkr, const CMPIContext *ctx, CMPIStatus *rc) {                  \
+    CMPI_EXTERN_C CMPIIndicationMI* pn##_Create_IndicationMI(                              \
+        const CMPIBroker* brkr, const CMPIContext* ctx, CMPIStatus* rc) {                  \
         static CMPIIndicationMI mi = {NULL, &indMIFT__};                                   \
         (void)ctx;                                                                         \
         (void)rc;                                                                          \
@@ -463,45 +463,45 @@
 
 #define CMProviderBase(pn) CmpiProviderBase base##pn;
 
-#define CMMIFactoryBody__(cn, pn, miType, ftVar)                      \
-    static miType mi;                                                 \
-    mi.ft = &ftVar;                                                   \
-    try {                                                             \
-        CmpiContext ctx((CMPIContext *)ctxp);                         \
-        CmpiBaseMI *provider = base##pn.getBaseMI();                  \
-        if (provider == 0) {                                          \
-            provider = new cn(CmpiBroker((CMPIBroker *)broker), ctx); \
-            provider->setProviderBase(&base##pn);                     \
-            CmpiStatus st = provider->initialize(ctx);                \
-            if (st.rc() != CMPI_RC_OK) {                              \
-                delete provider;                                      \
-                if (rc) {                                             \
-                    rc->rc = st.rc();                                 \
-                    rc->msg = CMNewString(broker, st.msg(), NULL);    \
-                }                                                     \
-                return NULL;                                          \
-            }                                                         \
-            base##pn.setBaseMI(provider);                             \
-        }                                                             \
-        mi.hdl = provider;                                            \
-    } catch (...) {                                                   \
-        if (rc) {                                                     \
-            rc->rc = CMPI_RC_ERR_FAILED;                              \
-            rc->msg = NULL;                                           \
-        }                                                             \
-        return NULL;                                                  \
-    }                                                                 \
-    base##pn.incUseCount();                                           \
+#define CMMIFactoryBody__(cn, pn, miType, ftVar)                     \
+    static miType mi;                                                \
+    mi.ft = &ftVar;                                                  \
+    try {                                                            \
+        CmpiContext ctx((CMPIContext*)ctxp);                         \
+        CmpiBaseMI* provider = base##pn.getBaseMI();                 \
+        if (provider == 0) {                                         \
+            provider = new cn(CmpiBroker((CMPIBroker*)broker), ctx); \
+            provider->setProviderBase(&base##pn);                    \
+            CmpiStatus st = provider->initialize(ctx);               \
+            if (st.rc() != CMPI_RC_OK) {                             \
+                delete provider;                                     \
+                if (rc) {                                            \
+                    rc->rc = st.rc();                                \
+                    rc->msg = CMNewString(broker, st.msg(), NULL);   \
+                }                                                    \
+                return NULL;                                         \
+            }                                                        \
+            base##pn.setBaseMI(provider);                            \
+        }                                                            \
+        mi.hdl = provider;                                           \
+    } catch (...) {                                                  \
+        if (rc) {                                                    \
+            rc->rc = CMPI_RC_ERR_FAILED;                             \
+            rc->msg = NULL;                                          \
+        }                                                            \
+        return NULL;                                                 \
+    }                                                                \
+    base##pn.incUseCount();                                          \
     return &mi;
 
 #define CMInstanceMIFactory(cn, pn)                                          \
-    CMPI_EXTERN_C CMPIInstanceMI *pn##_Create_InstanceMI(                    \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIInstanceMI* pn##_Create_InstanceMI(                    \
+        const CMPIBroker* broker, const CMPIContext* ctxp, CMPIStatus* rc) { \
         static CMPIInstanceMIFT instMIFT = {                                 \
             CMPICurrentVersion,                                              \
             CMPICurrentVersion,                                              \
             "instance" #pn,                                                  \
-            (CMPIStatus(*)(CMPIInstanceMI *, const CMPIContext *,            \
+            (CMPIStatus(*)(CMPIInstanceMI*, const CMPIContext*,              \
                            CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
             CmpiInstanceMI::driveEnumInstanceNames,                          \
             CmpiInstanceMI::driveEnumInstances,                              \
@@ -514,13 +514,13 @@
     }
 
 #define CMAssociationMIFactory(cn, pn)                                       \
-    CMPI_EXTERN_C CMPIAssociationMI *pn##_Create_AssociationMI(              \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIAssociationMI* pn##_Create_AssociationMI(              \
+        const CMPIBroker* broker, const CMPIContext* ctxp, CMPIStatus* rc) { \
         static CMPIAssociationMIFT assocMIFT = {                             \
             CMPICurrentVersion,                                              \
             CMPICurrentVersion,                                              \
             "association" #pn,                                               \
-            (CMPIStatus(*)(CMPIAssociationMI *, const CMPIContext *,         \
+            (CMPIStatus(*)(CMPIAssociationMI*, const CMPIContext*,           \
                            CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
             CmpiAssociationMI::driveAssociators,                             \
             CmpiAssociationMI::driveAssociatorNames,                         \
@@ -530,24 +530,24 @@
     }
 
 #define CMMethodMIFactory(cn, pn)                                                               \
-    CMPI_EXTERN_C CMPIMethodMI *pn##_Create_MethodMI(const CMPIBroker *broker,                  \
-                                                     const CMPIContext *ctxp, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIMethodMI* pn##_Create_MethodMI(const CMPIBroker* broker,                  \
+                                                     const CMPIContext* ctxp, CMPIStatus* rc) { \
         static CMPIMethodMIFT methMIFT = {                                                      \
             CMPICurrentVersion, CMPICurrentVersion, "method" #pn,                               \
-            (CMPIStatus(*)(CMPIMethodMI *, const CMPIContext *,                                 \
+            (CMPIStatus(*)(CMPIMethodMI*, const CMPIContext*,                                   \
                            CMPIBoolean))CmpiBaseMI::driveBaseCleanup,                           \
             CmpiMethodMI::driveInvokeMethod};                                                   \
         CMMIFactoryBody__(cn, pn, CMPIMethodMI, methMIFT)                                       \
     }
 
 #define CMPropertyMIFactory(cn, pn)                                          \
-    CMPI_EXTERN_C CMPIPropertyMI *pn##_Create_PropertyMI(                    \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIPropertyMI* pn##_Create_PropertyMI(                    \
+        const CMPIBroker* broker, const CMPIContext* ctxp, CMPIStatus* rc) { \
         static CMPIPropertyMIFT propMIFT = {                                 \
             CMPICurrentVersion,                                              \
             CMPICurrentVersion,                                              \
             "property" #pn,                                                  \
-            (CMPIStatus(*)(CMPIPropertyMI *, const CMPIContext *,            \
+            (CMPIStatus(*)(CMPIPropertyMI*, const CMPIContext*,              \
                            CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
             CmpiPropertyMI::driveSetProperty,                                \
             CmpiPropertyMI::driveGetProperty};                               \
@@ -562,13 +562,13 @@
 #endif
 
 #define CMIndicationMIFactory(cn, pn)                                        \
-    CMPI_EXTERN_C CMPIIndicationMI *pn##_Create_IndicationMI(                \
-        const CMPIBroker *broker, const CMPIContext *ctxp, CMPIStatus *rc) { \
+    CMPI_EXTERN_C CMPIIndicationMI* pn##_Create_IndicationMI(                \
+        const CMPIBroker* broker, const CMPIContext* ctxp, CMPIStatus* rc) { \
         static CMPIIndicationMIFT indMIFT = {                                \
             CMPICurrentVersion,                                              \
             CMPICurrentVersion,                                              \
             "indication" #pn,                                                \
-            (CMPIStatus(*)(CMPIIndicationMI *, const CMPIContext *,          \
+            (CMPIStatus(*)(CMPIIndicationMI*, const CMPIContext*,            \
                            CMPIBoolean))CmpiBaseMI::driveBaseCleanup,        \
             CmpiIndicationMI::driveAuthorizeFilter,                          \
             CmpiIndicationMI::driveMustPoll,                                 \

@@ -24,39 +24,39 @@
     CMPIIndicationMI *mi, const CMPIContext *ctx, const CMPISelectExp *f, const char *cn, \
         const CMPIObjectPath *op
 
-static const CMPIBroker *stubBroker;
+static const CMPIBroker* stubBroker;
 static int hookRuns;
 
-PROBE(Cleanup, CMPIInstanceMI *mi, const CMPIContext *ctx, CMPIBoolean t)
+PROBE(Cleanup, CMPIInstanceMI* mi, const CMPIContext* ctx, CMPIBoolean t)
 PROBE(EnumInstanceNames, MI_ARGS(CMPIInstanceMI))
-PROBE(EnumInstances, MI_ARGS(CMPIInstanceMI), const char **p)
-PROBE(GetInstance, MI_ARGS(CMPIInstanceMI), const char **p)
-PROBE(CreateInstance, MI_ARGS(CMPIInstanceMI), const CMPIInstance *i)
-PROBE(ModifyInstance, MI_ARGS(CMPIInstanceMI), const CMPIInstance *i, const char **p)
+PROBE(EnumInstances, MI_ARGS(CMPIInstanceMI), const char** p)
+PROBE(GetInstance, MI_ARGS(CMPIInstanceMI), const char** p)
+PROBE(CreateInstance, MI_ARGS(CMPIInstanceMI), const CMPIInstance* i)
+PROBE(ModifyInstance, MI_ARGS(CMPIInstanceMI), const CMPIInstance* i, const char** p)
 PROBE(DeleteInstance, MI_ARGS(CMPIInstanceMI))
-PROBE(ExecQuery, MI_ARGS(CMPIInstanceMI), const char *q, const char *l)
+PROBE(ExecQuery, MI_ARGS(CMPIInstanceMI), const char* q, const char* l)
 CMInstanceMIStub(Probe, TvrnProbe, stubBroker, hookRuns++)
 
-    PROBE(MethodCleanup, CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBoolean t)
-        PROBE(InvokeMethod, MI_ARGS(CMPIMethodMI), const char *m, const CMPIArgs *in,
-              CMPIArgs *out) CMMethodMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
+    PROBE(MethodCleanup, CMPIMethodMI* mi, const CMPIContext* ctx, CMPIBoolean t)
+        PROBE(InvokeMethod, MI_ARGS(CMPIMethodMI), const char* m, const CMPIArgs* in,
+              CMPIArgs* out) CMMethodMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
 
-            PROBE(IndicationCleanup, CMPIIndicationMI *mi, const CMPIContext *ctx,
-                  CMPIBoolean t) PROBE(AuthorizeFilter, IND_ARGS, const char *owner)
+            PROBE(IndicationCleanup, CMPIIndicationMI* mi, const CMPIContext* ctx,
+                  CMPIBoolean t) PROBE(AuthorizeFilter, IND_ARGS, const char* owner)
                 PROBE(MustPoll, IND_ARGS) PROBE(ActivateFilter, IND_ARGS, CMPIBoolean first)
                     PROBE(DeActivateFilter, IND_ARGS, CMPIBoolean last)
-                        PROBE(EnableIndications, CMPIIndicationMI *mi, const CMPIContext *ctx)
-                            PROBE(DisableIndications, CMPIIndicationMI *mi, const CMPIContext *ctx)
+                        PROBE(EnableIndications, CMPIIndicationMI* mi, const CMPIContext* ctx)
+                            PROBE(DisableIndications, CMPIIndicationMI* mi, const CMPIContext* ctx)
                                 CMIndicationMIStub(Probe, TvrnProbe, stubBroker, CMNoHook)
 
                                     struct tvrn_abi_stub_probe
-    tvrn_abi_run_c_stubs(const void *broker) {
+    tvrn_abi_run_c_stubs(const void* broker) {
     struct tvrn_abi_stub_probe probe;
     hookRuns = 0;
     stubBroker = NULL;
-    probe.instanceMI = TvrnProbe_Create_InstanceMI((const CMPIBroker *)broker, NULL, NULL);
-    probe.indicationMI = TvrnProbe_Create_IndicationMI((const CMPIBroker *)broker, NULL, NULL);
-    probe.methodMI = TvrnProbe_Create_MethodMI((const CMPIBroker *)broker, NULL, NULL);
+    probe.instanceMI = TvrnProbe_Create_InstanceMI((const CMPIBroker*)broker, NULL, NULL);
+    probe.indicationMI = TvrnProbe_Create_IndicationMI((const CMPIBroker*)broker, NULL, NULL);
+    probe.methodMI = TvrnProbe_Create_MethodMI((const CMPIBroker*)broker, NULL, NULL);
     probe.brokerSeen = stubBroker;
     probe.hookRuns = hookRuns;
     return probe;

@@ -12,20 +12,20 @@
 
 // Compile time: the table, as in abi_c.c, with the slot signatures. The short
 // names of the signature parameters:
-using B = const CMPIBroker *;
-using C = const CMPIContext *;
-using OP = const CMPIObjectPath *;
-using P = CMPIObjectPath *;
-using R = const CMPIResult *;
-using I = const CMPIInstance *;
-using A = const CMPIArgs *;
-using E = const CMPIError *;
-using V = const CMPIValue *;
-using S = const char *;
-using PL = const char **;
-using ST = CMPIStatus *;
-using CI = CMPIIndicationMI *;
-using SE = const CMPISelectExp *;
+using B = const CMPIBroker*;
+using C = const CMPIContext*;
+using OP = const CMPIObjectPath*;
+using P = CMPIObjectPath*;
+using R = const CMPIResult*;
+using I = const CMPIInstance*;
+using A = const CMPIArgs*;
+using E = const CMPIError*;
+using V = const CMPIValue*;
+using S = const char*;
+using PL = const char**;
+using ST = CMPIStatus*;
+using CI = CMPIIndicationMI*;
+using SE = const CMPISelectExp*;
 #define ABI_SIZE(T, n) static_assert(sizeof(T) == (n), "sizeof " #T);
 #define ABI_OFFSET(T, m, n) static_assert(offsetof(T, m) == (n), "offsetof " #T "." #m);
 #define ABI_SLOT(T, m, k) static_assert(offsetof(T, m) == 8 * (k), "slot " #T "." #m);
@@ -34,7 +34,7 @@ using SE = const CMPISelectExp *;
     static_assert(std::is_same<decltype(T::m), Ret(*) __VA_ARGS__>::value, "signature " #T "." #m);
 #define ABI_CONST(name, v) static_assert((name) == (v), "value of " #name);
 #include "tests/cmpi_abi/abi_table.inc"
-static_assert(std::is_same<CMPIAccessor, CMPIData(const char *, void *)>::value,
+static_assert(std::is_same<CMPIAccessor, CMPIData(const char*, void*)>::value,
               "CMPIAccessor is a function type");
 
 // Switches of the default build and names that must not exist.
@@ -54,8 +54,9 @@ static_assert(std::is_same<CMPIAccessor, CMPIData(const char *, void *)>::value,
 // Context entry names are their own names.
 #define ENTRY_NAME(n) static_assert(std::string_view(n) == #n, #n);
 ENTRY_NAME(CMPIPrincipal)
-ENTRY_NAME(CMPIInvocationFlags) ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRole)
-    ENTRY_NAME(CMPIAcceptLanguage) ENTRY_NAME(CMPIContentLanguage)
+ENTRY_NAME(CMPIInvocationFlags)
+ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRole) ENTRY_NAME(CMPIAcceptLanguage)
+    ENTRY_NAME(CMPIContentLanguage)
 
     // Run time: the stub macros and the macros that are easy to get subtly wrong.
     namespace {
@@ -65,46 +66,46 @@ ENTRY_NAME(CMPIInvocationFlags) ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRol
         EXPECT_EQ(p.brokerSeen, &fakeBroker);
         EXPECT_EQ(p.hookRuns, 1);
 
-        auto *inst = static_cast<const CMPIInstanceMI *>(p.instanceMI);
+        auto* inst = static_cast<const CMPIInstanceMI*>(p.instanceMI);
         ASSERT_NE(inst, nullptr);
         EXPECT_EQ(inst->hdl, nullptr);
         EXPECT_EQ(inst->ft->ftVersion, 200);
         EXPECT_EQ(inst->ft->miVersion, 200);
         EXPECT_STREQ(inst->ft->miName, "instanceTvrnProbe");
         EXPECT_NE(inst->ft->modifyInstance, nullptr);
-        auto *ind = static_cast<const CMPIIndicationMI *>(p.indicationMI);
+        auto* ind = static_cast<const CMPIIndicationMI*>(p.indicationMI);
         EXPECT_STREQ(ind->ft->miName, "IndicationTvrnProbe");
         EXPECT_NE(ind->ft->enableIndications, nullptr);
         EXPECT_NE(ind->ft->disableIndications, nullptr);
-        EXPECT_STREQ(static_cast<const CMPIMethodMI *>(p.methodMI)->ft->miName, "methodTvrnProbe");
+        EXPECT_STREQ(static_cast<const CMPIMethodMI*>(p.methodMI)->ft->miName, "methodTvrnProbe");
         // A provider built for 1.00 gets 1.00 tables.
         EXPECT_EQ(tvrn_abi_v100_stub_mi_version(), 100);
     }
 
-    const char *seen[2];
+    const char* seen[2];
 
-    CMPIEnumeration *recExecQuery(B, C, OP, const char *query, const char *lang, ST) {
+    CMPIEnumeration* recExecQuery(B, C, OP, const char* query, const char* lang, ST) {
         seen[0] = query, seen[1] = lang;
         return nullptr;
     }
-    CMPIEnumeration *recReferences(B, C, OP, const char *resultClass, const char *role, PL, ST) {
+    CMPIEnumeration* recReferences(B, C, OP, const char* resultClass, const char* role, PL, ST) {
         seen[0] = resultClass, seen[1] = role;
         return nullptr;
     }
-    const char *recGetCharPtr(const CMPIString *, CMPIStatus *rc) {
+    const char* recGetCharPtr(const CMPIString*, CMPIStatus* rc) {
         seen[0] = rc == nullptr ? "null-rc" : "rc";
         return "text";
     }
-    CMPIStatus recReturnDone(const CMPIResult *) {
+    CMPIStatus recReturnDone(const CMPIResult*) {
         return CMPIStatus{CMPI_RC_ERR_FAILED, nullptr};
     }
 
     CMPIStatus returnsThroughCMReturnWithChars() {
-        const CMPIBroker *none = nullptr;
+        const CMPIBroker* none = nullptr;
         CMReturnWithChars(none, CMPI_RC_ERR_NOT_FOUND, "ignored");
     }
 
-    int afterReturnData(const CMPIResult *r) {
+    int afterReturnData(const CMPIResult* r) {
         CMReturnDone(r);  // an expression: execution goes on
         return 7;
     }
@@ -115,7 +116,7 @@ ENTRY_NAME(CMPIInvocationFlags) ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRol
         bft.references = recReferences;
         CMPIBroker broker{};
         broker.bft = &bft;
-        const CMPIBroker *b = &broker;
+        const CMPIBroker* b = &broker;
 
         CBExecQuery(b, nullptr, nullptr, "fourth", "fifth", nullptr);
         EXPECT_STREQ(seen[0], "fourth");  // goes to `query`
@@ -128,7 +129,7 @@ ENTRY_NAME(CMPIInvocationFlags) ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRol
     TEST(CmpiAbi, StatusAndResultMacros) {
         CMPIStringFT sft{};
         sft.getCharPtr = recGetCharPtr;
-        CMPIString s{reinterpret_cast<void *>(1), &sft};
+        CMPIString s{reinterpret_cast<void*>(1), &sft};
         EXPECT_STREQ(CMGetCharPtr(&s), "text");
         EXPECT_STREQ(seen[0], "null-rc");
 
@@ -136,11 +137,11 @@ ENTRY_NAME(CMPIInvocationFlags) ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRol
         EXPECT_EQ(st.rc, CMPI_RC_ERR_NOT_FOUND);
         EXPECT_EQ(st.msg, nullptr);
 
-        CMPIStatus set{CMPI_RC_OK, reinterpret_cast<CMPIString *>(&s)};
+        CMPIStatus set{CMPI_RC_OK, reinterpret_cast<CMPIString*>(&s)};
         CMSetStatus(&set, CMPI_RC_ERR_ACCESS_DENIED);
         EXPECT_EQ(set.rc, CMPI_RC_ERR_ACCESS_DENIED);
         EXPECT_EQ(set.msg, nullptr);
-        CMPIStatus *none = nullptr;
+        CMPIStatus* none = nullptr;
         CMSetStatus(none, CMPI_RC_ERR_FAILED);  // tolerated
 
         CMPIResultFT rft{};
@@ -148,7 +149,7 @@ ENTRY_NAME(CMPIInvocationFlags) ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRol
         CMPIResult r{nullptr, &rft};
         EXPECT_EQ(afterReturnData(&r), 7);
 
-        EXPECT_TRUE(CMIsNullObject(static_cast<CMPIResult *>(nullptr)));
+        EXPECT_TRUE(CMIsNullObject(static_cast<CMPIResult*>(nullptr)));
         EXPECT_TRUE(CMIsNullObject(&r));  // null handle
         EXPECT_FALSE(CMIsNullObject(&s));
 

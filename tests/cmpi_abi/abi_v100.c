@@ -34,13 +34,13 @@ V100(offsetof(CMPIPredicateFT, evaluateUsingAccessor), 32)
 V100(CMPICurrentVersion, 100)
 
 #pragma GCC diagnostic ignored "-Wunused-parameter"
-static const CMPIBroker *v100Broker;
-static CMPIStatus V100MethodCleanup(CMPIMethodMI *mi, const CMPIContext *ctx, CMPIBoolean t) {
+static const CMPIBroker* v100Broker;
+static CMPIStatus V100MethodCleanup(CMPIMethodMI* mi, const CMPIContext* ctx, CMPIBoolean t) {
     CMReturn(CMPI_RC_OK);
 }
-static CMPIStatus V100InvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx, const CMPIResult *rslt,
-                                   const CMPIObjectPath *op, const char *m, const CMPIArgs *in,
-                                   CMPIArgs *out) {
+static CMPIStatus V100InvokeMethod(CMPIMethodMI* mi, const CMPIContext* ctx, const CMPIResult* rslt,
+                                   const CMPIObjectPath* op, const char* m, const CMPIArgs* in,
+                                   CMPIArgs* out) {
     CMReturn(CMPI_RC_OK);
 }
 CMMethodMIStub(V100, TvrnV100, v100Broker, CMNoHook)

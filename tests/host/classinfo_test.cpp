@@ -13,7 +13,7 @@ using namespace tvrnhost;
 namespace {
 
 TEST(RepositoryClasses, AnAssociationWithItsQualifiers) {
-    const Meta_Class *mc = find_meta_class(&__meta_repository, "CIM_Component");
+    const Meta_Class* mc = find_meta_class(&__meta_repository, "CIM_Component");
     ASSERT_NE(mc, nullptr);
     EXPECT_EQ(classinfo::classMof(*mc),
               "[Abstract, Aggregation, Association]\n"
@@ -25,8 +25,8 @@ TEST(RepositoryClasses, AnAssociationWithItsQualifiers) {
 
 // A root class with a feature of every kind and a default of every storage
 // form, and a subclass of it.
-const Meta_Value_Scalar<const char *> kText = {"say \"hi\""};
-const Meta_Value_Scalar<const char *> kWait = {"00000000000500.000000:000"};
+const Meta_Value_Scalar<const char*> kText = {"say \"hi\""};
+const Meta_Value_Scalar<const char*> kWait = {"00000000000500.000000:000"};
 const Meta_Value_Scalar<boolean> kOn = {true};
 const Meta_Value_Scalar<char16> kLetter = {char16('x')};
 const Meta_Value_Scalar<real32> kRatio = {0.25f};
@@ -34,14 +34,14 @@ const Meta_Value_Scalar<sint8> kLow = {-3};
 const Meta_Value_Scalar<uint64> kHigh = {18446744073709551615ull};
 const uint16 kCodes[] = {2, 3, 5};
 const Meta_Value_Array<uint16> kCodesDefault = {kCodes, 3};
-const char *const kNames[] = {"a", "b"};
-const Meta_Value_Array<const char *> kNamesDefault = {kNames, 2};
-const char *const kTimes[] = {"20240101000000.000000+000"};
-const Meta_Value_Array<const char *> kTimesDefault = {kTimes, 1};
+const char* const kNames[] = {"a", "b"};
+const Meta_Value_Array<const char*> kNamesDefault = {kNames, 2};
+const char* const kTimes[] = {"20240101000000.000000+000"};
+const Meta_Value_Array<const char*> kTimesDefault = {kTimes, 1};
 const Meta_Value_Array<uint8> kNoBytes = {nullptr, 0};
 
-Meta_Property property(uint32 flags, const char *name, uint16 type, sint16 subscript,
-                       const void *value = nullptr) {
+Meta_Property property(uint32 flags, const char* name, uint16 type, sint16 subscript,
+                       const void* value = nullptr) {
     return {0,
             FLAG_PROPERTY | flags,
             name,
@@ -50,14 +50,14 @@ Meta_Property property(uint32 flags, const char *name, uint16 type, sint16 subsc
             type,
             subscript,
             0,
-            static_cast<const Meta_Value *>(value)};
+            static_cast<const Meta_Value*>(value)};
 }
 
 extern const Meta_Class kRoot;
 
 template <class T>
-const Meta_Feature *feature(const T &record) {
-    return reinterpret_cast<const Meta_Feature *>(&record);
+const Meta_Feature* feature(const T& record) {
+    return reinterpret_cast<const Meta_Feature*>(&record);
 }
 
 const Meta_Property kId = property(FLAG_KEY | FLAG_REQUIRED, "Id", STRING, 0);
@@ -82,14 +82,14 @@ const Meta_Reference kInto = {
     0, FLAG_REFERENCE | FLAG_IN | FLAG_EMBEDDED_INSTANCE, "Into", nullptr, 0, -1, &kRoot, 0};
 const Meta_Property kCounts = property(FLAG_IN | FLAG_OUT, "Counts", UINT64, -1);
 const Meta_Property kReturn = property(FLAG_OUT, "return_value", SINT32, 0);
-const Meta_Feature *const kRunParams[] = {feature(kMode), feature(kResult), feature(kInto),
+const Meta_Feature* const kRunParams[] = {feature(kMode), feature(kResult), feature(kInto),
                                           feature(kCounts), feature(kReturn)};
 const Meta_Method kRun = {
     0, FLAG_METHOD | FLAG_EXPERIMENTAL | FLAG_STATIC, "Run", nullptr, 0, kRunParams, 5, 0, SINT32};
-const Meta_Feature *const kNoParams[] = {feature(kReturn)};
+const Meta_Feature* const kNoParams[] = {feature(kReturn)};
 const Meta_Method kStop = {0, FLAG_METHOD, "Stop", nullptr, 0, kNoParams, 1, 0, SINT32};
 
-const Meta_Feature *const kRootFeatures[] = {
+const Meta_Feature* const kRootFeatures[] = {
     feature(kId),      feature(kTextP),  feature(kWaitP),  feature(kOnP),
     feature(kLetterP), feature(kRatioP), feature(kLowP),   feature(kHighP),
     feature(kCodesP),  feature(kNamesP), feature(kTimesP), feature(kBytesP),
@@ -105,7 +105,7 @@ const Meta_Class kRoot = {0,           FLAG_CLASS | FLAG_ABSTRACT | FLAG_INDICAT
                           1,           &kRepository};
 const Meta_Class kLeaf = {0, FLAG_CLASS, "Test_Leaf", nullptr, 0, nullptr,
                           0, 0,          nullptr,     &kRoot,  0, &kRepository};
-const Meta_Class *const kClasses[] = {&kRoot, &kLeaf};
+const Meta_Class* const kClasses[] = {&kRoot, &kLeaf};
 const Meta_Repository kRepository = {kClasses, 2};
 
 TEST(ClassMof, EveryKindOfFeatureAndDefault) {

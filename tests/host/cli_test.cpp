@@ -26,7 +26,7 @@ std::vector<std::string> withModule(std::vector<std::string> args) {
     return args;
 }
 
-Output runCli(const std::vector<std::string> &args, const cli::Defaults &d = {}) {
+Output runCli(const std::vector<std::string>& args, const cli::Defaults& d = {}) {
     std::ostringstream out, err;
     const int st = cli::run(withModule(args), out, err, d);
     return Output{st, out.str(), err.str()};
@@ -35,7 +35,7 @@ Output runCli(const std::vector<std::string> &args, const cli::Defaults &d = {})
 // Commands against one loaded host, so that changes persist between them.
 class CliSession : public HostFixture {
 protected:
-    Output exec(const std::vector<std::string> &args) {
+    Output exec(const std::vector<std::string>& args) {
         std::ostringstream out, err;
         const int st = cli::execute(*host, cli::parseInvocation(withModule(args), {}), out, err);
         return Output{st, out.str(), err.str()};
@@ -58,14 +58,14 @@ TEST(Cli, PrintsInstancesAsMofWithThePropertiesAskedFor) {
 TEST(Cli, AFailedRequestIsOneLineWithTheStatusCode) {
     struct Case {
         std::vector<std::string> args;
-        const char *line;
+        const char* line;
     } cases[] = {
         {{"gi", "Test_Widget.Id=\"zz\""}, "tvrncli: CMPI_RC_ERR_NOT_FOUND (6): no widget zz\n"},
         {{"ei", "Nope"},
          "tvrncli: CMPI_RC_ERR_INVALID_CLASS (5): class Nope is not served in root/test\n"},
         {{"di", "Test_Widget.Id=\"zz\""}, "tvrncli: CMPI_RC_ERR_NOT_FOUND (6)\n"},
     };
-    for (const auto &c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.line);
         Output o = runCli(c.args);
         EXPECT_EQ(o.status, 1);
@@ -90,8 +90,8 @@ TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage) {
     const std::string pathNote = "PATH: [//host/][namespace:]Class.Key=";
     struct Case {
         std::vector<std::string> args;
-        const char *message;
-        const char *usage;  // the usage line that follows, if any
+        const char* message;
+        const char* usage;  // the usage line that follows, if any
     } cases[] = {
         {{"gi", "1bad"}, "tvrncli: malformed object path '1bad': bad class name", "gi PATH"},
         {{"cm", "Test_Widget.Id=", "Echo"}, "tvrncli: malformed object path", "cm PATH METHOD"},
@@ -106,7 +106,7 @@ TEST(Cli, MisuseExitsWithTwoAndTheCommandsUsage) {
          "ri PATH"},
         {{"frobnicate"}, "tvrncli: unknown command 'frobnicate'", nullptr},
     };
-    for (const auto &c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.message);
         Output o = runCli(c.args);
         EXPECT_EQ(o.status, 2);
@@ -206,10 +206,10 @@ TEST(Cli, SeedsTheStoreFromAFile) {
     std::remove(seed.c_str());
 }
 
-Output runProgram(const std::string &args) {
+Output runProgram(const std::string& args) {
     const std::string cmd = std::string(TVRN_TEST_BUILD_DIR) + "/bin/tvrncli " + args + " 2>&1";
     Output o{-1, "", ""};
-    FILE *p = popen(cmd.c_str(), "r");
+    FILE* p = popen(cmd.c_str(), "r");
     if (!p)
         return o;
     char buf[4096];
@@ -221,7 +221,7 @@ Output runProgram(const std::string &args) {
     return o;
 }
 
-size_t lineCount(const std::string &s) {
+size_t lineCount(const std::string& s) {
     return std::count(s.begin(), s.end(), '\n');
 }
 

@@ -13,7 +13,7 @@ using Concurrency = HostFixture;
 TEST_F(Concurrency, ParallelRequestsAllSucceed) {
     constexpr int kThreads = 4, kRounds = 40;
     std::atomic<int> failures{0};
-    auto check = [&](const Status &st) {
+    auto check = [&](const Status& st) {
         if (!st.ok()) {
             ++failures;
             ADD_FAILURE() << st.toString();
@@ -43,7 +43,7 @@ TEST_F(Concurrency, ParallelRequestsAllSucceed) {
             }
         });
     }
-    for (auto &th : threads)
+    for (auto& th : threads)
         th.join();
     EXPECT_EQ(failures.load(), 0);
     auto left = host->enumerateInstanceNames(kNs, "Test_Widget");

@@ -15,9 +15,9 @@ namespace hosttest {
 
 using namespace tvrnhost;
 
-inline const char *kNs = "root/test";
+inline const char* kNs = "root/test";
 
-inline ObjectPath path(const std::string &text) {
+inline ObjectPath path(const std::string& text) {
     ObjectPath p = ObjectPath::parse(text);
     if (p.nameSpace().empty())
         p.setNameSpace(kNs);
@@ -47,10 +47,10 @@ protected:
     // What the provider library counted so far (while it is loaded).
     static tvrntest_counters counters() {
         tvrntest_counters c{};
-        void *h = dlopen(TVRN_TESTPROV_LIB, RTLD_NOW | RTLD_NOLOAD);
+        void* h = dlopen(TVRN_TESTPROV_LIB, RTLD_NOW | RTLD_NOLOAD);
         if (!h)
             return c;
-        if (auto *p = static_cast<tvrntest_counters *>(dlsym(h, "tvrntest_counters")))
+        if (auto* p = static_cast<tvrntest_counters*>(dlsym(h, "tvrntest_counters")))
             c = *p;
         dlclose(h);
         return c;

@@ -32,7 +32,7 @@ TEST_F(Requests, EnumeratesInstancesWithTypedProperties) {
 TEST_F(Requests, PropertyListFiltersEverythingButKeys) {
     auto r = host->enumerateInstances(kNs, "Test_Widget", std::vector<std::string>{"size"});
     ASSERT_TRUE(r.ok());
-    for (const auto &i : r.items) {
+    for (const auto& i : r.items) {
         EXPECT_EQ(i.properties().size(), 2u) << i;
         EXPECT_TRUE(i.get("Id") && i.get("Size"));
     }
@@ -58,7 +58,7 @@ TEST_F(Requests, ReferencesCarryReferenceKeys) {
     auto r = host->references(path("Test_Gadget.Name=\"g1\""), "Test_WidgetGadget", "Gadget");
     ASSERT_TRUE(r.ok()) << r.toString();
     ASSERT_EQ(r.items.size(), 2u);
-    const Instance &link = r.items[0];
+    const Instance& link = r.items[0];
     EXPECT_EQ(link.path().key("Widget")->type(), Type::Reference);
     EXPECT_EQ(*link.get("Gadget"), Value::reference(path("Test_Gadget.Name=\"g1\"")));
     EXPECT_EQ(*link.get("Strength"), Value::uint8(1));
@@ -87,7 +87,7 @@ TEST_F(Requests, MethodArgumentsRoundTripEveryKindOfValue) {
     ASSERT_TRUE(r.ok()) << r.toString();
     EXPECT_EQ(r.returnValue, Value::uint32(static_cast<std::uint32_t>(in.size())));
     ASSERT_EQ(r.out.size(), in.size());
-    for (const auto &p : in) {
+    for (const auto& p : in) {
         SCOPED_TRACE(p.name);
         ASSERT_TRUE(r.outArg(p.name));
         EXPECT_EQ(*r.outArg(p.name), p.value);
@@ -187,9 +187,9 @@ TEST_F(ReleaseRules, RequestObjectsAreFreedWhenTheRequestEndsClonesOutliveIt) {
 
 using Indications = HostFixture;
 
-size_t countIn(const std::vector<Indication> &inds, const std::string &ns) {
+size_t countIn(const std::vector<Indication>& inds, const std::string& ns) {
     return static_cast<size_t>(std::count_if(
-        inds.begin(), inds.end(), [&](const Indication &i) { return i.nameSpace == ns; }));
+        inds.begin(), inds.end(), [&](const Indication& i) { return i.nameSpace == ns; }));
 }
 
 TEST_F(Indications, DeliveredFromAnAttachedProviderThreadToActiveNamespaces) {
@@ -202,7 +202,7 @@ TEST_F(Indications, DeliveredFromAnAttachedProviderThreadToActiveNamespaces) {
     auto inds = host->indications();
     EXPECT_EQ(countIn(inds, kNs), 6u);
     EXPECT_EQ(countIn(inds, "root/other"), 3u);
-    const Instance &first = inds[0].instance;
+    const Instance& first = inds[0].instance;
     EXPECT_EQ(first.className(), "Test_Alert");
     EXPECT_EQ(*first.get("Seq"), Value::uint32(1));
     EXPECT_EQ(*first.get("Message"), Value::string("alert 1"));
@@ -241,7 +241,7 @@ TEST_F(Lifecycle, NonTerminatingCleanupHonoursDoNotUnload) {
 
     auto refused = host->cleanup(false);
     ASSERT_EQ(refused.size(), 2u);
-    for (const auto &r : refused)
+    for (const auto& r : refused)
         EXPECT_EQ(r.rc, CMPI_RC_DO_NOT_UNLOAD) << r.provider << " " << r.kind;
     ASSERT_TRUE(host->invokeMethod(w1, "AllowUnload").ok());  // same MIs still in use
     EXPECT_EQ(counters().factoryCalls, factories);
@@ -250,7 +250,7 @@ TEST_F(Lifecycle, NonTerminatingCleanupHonoursDoNotUnload) {
     ASSERT_EQ(agreed.size(), 2u);
     EXPECT_EQ(agreed[0].kind, "method");  // reverse order of creation
     EXPECT_EQ(agreed[1].kind, "instance");
-    for (const auto &r : agreed)
+    for (const auto& r : agreed)
         EXPECT_EQ(r.rc, CMPI_RC_OK);
     EXPECT_TRUE(host->cleanup(false).empty());
 
@@ -290,7 +290,7 @@ TEST(HostLoad, KeepMappedLeavesTheLibraryLoaded) {
         ASSERT_TRUE(h.load(TVRN_TESTPROV_LIB, TVRN_TESTPROV_REG).ok());
         ASSERT_TRUE(h.unload().ok());
     }
-    void *handle = dlopen(TVRN_TESTPROV_LIB, RTLD_NOW | RTLD_NOLOAD);
+    void* handle = dlopen(TVRN_TESTPROV_LIB, RTLD_NOW | RTLD_NOLOAD);
     EXPECT_NE(handle, nullptr);
     if (handle) {
         dlclose(handle);  // ours

@@ -11,7 +11,7 @@ TEST(MofValue, EveryKindOfScalar) {
     const DateTime when = *DateTime::parse("20240101120000.000000+060");
     struct Case {
         Value value;
-        const char *mof;
+        const char* mof;
     } cases[] = {
         {Value::boolean(true), "true"},
         {Value::sint8(-128), "-128"},
@@ -33,7 +33,7 @@ TEST(MofValue, EveryKindOfScalar) {
          "\"root/t:A.Id=\\\"1\\\",N=2\""},
         {Value::null(Type::Uint16), "NULL"},
     };
-    for (const auto &c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.mof);
         EXPECT_EQ(mofValue(c.value), c.mof);
     }

@@ -4,7 +4,7 @@
 #include <strings.h>
 
 CMPI_EXPORT struct tvrntest_counters tvrntest_counters;
-const CMPIBroker *tp_broker;
+const CMPIBroker* tp_broker;
 int tp_forbidUnload;
 
 static CMPI_MUTEX_TYPE mutex;
@@ -27,7 +27,7 @@ void tp_unlock(void) {
     tp_broker->xft->unlockMutex(tp_mutex());
 }
 
-void tp_init(const CMPIBroker *b) {
+void tp_init(const CMPIBroker* b) {
     if (!liveMIs)
         tp_broker = b;
     tvrntest_counters.factoryCalls++;
@@ -35,7 +35,7 @@ void tp_init(const CMPIBroker *b) {
     tp_widgetsReset(1);
 }
 
-const char *tp_key(const CMPIObjectPath *op, const char *name) {
+const char* tp_key(const CMPIObjectPath* op, const char* name) {
     CMPIStatus rc;
     CMPIData d = CMGetKey(op, name, &rc);
     if (rc.rc != CMPI_RC_OK || d.type != CMPI_string || CMIsNullValue(d))
@@ -43,17 +43,17 @@ const char *tp_key(const CMPIObjectPath *op, const char *name) {
     return CMGetCharsPtr(d.value.string, NULL);
 }
 
-const char *tp_ns(const CMPIObjectPath *op) {
-    CMPIString *ns = CMGetNameSpace(op, NULL);
+const char* tp_ns(const CMPIObjectPath* op) {
+    CMPIString* ns = CMGetNameSpace(op, NULL);
     return ns ? CMGetCharsPtr(ns, NULL) : "";
 }
 
-const char *tp_class(const CMPIObjectPath *op) {
-    CMPIString *cn = CMGetClassName(op, NULL);
+const char* tp_class(const CMPIObjectPath* op) {
+    CMPIString* cn = CMGetClassName(op, NULL);
     return cn ? CMGetCharsPtr(cn, NULL) : "";
 }
 
-int tp_listed(const char **props, const char *name) {
+int tp_listed(const char** props, const char* name) {
     if (!props)
         return 1;
     for (; *props; ++props)
@@ -62,19 +62,19 @@ int tp_listed(const char **props, const char *name) {
     return 0;
 }
 
-CMPIObjectPath *tp_widgetPath(const char *id, const char *ns) {
-    CMPIObjectPath *op = CMNewObjectPath(tp_broker, ns, "Test_Widget", NULL);
+CMPIObjectPath* tp_widgetPath(const char* id, const char* ns) {
+    CMPIObjectPath* op = CMNewObjectPath(tp_broker, ns, "Test_Widget", NULL);
     CMAddKey(op, "Id", id, CMPI_chars);
     return op;
 }
 
-CMPIObjectPath *tp_gadgetPath(const char *name, const char *ns) {
-    CMPIObjectPath *op = CMNewObjectPath(tp_broker, ns, "Test_Gadget", NULL);
+CMPIObjectPath* tp_gadgetPath(const char* name, const char* ns) {
+    CMPIObjectPath* op = CMNewObjectPath(tp_broker, ns, "Test_Gadget", NULL);
     CMAddKey(op, "Name", name, CMPI_chars);
     return op;
 }
 
-CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating) {
+CMPIStatus tp_cleanup(const CMPIContext* ctx, CMPIBoolean terminating) {
     if (!terminating && tp_forbidUnload)
         CMReturn(CMPI_RC_DO_NOT_UNLOAD);
     tp_alertsStop();

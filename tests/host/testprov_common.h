@@ -19,7 +19,7 @@ extern CMPI_EXPORT struct tvrntest_counters tvrntest_counters;
  * store the broker on each call, so each source has a variable of its own
  * and shared code reads tp_broker, which is written only while no provider
  * thread can be running. */
-extern const CMPIBroker *tp_broker;
+extern const CMPIBroker* tp_broker;
 /* Set by the ForbidUnload method: non-terminating cleanups refuse. */
 extern int tp_forbidUnload;
 
@@ -29,10 +29,10 @@ void tp_unlock(void);
 CMPI_MUTEX_TYPE tp_mutex(void);
 
 /* Factory hook and cleanup of every MI. */
-void tp_init(const CMPIBroker *b);
-CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating);
+void tp_init(const CMPIBroker* b);
+CMPIStatus tp_cleanup(const CMPIContext* ctx, CMPIBoolean terminating);
 #define TP_CLEANUP(name, kind)                                                          \
-    static CMPIStatus name(CMPI##kind##MI *mi, const CMPIContext *ctx, CMPIBoolean t) { \
+    static CMPIStatus name(CMPI##kind##MI* mi, const CMPIContext* ctx, CMPIBoolean t) { \
         return tp_cleanup(ctx, t);                                                      \
     }
 
@@ -42,12 +42,12 @@ CMPIStatus tp_cleanup(const CMPIContext *ctx, CMPIBoolean terminating);
         CMReturn(CMPI_RC_ERR_NOT_SUPPORTED); \
     }
 
-const char *tp_key(const CMPIObjectPath *op, const char *name);
-const char *tp_ns(const CMPIObjectPath *op);
-const char *tp_class(const CMPIObjectPath *op);
-int tp_listed(const char **props, const char *name);
-CMPIObjectPath *tp_widgetPath(const char *id, const char *ns);
-CMPIObjectPath *tp_gadgetPath(const char *name, const char *ns);
+const char* tp_key(const CMPIObjectPath* op, const char* name);
+const char* tp_ns(const CMPIObjectPath* op);
+const char* tp_class(const CMPIObjectPath* op);
+int tp_listed(const char** props, const char* name);
+CMPIObjectPath* tp_widgetPath(const char* id, const char* ns);
+CMPIObjectPath* tp_gadgetPath(const char* name, const char* ns);
 
 /* Per-class state kept across requests (widget table, alert thread). */
 void tp_widgetsReset(int ready);

@@ -7,17 +7,17 @@
 #include <string.h>
 #include <strings.h>
 
-static const CMPIBroker *mib; /* written by this file's factories (see tp_init) */
+static const CMPIBroker* mib; /* written by this file's factories (see tp_init) */
 
 static const struct {
-    const char *name;
+    const char* name;
     CMPIUint32 weight;
 } gadgets[] = {{"g1", 5}, {"g2", 7}};
 #define NGADGETS (sizeof gadgets / sizeof gadgets[0])
 
-static CMPIInstance *gadgetInstance(size_t i, const char *ns, const char **props) {
-    static const char *keys[] = {"Name", NULL};
-    CMPIInstance *ci = CMNewInstance(tp_broker, tp_gadgetPath(gadgets[i].name, ns), NULL);
+static CMPIInstance* gadgetInstance(size_t i, const char* ns, const char** props) {
+    static const char* keys[] = {"Name", NULL};
+    CMPIInstance* ci = CMNewInstance(tp_broker, tp_gadgetPath(gadgets[i].name, ns), NULL);
     if (props)
         CMSetPropertyFilter(ci, props, keys);
     CMSetProperty(ci, "Name", gadgets[i].name, CMPI_chars);
@@ -27,8 +27,8 @@ static CMPIInstance *gadgetInstance(size_t i, const char *ns, const char **props
 
 TP_CLEANUP(GadgetCleanup, Instance)
 
-static CMPIStatus GadgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                          const CMPIResult *rslt, const CMPIObjectPath *op) {
+static CMPIStatus GadgetEnumInstanceNames(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                          const CMPIResult* rslt, const CMPIObjectPath* op) {
     size_t i;
     for (i = 0; i < NGADGETS; ++i)
         CMReturnObjectPath(rslt, tp_gadgetPath(gadgets[i].name, tp_ns(op)));
@@ -36,9 +36,9 @@ static CMPIStatus GadgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext 
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus GadgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                      const CMPIResult *rslt, const CMPIObjectPath *op,
-                                      const char **props) {
+static CMPIStatus GadgetEnumInstances(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                      const CMPIResult* rslt, const CMPIObjectPath* op,
+                                      const char** props) {
     size_t i;
     for (i = 0; i < NGADGETS; ++i)
         CMReturnInstance(rslt, gadgetInstance(i, tp_ns(op), props));
@@ -46,10 +46,10 @@ static CMPIStatus GadgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus GadgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                    const CMPIResult *rslt, const CMPIObjectPath *op,
-                                    const char **props) {
-    const char *name = tp_key(op, "Name");
+static CMPIStatus GadgetGetInstance(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                    const CMPIResult* rslt, const CMPIObjectPath* op,
+                                    const char** props) {
+    const char* name = tp_key(op, "Name");
     size_t i;
     for (i = 0; name && i < NGADGETS; ++i)
         if (strcmp(gadgets[i].name, name) == 0) {
@@ -60,19 +60,19 @@ static CMPIStatus GadgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
     CMReturn(CMPI_RC_ERR_NOT_FOUND);
 }
 
-TP_NOT_SUPPORTED(GadgetCreateInstance, CMPIInstanceMI *mi, const CMPIContext *ctx,
-                 const CMPIResult *rslt, const CMPIObjectPath *op, const CMPIInstance *ci)
+TP_NOT_SUPPORTED(GadgetCreateInstance, CMPIInstanceMI* mi, const CMPIContext* ctx,
+                 const CMPIResult* rslt, const CMPIObjectPath* op, const CMPIInstance* ci)
 
-TP_NOT_SUPPORTED(GadgetModifyInstance, CMPIInstanceMI *mi, const CMPIContext *ctx,
-                 const CMPIResult *rslt, const CMPIObjectPath *op, const CMPIInstance *ci,
-                 const char **props)
+TP_NOT_SUPPORTED(GadgetModifyInstance, CMPIInstanceMI* mi, const CMPIContext* ctx,
+                 const CMPIResult* rslt, const CMPIObjectPath* op, const CMPIInstance* ci,
+                 const char** props)
 
-TP_NOT_SUPPORTED(GadgetDeleteInstance, CMPIInstanceMI *mi, const CMPIContext *ctx,
-                 const CMPIResult *rslt, const CMPIObjectPath *op)
+TP_NOT_SUPPORTED(GadgetDeleteInstance, CMPIInstanceMI* mi, const CMPIContext* ctx,
+                 const CMPIResult* rslt, const CMPIObjectPath* op)
 
-TP_NOT_SUPPORTED(GadgetExecQuery, CMPIInstanceMI *mi, const CMPIContext *ctx,
-                 const CMPIResult *rslt, const CMPIObjectPath *op, const char *query,
-                 const char *lang)
+TP_NOT_SUPPORTED(GadgetExecQuery, CMPIInstanceMI* mi, const CMPIContext* ctx,
+                 const CMPIResult* rslt, const CMPIObjectPath* op, const char* query,
+                 const char* lang)
 
 CMInstanceMIStub(Gadget, Test_Gadget_Provider, mib, tp_init(mib))
 
@@ -83,20 +83,20 @@ CMInstanceMIStub(Gadget, Test_Gadget_Provider, mib, tp_init(mib))
 } links[] = {{"w1", "g1"}, {"w1", "g2"}, {"w2", "g1"}};
 #define NLINKS (sizeof links / sizeof links[0])
 
-static CMPIObjectPath *linkPath(size_t i, const char *ns) {
-    CMPIObjectPath *op = CMNewObjectPath(tp_broker, ns, "Test_WidgetGadget", NULL);
-    CMPIObjectPath *w = tp_widgetPath(links[i].widget, ns);
-    CMPIObjectPath *g = tp_gadgetPath(links[i].gadget, ns);
+static CMPIObjectPath* linkPath(size_t i, const char* ns) {
+    CMPIObjectPath* op = CMNewObjectPath(tp_broker, ns, "Test_WidgetGadget", NULL);
+    CMPIObjectPath* w = tp_widgetPath(links[i].widget, ns);
+    CMPIObjectPath* g = tp_gadgetPath(links[i].gadget, ns);
     CMAddKey(op, "Widget", &w, CMPI_ref);
     CMAddKey(op, "Gadget", &g, CMPI_ref);
     return op;
 }
 
-static CMPIInstance *linkInstance(size_t i, const char *ns, const char **props) {
-    static const char *keys[] = {"Widget", "Gadget", NULL};
-    CMPIInstance *ci = CMNewInstance(tp_broker, linkPath(i, ns), NULL);
-    CMPIObjectPath *w = tp_widgetPath(links[i].widget, ns);
-    CMPIObjectPath *g = tp_gadgetPath(links[i].gadget, ns);
+static CMPIInstance* linkInstance(size_t i, const char* ns, const char** props) {
+    static const char* keys[] = {"Widget", "Gadget", NULL};
+    CMPIInstance* ci = CMNewInstance(tp_broker, linkPath(i, ns), NULL);
+    CMPIObjectPath* w = tp_widgetPath(links[i].widget, ns);
+    CMPIObjectPath* g = tp_gadgetPath(links[i].gadget, ns);
     CMPIUint8 strength = (CMPIUint8)(i + 1);
     if (props)
         CMSetPropertyFilter(ci, props, keys);
@@ -108,10 +108,10 @@ static CMPIInstance *linkInstance(size_t i, const char *ns, const char **props) 
 
 /* The other end of link i, or NULL when the link does not refer to the
  * source in the role asked for (any role when NULL). */
-static CMPIObjectPath *otherEnd(size_t i, const CMPIObjectPath *src, const char *role) {
+static CMPIObjectPath* otherEnd(size_t i, const CMPIObjectPath* src, const char* role) {
     const char *cls = tp_class(src), *ns = tp_ns(src);
     int isWidget = strcasecmp(cls, "Test_Widget") == 0;
-    const char *key = tp_key(src, isWidget ? "Id" : "Name");
+    const char* key = tp_key(src, isWidget ? "Id" : "Name");
     if (!isWidget && strcasecmp(cls, "Test_Gadget") != 0)
         return NULL;
     if (!key || strcmp(key, isWidget ? links[i].widget : links[i].gadget) != 0)
@@ -123,15 +123,15 @@ static CMPIObjectPath *otherEnd(size_t i, const CMPIObjectPath *src, const char 
 
 TP_CLEANUP(LinkAssociationCleanup, Association)
 
-static CMPIStatus LinkAssociators(CMPIAssociationMI *mi, const CMPIContext *ctx,
-                                  const CMPIResult *rslt, const CMPIObjectPath *op,
-                                  const char *assocClass, const char *resultClass, const char *role,
-                                  const char *resultRole, const char **props) {
+static CMPIStatus LinkAssociators(CMPIAssociationMI* mi, const CMPIContext* ctx,
+                                  const CMPIResult* rslt, const CMPIObjectPath* op,
+                                  const char* assocClass, const char* resultClass, const char* role,
+                                  const char* resultRole, const char** props) {
     size_t i;
     for (i = 0; i < NLINKS; ++i) {
-        CMPIObjectPath *other = otherEnd(i, op, role);
+        CMPIObjectPath* other = otherEnd(i, op, role);
         CMPIStatus rc;
-        CMPIInstance *ci;
+        CMPIInstance* ci;
         if (!other)
             continue;
         /* The full instance comes from the provider of the other end. */
@@ -144,13 +144,13 @@ static CMPIStatus LinkAssociators(CMPIAssociationMI *mi, const CMPIContext *ctx,
     CMReturn(CMPI_RC_OK);
 }
 
-TP_NOT_SUPPORTED(LinkAssociatorNames, CMPIAssociationMI *mi, const CMPIContext *ctx,
-                 const CMPIResult *rslt, const CMPIObjectPath *op, const char *assocClass,
-                 const char *resultClass, const char *role, const char *resultRole)
+TP_NOT_SUPPORTED(LinkAssociatorNames, CMPIAssociationMI* mi, const CMPIContext* ctx,
+                 const CMPIResult* rslt, const CMPIObjectPath* op, const char* assocClass,
+                 const char* resultClass, const char* role, const char* resultRole)
 
-static CMPIStatus LinkReferences(CMPIAssociationMI *mi, const CMPIContext *ctx,
-                                 const CMPIResult *rslt, const CMPIObjectPath *op,
-                                 const char *resultClass, const char *role, const char **props) {
+static CMPIStatus LinkReferences(CMPIAssociationMI* mi, const CMPIContext* ctx,
+                                 const CMPIResult* rslt, const CMPIObjectPath* op,
+                                 const char* resultClass, const char* role, const char** props) {
     size_t i;
     for (i = 0; i < NLINKS; ++i)
         if (otherEnd(i, op, role))
@@ -159,9 +159,9 @@ static CMPIStatus LinkReferences(CMPIAssociationMI *mi, const CMPIContext *ctx,
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus LinkReferenceNames(CMPIAssociationMI *mi, const CMPIContext *ctx,
-                                     const CMPIResult *rslt, const CMPIObjectPath *op,
-                                     const char *resultClass, const char *role) {
+static CMPIStatus LinkReferenceNames(CMPIAssociationMI* mi, const CMPIContext* ctx,
+                                     const CMPIResult* rslt, const CMPIObjectPath* op,
+                                     const char* resultClass, const char* role) {
     size_t i;
     for (i = 0; i < NLINKS; ++i)
         if (otherEnd(i, op, role))
@@ -186,13 +186,13 @@ static const CMPIUint32 kBurst = 3;
 static CMPIUint32 seq;
 
 /* One alert to every namespace with an active filter. */
-static void deliverAlert(const CMPIContext *ctx) {
+static void deliverAlert(const CMPIContext* ctx) {
     int i;
     ++seq;
     for (i = 0; i < MAX_NS; ++i) {
-        CMPIObjectPath *op;
-        CMPIInstance *ci;
-        CMPIDateTime *now;
+        CMPIObjectPath* op;
+        CMPIInstance* ci;
+        CMPIDateTime* now;
         char msg[32];
         if (!activeNs[i].count)
             continue;
@@ -209,8 +209,8 @@ static void deliverAlert(const CMPIContext *ctx) {
 
 /* Delivers a burst of alerts after every filter activation until told to
  * stop. Runs attached to the broker with the context prepared for it. */
-static CMPI_THREAD_RETURN CMPI_THREAD_CDECL alertMain(void *arg) {
-    const CMPIContext *ctx = (const CMPIContext *)arg;
+static CMPI_THREAD_RETURN CMPI_THREAD_CDECL alertMain(void* arg) {
+    const CMPIContext* ctx = (const CMPIContext*)arg;
     CMPIUint32 i;
     CBAttachThread(tp_broker, ctx);
     tp_lock();
@@ -250,20 +250,20 @@ void tp_alertsStop(void) {
 
 TP_CLEANUP(AlertIndicationCleanup, Indication)
 
-static CMPIStatus AlertAuthorizeFilter(CMPIIndicationMI *mi, const CMPIContext *ctx,
-                                       const CMPISelectExp *filter, const char *cls,
-                                       const CMPIObjectPath *op, const char *owner) {
+static CMPIStatus AlertAuthorizeFilter(CMPIIndicationMI* mi, const CMPIContext* ctx,
+                                       const CMPISelectExp* filter, const char* cls,
+                                       const CMPIObjectPath* op, const char* owner) {
     tvrntest_counters.authorizeCalls++;
     CMReturn(strcasecmp(cls, "Test_Alert") == 0 ? CMPI_RC_OK : CMPI_RC_ERR_INVALID_CLASS);
 }
 
-TP_NOT_SUPPORTED(AlertMustPoll, CMPIIndicationMI *mi, const CMPIContext *ctx,
-                 const CMPISelectExp *filter, const char *cls, const CMPIObjectPath *op)
+TP_NOT_SUPPORTED(AlertMustPoll, CMPIIndicationMI* mi, const CMPIContext* ctx,
+                 const CMPISelectExp* filter, const char* cls, const CMPIObjectPath* op)
 
-static CMPIStatus AlertActivateFilter(CMPIIndicationMI *mi, const CMPIContext *ctx,
-                                      const CMPISelectExp *filter, const char *cls,
-                                      const CMPIObjectPath *op, CMPIBoolean first) {
-    const char *ns = tp_ns(op);
+static CMPIStatus AlertActivateFilter(CMPIIndicationMI* mi, const CMPIContext* ctx,
+                                      const CMPISelectExp* filter, const char* cls,
+                                      const CMPIObjectPath* op, CMPIBoolean first) {
+    const char* ns = tp_ns(op);
     int i, slot = -1;
     if (!CMEvaluateSelExp(filter, NULL, NULL))
         CMReturn(CMPI_RC_ERR_INVALID_QUERY);
@@ -282,10 +282,10 @@ static CMPIStatus AlertActivateFilter(CMPIIndicationMI *mi, const CMPIContext *c
     CMReturn(slot >= 0 ? CMPI_RC_OK : CMPI_RC_ERR_FAILED);
 }
 
-static CMPIStatus AlertDeActivateFilter(CMPIIndicationMI *mi, const CMPIContext *ctx,
-                                        const CMPISelectExp *filter, const char *cls,
-                                        const CMPIObjectPath *op, CMPIBoolean last) {
-    const char *ns = tp_ns(op);
+static CMPIStatus AlertDeActivateFilter(CMPIIndicationMI* mi, const CMPIContext* ctx,
+                                        const CMPISelectExp* filter, const char* cls,
+                                        const CMPIObjectPath* op, CMPIBoolean last) {
+    const char* ns = tp_ns(op);
     int i;
     tp_lock();
     tvrntest_counters.deactivateCalls++;
@@ -297,8 +297,8 @@ static CMPIStatus AlertDeActivateFilter(CMPIIndicationMI *mi, const CMPIContext 
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus AlertEnableIndications(CMPIIndicationMI *mi, const CMPIContext *ctx) {
-    CMPIContext *threadCtx = CBPrepareAttachThread(tp_broker, ctx);
+static CMPIStatus AlertEnableIndications(CMPIIndicationMI* mi, const CMPIContext* ctx) {
+    CMPIContext* threadCtx = CBPrepareAttachThread(tp_broker, ctx);
     tp_lock();
     tvrntest_counters.enableCalls++;
     alertStop = 0;
@@ -309,7 +309,7 @@ static CMPIStatus AlertEnableIndications(CMPIIndicationMI *mi, const CMPIContext
     CMReturn(alertRunning ? CMPI_RC_OK : CMPI_RC_ERR_FAILED);
 }
 
-static CMPIStatus AlertDisableIndications(CMPIIndicationMI *mi, const CMPIContext *ctx) {
+static CMPIStatus AlertDisableIndications(CMPIIndicationMI* mi, const CMPIContext* ctx) {
     tvrntest_counters.disableCalls++;
     tp_alertsStop();
     CMReturn(CMPI_RC_OK);

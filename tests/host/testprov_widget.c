@@ -5,7 +5,7 @@
 #include <string.h>
 #include <strings.h>
 
-static const CMPIBroker *mib; /* written by this file's factories (see tp_init) */
+static const CMPIBroker* mib; /* written by this file's factories (see tp_init) */
 
 typedef struct {
     int used;
@@ -24,7 +24,7 @@ typedef struct {
 #define MAX_WIDGETS 16
 static Widget widgets[MAX_WIDGETS];
 static int tableReady;
-static CMPIInstance *kept; /* a clone that outlives its request */
+static CMPIInstance* kept; /* a clone that outlives its request */
 
 /* Called with `ready` 1 by every factory (fills the table once) and with 0
  * by cleanup (the next factory starts afresh). */
@@ -48,7 +48,7 @@ void tp_widgetsReset(int ready) {
     tp_unlock();
 }
 
-static Widget *findWidget(const char *id) {
+static Widget* findWidget(const char* id) {
     int i;
     for (i = 0; id && i < MAX_WIDGETS; ++i)
         if (widgets[i].used && strcmp(widgets[i].id, id) == 0)
@@ -56,10 +56,10 @@ static Widget *findWidget(const char *id) {
     return NULL;
 }
 
-static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char **props) {
-    static const char *keys[] = {"Id", NULL};
-    CMPIInstance *ci = CMNewInstance(tp_broker, tp_widgetPath(w->id, ns), NULL);
-    CMPIDateTime *created = CMNewDateTimeFromBinary(tp_broker, w->created, 0, NULL);
+static CMPIInstance* widgetInstance(const Widget* w, const char* ns, const char** props) {
+    static const char* keys[] = {"Id", NULL};
+    CMPIInstance* ci = CMNewInstance(tp_broker, tp_widgetPath(w->id, ns), NULL);
+    CMPIDateTime* created = CMNewDateTimeFromBinary(tp_broker, w->created, 0, NULL);
     int i;
     if (props)
         CMSetPropertyFilter(ci, props, keys);
@@ -76,7 +76,7 @@ static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char 
     if (w->ntags < 0) {
         CMSetProperty(ci, "Tags", NULL, CMPI_stringA);
     } else {
-        CMPIArray *a = CMNewArray(tp_broker, (CMPICount)w->ntags, CMPI_string, NULL);
+        CMPIArray* a = CMNewArray(tp_broker, (CMPICount)w->ntags, CMPI_string, NULL);
         for (i = 0; i < w->ntags; ++i)
             CMSetArrayElementAt(a, (CMPICount)i, w->tags[i], CMPI_chars);
         CMSetProperty(ci, "Tags", &a, CMPI_stringA);
@@ -85,7 +85,7 @@ static CMPIInstance *widgetInstance(const Widget *w, const char *ns, const char 
 }
 
 /* Copies the properties of `ci` named in `props` (all when NULL) into w. */
-static void updateWidget(Widget *w, const CMPIInstance *ci, const char **props) {
+static void updateWidget(Widget* w, const CMPIInstance* ci, const char** props) {
     CMPIStatus rc;
     CMPIData d = CMGetProperty(ci, "Count", &rc);
     if (rc.rc == CMPI_RC_OK && tp_listed(props, "Count"))
@@ -103,8 +103,8 @@ static void updateWidget(Widget *w, const CMPIInstance *ci, const char **props) 
 
 TP_CLEANUP(WidgetCleanup, Instance)
 
-static CMPIStatus WidgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                          const CMPIResult *rslt, const CMPIObjectPath *op) {
+static CMPIStatus WidgetEnumInstanceNames(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                          const CMPIResult* rslt, const CMPIObjectPath* op) {
     int i;
     tp_lock();
     for (i = 0; i < MAX_WIDGETS; ++i)
@@ -115,9 +115,9 @@ static CMPIStatus WidgetEnumInstanceNames(CMPIInstanceMI *mi, const CMPIContext 
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus WidgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                      const CMPIResult *rslt, const CMPIObjectPath *op,
-                                      const char **props) {
+static CMPIStatus WidgetEnumInstances(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                      const CMPIResult* rslt, const CMPIObjectPath* op,
+                                      const char** props) {
     int i;
     tp_lock();
     for (i = 0; i < MAX_WIDGETS; ++i)
@@ -128,10 +128,10 @@ static CMPIStatus WidgetEnumInstances(CMPIInstanceMI *mi, const CMPIContext *ctx
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus WidgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                    const CMPIResult *rslt, const CMPIObjectPath *op,
-                                    const char **props) {
-    Widget *w;
+static CMPIStatus WidgetGetInstance(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                    const CMPIResult* rslt, const CMPIObjectPath* op,
+                                    const char** props) {
+    Widget* w;
     char msg[64];
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
@@ -146,10 +146,10 @@ static CMPIStatus WidgetGetInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus WidgetCreateInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                       const CMPIResult *rslt, const CMPIObjectPath *op,
-                                       const CMPIInstance *ci) {
-    const char *id = tp_key(op, "Id");
+static CMPIStatus WidgetCreateInstance(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                       const CMPIResult* rslt, const CMPIObjectPath* op,
+                                       const CMPIInstance* ci) {
+    const char* id = tp_key(op, "Id");
     CMPIrc rc = CMPI_RC_ERR_FAILED;
     int i;
     if (!id)
@@ -160,7 +160,7 @@ static CMPIStatus WidgetCreateInstance(CMPIInstanceMI *mi, const CMPIContext *ct
     } else {
         for (i = 0; i < MAX_WIDGETS && rc != CMPI_RC_OK; ++i)
             if (!widgets[i].used) {
-                Widget *w = &widgets[i];
+                Widget* w = &widgets[i];
                 memset(w, 0, sizeof *w);
                 w->used = w->labelNull = 1;
                 w->ntags = -1;
@@ -177,10 +177,10 @@ static CMPIStatus WidgetCreateInstance(CMPIInstanceMI *mi, const CMPIContext *ct
     CMReturn(CMPI_RC_OK);
 }
 
-static CMPIStatus WidgetModifyInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                       const CMPIResult *rslt, const CMPIObjectPath *op,
-                                       const CMPIInstance *ci, const char **props) {
-    Widget *w;
+static CMPIStatus WidgetModifyInstance(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                       const CMPIResult* rslt, const CMPIObjectPath* op,
+                                       const CMPIInstance* ci, const char** props) {
+    Widget* w;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
     if (w)
@@ -190,9 +190,9 @@ static CMPIStatus WidgetModifyInstance(CMPIInstanceMI *mi, const CMPIContext *ct
     CMReturn(w ? CMPI_RC_OK : CMPI_RC_ERR_NOT_FOUND);
 }
 
-static CMPIStatus WidgetDeleteInstance(CMPIInstanceMI *mi, const CMPIContext *ctx,
-                                       const CMPIResult *rslt, const CMPIObjectPath *op) {
-    Widget *w;
+static CMPIStatus WidgetDeleteInstance(CMPIInstanceMI* mi, const CMPIContext* ctx,
+                                       const CMPIResult* rslt, const CMPIObjectPath* op) {
+    Widget* w;
     tp_lock();
     w = findWidget(tp_key(op, "Id"));
     if (w)
@@ -202,9 +202,9 @@ static CMPIStatus WidgetDeleteInstance(CMPIInstanceMI *mi, const CMPIContext *ct
     CMReturn(w ? CMPI_RC_OK : CMPI_RC_ERR_NOT_FOUND);
 }
 
-TP_NOT_SUPPORTED(WidgetExecQuery, CMPIInstanceMI *mi, const CMPIContext *ctx,
-                 const CMPIResult *rslt, const CMPIObjectPath *op, const char *query,
-                 const char *lang)
+TP_NOT_SUPPORTED(WidgetExecQuery, CMPIInstanceMI* mi, const CMPIContext* ctx,
+                 const CMPIResult* rslt, const CMPIObjectPath* op, const char* query,
+                 const char* lang)
 
 CMInstanceMIStub(Widget, Test_Widget_Provider, mib, tp_init(mib))
 
@@ -212,18 +212,18 @@ CMInstanceMIStub(Widget, Test_Widget_Provider, mib, tp_init(mib))
 
     TP_CLEANUP(WidgetMethodCleanup, Method)
 
-        static CMPIStatus returnValue(const CMPIResult *rslt, const void *value, CMPIType type) {
+        static CMPIStatus returnValue(const CMPIResult* rslt, const void* value, CMPIType type) {
     CMReturnData(rslt, value, type);
     CMReturnDone(rslt);
     CMReturn(CMPI_RC_OK);
 }
 
 /* Returns every input argument unchanged as an output argument. */
-static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArgs *out) {
+static CMPIStatus methodEcho(const CMPIResult* rslt, const CMPIArgs* in, CMPIArgs* out) {
     CMPICount i, n = CMGetArgCount(in, NULL);
     CMPIUint32 count = n;
     for (i = 0; i < n; ++i) {
-        CMPIString *name;
+        CMPIString* name;
         CMPIData d = CMGetArgAt(in, i, &name, NULL);
         CMAddArg(out, CMGetCharsPtr(name, NULL), CMIsNullValue(d) ? NULL : &d.value, d.type);
     }
@@ -231,10 +231,10 @@ static CMPIStatus methodEcho(const CMPIResult *rslt, const CMPIArgs *in, CMPIArg
 }
 
 /* Up-call: an instance that the host keeps in its store. */
-static CMPIStatus methodReadManager(const CMPIContext *ctx, const CMPIResult *rslt) {
+static CMPIStatus methodReadManager(const CMPIContext* ctx, const CMPIResult* rslt) {
     CMPIStatus rc;
-    CMPIObjectPath *op = CMNewObjectPath(tp_broker, "root/interop", "Test_Manager", NULL);
-    CMPIInstance *ci;
+    CMPIObjectPath* op = CMNewObjectPath(tp_broker, "root/interop", "Test_Manager", NULL);
+    CMPIInstance* ci;
     CMPIData d;
     CMAddKey(op, "Name", "mgr", CMPI_chars);
     ci = CBGetInstance(tp_broker, ctx, op, NULL, &rc);
@@ -245,11 +245,11 @@ static CMPIStatus methodReadManager(const CMPIContext *ctx, const CMPIResult *rs
 }
 
 /* Up-call: another provider's class, served re-entrantly. */
-static CMPIStatus methodCountGadgets(const CMPIContext *ctx, const CMPIResult *rslt,
-                                     const CMPIObjectPath *self) {
+static CMPIStatus methodCountGadgets(const CMPIContext* ctx, const CMPIResult* rslt,
+                                     const CMPIObjectPath* self) {
     CMPIStatus rc;
-    CMPIObjectPath *op = CMNewObjectPath(tp_broker, tp_ns(self), "Test_Gadget", NULL);
-    CMPIEnumeration *en = CBEnumInstances(tp_broker, ctx, op, NULL, &rc);
+    CMPIObjectPath* op = CMNewObjectPath(tp_broker, tp_ns(self), "Test_Gadget", NULL);
+    CMPIEnumeration* en = CBEnumInstances(tp_broker, ctx, op, NULL, &rc);
     CMPIUint32 n = 0;
     if (!en)
         return rc;
@@ -263,15 +263,15 @@ static CMPIStatus methodCountGadgets(const CMPIContext *ctx, const CMPIResult *r
 }
 
 /* Makes objects and leaves them to the broker's end-of-request cleanup. */
-static CMPIStatus methodScratch(const CMPIResult *rslt) {
+static CMPIStatus methodScratch(const CMPIResult* rslt) {
     int i;
-    char *mem;
-    CMPIGcStat *mark;
+    char* mem;
+    CMPIGcStat* mark;
     for (i = 0; i < 10; ++i)
         CMNewString(tp_broker, "scratch", NULL);
     CMNewArray(tp_broker, 3, CMPI_instance, NULL);
     CMNewArgs(tp_broker, NULL);
-    mem = (char *)tp_broker->mft->cmpiMalloc(tp_broker, 64);
+    mem = (char*)tp_broker->mft->cmpiMalloc(tp_broker, 64);
     strcpy(mem, "left for the broker");
     mark = tp_broker->mft->mark(tp_broker, NULL);
     CMNewString(tp_broker, "released with the mark", NULL);
@@ -280,9 +280,9 @@ static CMPIStatus methodScratch(const CMPIResult *rslt) {
     return returnValue(rslt, mem, CMPI_chars);
 }
 
-static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
-                                     const CMPIResult *rslt, const CMPIObjectPath *op,
-                                     const char *method, const CMPIArgs *in, CMPIArgs *out) {
+static CMPIStatus WidgetInvokeMethod(CMPIMethodMI* mi, const CMPIContext* ctx,
+                                     const CMPIResult* rslt, const CMPIObjectPath* op,
+                                     const char* method, const CMPIArgs* in, CMPIArgs* out) {
     if (strcasecmp(method, "Echo") == 0)
         return methodEcho(rslt, in, out);
     if (strcasecmp(method, "WhoAmI") == 0) {
@@ -296,7 +296,7 @@ static CMPIStatus WidgetInvokeMethod(CMPIMethodMI *mi, const CMPIContext *ctx,
     if (strcasecmp(method, "Scratch") == 0)
         return methodScratch(rslt);
     if (strcasecmp(method, "KeepClone") == 0) {
-        CMPIInstance *ci = CMNewInstance(tp_broker, tp_widgetPath("kept", tp_ns(op)), NULL);
+        CMPIInstance* ci = CMNewInstance(tp_broker, tp_widgetPath("kept", tp_ns(op)), NULL);
         CMSetProperty(ci, "Label", "kept across requests", CMPI_chars);
         tp_lock();
         if (kept)

@@ -23,7 +23,7 @@ TEST(ObjectPathText, ParsesEveryFormAndPrintsKeysSorted) {
         {"X.N=5,M=-3,B=true,R=2.5,Q=\"say \\\"hi\\\"\"", "", "", "X",
          "X.B=TRUE,M=-3,N=5,Q=\"say \\\"hi\\\"\",R=2.5", 5},
     };
-    for (const auto &c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.in);
         ObjectPath p = ObjectPath::parse(c.in);
         EXPECT_EQ(p.host(), c.host);
@@ -49,7 +49,7 @@ TEST(ObjectPathText, KeyTypesAndReferenceKeys) {
 }
 
 TEST(ObjectPathText, RejectsMalformedPaths) {
-    for (const char *bad : {"", "//host", "//host/Class.K=1", ":C", "root:1Class", "C.K",
+    for (const char* bad : {"", "//host", "//host/Class.K=1", ":C", "root:1Class", "C.K",
                             "C.K=", "C.K=bare", "C.K=\"open", "C.K=1,K=2", "C.K=1 junk"}) {
         SCOPED_TRACE(bad);
         EXPECT_THROW(ObjectPath::parse(bad), ParseError);
@@ -108,7 +108,7 @@ TEST(InstanceText, ReportsTheLineOfAnError) {
     try {
         parseInstances("instance C.K=1 {\n  uint8 A = 300;\n}\n");
         FAIL() << "accepted an out-of-range uint8";
-    } catch (const ParseError &e) {
+    } catch (const ParseError& e) {
         EXPECT_NE(std::string(e.what()).find("line 2"), std::string::npos) << e.what();
     }
     EXPECT_THROW(parseInstances("instance C {\n  weird X = 1;\n}"), ParseError);
@@ -118,7 +118,7 @@ TEST(InstanceText, ReportsTheLineOfAnError) {
 
 TEST(ValueLiterals, GuessedAndExplicitTypes) {
     struct Case {
-        const char *text;
+        const char* text;
         Value expected;
     } cases[] = {
         {"5", Value::uint64(5)},
@@ -140,11 +140,11 @@ TEST(ValueLiterals, GuessedAndExplicitTypes) {
          Value::reference(ObjectPath::parse("Test_Gadget.Name=\"g1\""))},
         {"char16:'\\u00e9'", Value::char16(0xe9)},
     };
-    for (const auto &c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.text);
         EXPECT_EQ(parseValue(c.text), c.expected);
     }
-    for (const char *bad : {"uint8:256", "uint16:-1", "sint8:128", "{1, \"a\"}", "boolean:2",
+    for (const char* bad : {"uint8:256", "uint16:-1", "sint8:128", "{1, \"a\"}", "boolean:2",
                             "datetime:\"2024\"", "\"open"}) {
         SCOPED_TRACE(bad);
         EXPECT_THROW(parseValue(bad), ParseError);
@@ -162,7 +162,7 @@ TEST(ValueEquality, TypeNullnessAndWidthMatter) {
 
 TEST(DateTimeConversion, BinaryAndTextAgree) {
     struct Case {
-        const char *text;
+        const char* text;
         std::uint64_t usec;
     } cases[] = {
         {"19700101000000.000000+000", 0},
@@ -171,7 +171,7 @@ TEST(DateTimeConversion, BinaryAndTextAgree) {
         {"20231114211320.123456-060", 1700000000123456ULL},
         {"00000001020304.000005:000", ((((1ULL * 24 + 2) * 60 + 3) * 60) + 4) * 1000000 + 5},
     };
-    for (const auto &c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.text);
         auto dt = DateTime::parse(c.text);
         ASSERT_TRUE(dt);
@@ -179,7 +179,7 @@ TEST(DateTimeConversion, BinaryAndTextAgree) {
     }
     EXPECT_EQ(DateTime::fromBinary(1700000000123456ULL, false).text(), "20231114221320.123456+000");
     EXPECT_EQ(DateTime::fromBinary(93784000005ULL, true).text(), "00000001020304.000005:000");
-    for (const char *bad :
+    for (const char* bad :
          {"2023111422132.123456+000", "20231114221320.123456*000", "20231114221320-123456+000",
           "20231314221320.000000+000", "00000001020304.000000:001", "2023111422132a.000000+000"}) {
         SCOPED_TRACE(bad);
@@ -207,7 +207,7 @@ TEST(RegistrationFile, ParsesBlocksTypesAndNamespaces) {
 }
 
 TEST(RegistrationFile, RejectsIncompleteOrUnknownEntries) {
-    const char *bad[] = {
+    const char* bad[] = {
         "provider: P\n",                                    // before any block
         "[C]\nprovider: P\nlocation: l\ntype: instance\n",  // no namespace
         "[C]\nprovider: P\nlocation: l\nnamespace: n\n",    // no type
@@ -215,7 +215,7 @@ TEST(RegistrationFile, RejectsIncompleteOrUnknownEntries) {
         "[C]\nprovider: P\nlocation: l\ntype: instance\nnamespace: n\ncolour: red\n",
         "[C\nprovider: P\n",
     };
-    for (const char *text : bad) {
+    for (const char* text : bad) {
         SCOPED_TRACE(text);
         EXPECT_THROW(parseRegistrations(text), ParseError);
     }
