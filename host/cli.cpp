@@ -274,6 +274,90 @@ int cmdGetClass(Env& e, const CommandArgs& a) {
     return 0;
 }
 
+// One line of a script in words: blanks separate, '...' and "..." quote,
+// a backslash takes the next character as it is.
+std::vector<std::string> splitWords(const std::string& line) {
+    std::vector<std::string> words;
+    std::string word;
+    bool inWord = false;
+    char quote = 0;
+    for (size_t i = 0; i < line.size(); ++i) {
+        const char c = line[i];
+        if (c == '\\' && quote != '\'') {
+            if (++i >= line.size())
+                throw ParseError("a backslash ends the line");
+            word += line[i];
+            inWord = true;
+        } else if (quote) {
+            if (c == quote)
+                quote = 0;
+            else
+                word += c;
+        } else if (c == '\'' || c == '"') {
+            quote = c;
+            inWord = true;
+        } else if (c == ' ' || c == '\t') {
+            if (inWord)
+                words.push_back(word);
+            word.clear();
+            inWord = false;
+        } else {
+            word += c;
+            inWord = true;
+        }
+    }
+    if (quote)
+        throw ParseError(std::string("unclosed ") + quote);
+    if (inWord)
+        words.push_back(word);
+    return words;
+}
+
+// Runs each line of a script as a command of its own against the host that
+// is already loaded, so that what one command changes the next one sees.
+// Lines may start with the per-request options -n and --props;
+// blank lines and lines starting with '#' are skipped. Every line runs; the
+// exit status is the highest of them.
+int cmdScript(Env& e, const CommandArgs& a) {
+    const std::string& file = a.positional[0];
+    std::ifstream f;
+    if (file != "-") {
+        f.open(file);
+        if (!f)
+            return failed(e.err, Status{CMPI_RC_ERR_FAILED, file + ": cannot open"});
+    }
+    std::istream& in = file == "-" ? std::cin : f;
+    Defaults d;
+    d.module = e.inv.module;
+    d.reg = e.inv.reg;
+    d.nameSpace = e.inv.nameSpace;
+    d.catalog = e.inv.catalog;
+    int worst = 0;
+    std::string line;
+    for (int number = 1; std::getline(in, line); ++number) {
+        const size_t first = line.find_first_not_of(" \t\r");
+        if (first == std::string::npos || line[first] == '#')
+            continue;
+        int rc = 2;
+        try {
+            Invocation inv = parseInvocation(splitWords(line), d);
+            if (!inv.props)
+                inv.props = e.inv.props;
+            if (inv.module != d.module || inv.reg != d.reg || !inv.seeds.empty() ||
+                inv.principal != "root")
+                throw ParseError(
+                    "--module, --reg, --seed and --principal are options of the whole script");
+            if (inv.command == "script")
+                throw ParseError("a script cannot run a script");
+            rc = execute(e.host, inv, e.out, e.err);
+        } catch (const ParseError& x) {
+            e.err << "tvrncli: " << file << ":" << number << ": " << x.what() << '\n';
+        }
+        worst = std::max(worst, rc);
+    }
+    return worst;
+}
+
 int cmdHelp(Env& e, const CommandArgs&) {
     e.out << usage();
     return 0;
@@ -350,6 +434,15 @@ const Command kCommands[] = {
      false,
      false,
      cmdClasses},
+    {"script",
+     "FILE",
+     "run each line of FILE (- for standard input) as a command, in one process",
+     {},
+     1,
+     1,
+     true,
+     false,
+     cmdScript},
     {"help", "", "this text", {}, 0, 0, false, false, cmdHelp},
 };
 

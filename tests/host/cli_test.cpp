@@ -206,6 +206,40 @@ TEST(Cli, SeedsTheStoreFromAFile) {
     std::remove(seed.c_str());
 }
 
+TEST(Cli, AScriptRunsItsLinesInOneProcess) {
+    char name[] = "/tmp/tvrncli_script_XXXXXX";
+    const int fd = mkstemp(name);
+    ASSERT_GE(fd, 0);
+    close(fd);
+    // What one line creates the next sees; quotes and backslashes as in a
+    // shell; per-line options; a failing line does not stop the rest.
+    std::ofstream(name) << "# a widget made and read back\n"
+                           "\n"
+                           "ci Test_Widget.Id=\\\"w9\\\" 'Label=two words'\n"
+                           "--props Label gi 'Test_Widget.Id=\"w9\"'\n"
+                           "di Test_Widget.Id=\\\"nope\\\"\n"
+                           "gi 'unclosed\n"
+                           "--seed x ein Test_Widget\n"
+                           "ein Test_Gadget\n";
+    Output o = runCli({"script", name});
+    EXPECT_EQ(o.status, 2);
+    EXPECT_EQ(o.out,
+              "root/test:Test_Widget.Id=\"w9\"\n"
+              "// root/test:Test_Widget.Id=\"w9\"\n"
+              "instance of Test_Widget {\n"
+              "    Id = \"w9\";\n"
+              "    Label = \"two words\";\n"
+              "};\n"
+              "root/test:Test_Gadget.Name=\"g1\"\n"
+              "root/test:Test_Gadget.Name=\"g2\"\n");
+    const std::string file = name;
+    EXPECT_NE(o.err.find("tvrncli: CMPI_RC_ERR_NOT_FOUND (6)"), std::string::npos) << o.err;
+    EXPECT_NE(o.err.find(file + ":6: unclosed '"), std::string::npos) << o.err;
+    EXPECT_NE(o.err.find(file + ":7: --module, --reg, --seed and --principal"), std::string::npos)
+        << o.err;
+    std::remove(name);
+}
+
 Output runProgram(const std::string& args) {
     const std::string cmd = std::string(TVRN_TEST_BUILD_DIR) + "/bin/tvrncli " + args + " 2>&1";
     Output o{-1, "", ""};
