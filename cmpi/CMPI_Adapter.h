@@ -1,6 +1,5 @@
 // The CMPI face of one provider: its static block of MI function tables, and
-// the adapter object that the first MI request creates and that turns every
-// CMPI request into provider operations.
+// the adapter object that the first MI creation makes.
 #ifndef CPTA_CMPI_CMPI_ADAPTER_H
 #define CPTA_CMPI_CMPI_ADAPTER_H
 
@@ -52,12 +51,29 @@ inline bool operator==(const Name_Space_Entry& a, const Name_Space_Entry& b) {
     return a.name_space == b.name_space;
 }
 
+// What the indication entries keep per provider, under the adapter's mutex
+// (but for `disabling`, which a delivery reads without it).
+struct Indication_State {
+    // The name spaces with active filters.
+    Array<Name_Space_Entry> name_spaces;
+    bool enabled = false;
+    // Set while the provider's disable_indications runs, so that a delivery
+    // waiting for the mutex gives up instead of blocking the provider, which
+    // may be waiting for the delivering thread.
+    std::atomic<bool> disabling{false};
+};
+
+// The adapter of one provider: the provider object behind its MIs, the
+// number of MIs the server holds, and the mutex that serialises the
+// provider's requests. Created with the first MI and destroyed with the
+// last (cmpi/CMPI_MI_Factory.h); the MI entries reach it through the handle
+// of their MI (from_handle).
 class CMPI_Adapter : public Provider_Handle {
 public:
-    // Creates and loads the provider (within a thread context of this call)
-    // and fills the static data.
-    CMPI_Adapter(const CMPIBroker* broker, const CMPIContext* context, const char* provider_name,
-                 const Registration* registration, CMPI_Static_Data* static_data);
+    // Creates the provider object and binds the adapter to its static data.
+    // The provider is not loaded yet.
+    CMPI_Adapter(const CMPIBroker* broker, const Registration* registration,
+                 CMPI_Static_Data* static_data);
     // Marks the static data dead and destroys the provider.
     ~CMPI_Adapter() override;
 
@@ -68,118 +84,25 @@ public:
     void allow_unload(bool flag) { _unload_allowed = flag; }
     bool unload_allowed() const { return _unload_allowed; }
 
+    // The MIs of the provider that the server holds (1 at creation).
+    uint32 mi_count() const { return _mi_count; }
+    void add_mi() { _mi_count++; }
+    void drop_mi() { _mi_count--; }
+
+    Indication_State& indications() { return _indications; }
+
     // The adapter behind an MI handle, or null when the provider is gone.
     static CMPI_Adapter* from_handle(void* hdl);
 
-    // Shared by the four cleanup entries.
-    static CMPIStatus cleanup(CMPI_Adapter* adapter, const CMPIContext* context, bool terminating);
-
-    // The entries of the four MI function tables.
-    static CMPIStatus instanceCleanup(CMPIInstanceMI* mi, const CMPIContext* context,
-                                      CMPIBoolean terminating);
-    static CMPIStatus enumInstanceNames(CMPIInstanceMI* mi, const CMPIContext* context,
-                                        const CMPIResult* result, const CMPIObjectPath* op);
-    static CMPIStatus enumInstances(CMPIInstanceMI* mi, const CMPIContext* context,
-                                    const CMPIResult* result, const CMPIObjectPath* op,
-                                    const char** properties);
-    static CMPIStatus getInstance(CMPIInstanceMI* mi, const CMPIContext* context,
-                                  const CMPIResult* result, const CMPIObjectPath* op,
-                                  const char** properties);
-    static CMPIStatus createInstance(CMPIInstanceMI* mi, const CMPIContext* context,
-                                     const CMPIResult* result, const CMPIObjectPath* op,
-                                     const CMPIInstance* instance);
-    static CMPIStatus modifyInstance(CMPIInstanceMI* mi, const CMPIContext* context,
-                                     const CMPIResult* result, const CMPIObjectPath* op,
-                                     const CMPIInstance* instance, const char** properties);
-    static CMPIStatus deleteInstance(CMPIInstanceMI* mi, const CMPIContext* context,
-                                     const CMPIResult* result, const CMPIObjectPath* op);
-    static CMPIStatus execQuery(CMPIInstanceMI* mi, const CMPIContext* context,
-                                const CMPIResult* result, const CMPIObjectPath* op,
-                                const char* query, const char* lang);
-
-    static CMPIStatus methodCleanup(CMPIMethodMI* mi, const CMPIContext* context,
-                                    CMPIBoolean terminating);
-    static CMPIStatus invokeMethod(CMPIMethodMI* mi, const CMPIContext* context,
-                                   const CMPIResult* result, const CMPIObjectPath* op,
-                                   const char* method, const CMPIArgs* in, CMPIArgs* out);
-
-    static CMPIStatus indicationCleanup(CMPIIndicationMI* mi, const CMPIContext* context,
-                                        CMPIBoolean terminating);
-    static CMPIStatus authorizeFilter(CMPIIndicationMI* mi, const CMPIContext* context,
-                                      const CMPISelectExp* filter, const char* class_name,
-                                      const CMPIObjectPath* op, const char* owner);
-    static CMPIStatus mustPoll(CMPIIndicationMI* mi, const CMPIContext* context,
-                               const CMPISelectExp* filter, const char* class_name,
-                               const CMPIObjectPath* class_path);
-    static CMPIStatus activateFilter(CMPIIndicationMI* mi, const CMPIContext* context,
-                                     const CMPISelectExp* filter, const char* class_name,
-                                     const CMPIObjectPath* class_path,
-                                     CMPIBoolean first_activation);
-    static CMPIStatus deactivateFilter(CMPIIndicationMI* mi, const CMPIContext* context,
-                                       const CMPISelectExp* filter, const char* class_name,
-                                       const CMPIObjectPath* class_path,
-                                       CMPIBoolean last_activation);
-    static CMPIStatus enableIndications(CMPIIndicationMI* mi, const CMPIContext* context);
-    static CMPIStatus disableIndications(CMPIIndicationMI* mi, const CMPIContext* context);
-
-    static CMPIStatus associationCleanup(CMPIAssociationMI* mi, const CMPIContext* context,
-                                         CMPIBoolean terminating);
-    static CMPIStatus associators(CMPIAssociationMI* mi, const CMPIContext* context,
-                                  const CMPIResult* result, const CMPIObjectPath* op,
-                                  const char* assoc_class, const char* result_class,
-                                  const char* role, const char* result_role,
-                                  const char** properties);
-    static CMPIStatus associatorNames(CMPIAssociationMI* mi, const CMPIContext* context,
-                                      const CMPIResult* result, const CMPIObjectPath* op,
-                                      const char* assoc_class, const char* result_class,
-                                      const char* role, const char* result_role);
-    static CMPIStatus references(CMPIAssociationMI* mi, const CMPIContext* context,
-                                 const CMPIResult* result, const CMPIObjectPath* op,
-                                 const char* result_class, const char* role,
-                                 const char** properties);
-    static CMPIStatus referenceNames(CMPIAssociationMI* mi, const CMPIContext* context,
-                                     const CMPIResult* result, const CMPIObjectPath* op,
-                                     const char* result_class, const char* role);
-
-    // Hands an indication of the provider to the server in every name space
-    // with an active filter (the callback given to enable_indications).
-    static bool _indication_proc(Instance* indication, void* client_data);
-
 private:
-    friend int cimple_cmpi_adapter(CMPI_Static_Data*, const Registration*, const CMPIBroker*,
-                                   const CMPIContext*, const char*, char, void**);
-
-    void _fill_static_data(const char* provider_name);
-
     const CMPIBroker* _broker;
     CMPI_Static_Data* _static_data;
     uint32 _mi_count;
     std::atomic<bool> _unload_allowed;
-    Array<Name_Space_Entry> _name_spaces;
     const Meta_Class* _meta_class;
-    bool _indications_enabled;
-    // Set while the provider's disable_indications runs, so that a delivery
-    // waiting for the mutex gives up instead of blocking the provider, which
-    // may be waiting for the delivering thread.
-    std::atomic<bool> _disabling;
+    Indication_State _indications;
     Mutex _mutex;
 };
-
-// Creates the provider's adapter on the first call (else counts one more MI)
-// and stores the MI record of the kind ('I' instance, 'M' method, 'A'
-// association, 'N' indication) in *mi. 0, or -1 with *mi null.
-int cimple_cmpi_adapter(CMPI_Static_Data* static_data, const Registration* registration,
-                        const CMPIBroker* broker, const CMPIContext* context,
-                        const char* provider_name, char kind, void** mi);
-
-// What the exported MI factories do: the MI record of the kind, or null
-// with *rc set to CMPI_RC_ERR_FAILED and a message. Never throws.
-void* __create_mi(CMPI_Static_Data* static_data, const Registration* registration,
-                  const CMPIBroker* broker, const CMPIContext* context, const char* provider_name,
-                  char kind, CMPIStatus* rc);
-
-// The name of a CMPI return code, for the log.
-const char* _rc_to_str(int rc);
 
 }  // namespace CPTA
 

@@ -1,18 +1,17 @@
 // The frame around every request entry of a CMPI adapter: find the adapter,
 // install a thread context for the request, serialise on the adapter's
-// mutex, log entry and exit, and keep every exception inside the module.
+// mutex, log entry and exit, and keep every exception inside the module;
+// with the look-ups and the result delivery that the entries share.
 #ifndef CPTA_CMPI_CMPI_ENTRY_H
 #define CPTA_CMPI_CMPI_ENTRY_H
 
-#include <cmpimacs.h>
-#include "cmpi/Cmpi_Ptr.h"
+#include <cmpidt.h>
+#include <cmpift.h>
 
 #include <exception>
-#include <memory>
 
 #include "cmpi/CMPI_Adapter.h"
 #include "cmpi/CMPI_Thread_Context.h"
-#include "framework/Log.h"
 
 namespace CPTA {
 
@@ -29,42 +28,26 @@ struct Entry_Status {
 class Entry_Scope {
 public:
     Entry_Scope(CMPI_Adapter* adapter, const CMPIContext* context)
-        : _adapter(adapter),
-          _context(new CMPI_Thread_Context(adapter->broker(), context, adapter)) {
-        Thread_Context::push(_context.get());
+        : _adapter(adapter), _context(adapter->broker(), context, adapter) {
         _adapter->mutex().lock();
     }
-
-    ~Entry_Scope() {
-        _adapter->mutex().unlock();
-        // Contexts that the provider left behind are taken off the stack too.
-        while (Thread_Context* top = Thread_Context::top()) {
-            Thread_Context::pop();
-            if (top == _context.get())
-                break;
-        }
-    }
+    ~Entry_Scope() { _adapter->mutex().unlock(); }
 
     Entry_Scope(const Entry_Scope&) = delete;
     Entry_Scope& operator=(const Entry_Scope&) = delete;
 
-    const CMPIContext* cmpi_context() const { return _context->cmpi_context(); }
+    const CMPIContext* cmpi_context() const { return _context.context().cmpi_context(); }
 
 private:
     CMPI_Adapter* _adapter;
-    std::unique_ptr<CMPI_Thread_Context> _context;
+    Context_Scope _context;
 };
 
-inline CMPIStatus _make_status(const CMPIBroker* broker, const Entry_Status& status) {
-    CMPIStatus result = {CMPIrc(status.rc), nullptr};
-    if (status.message.size() && broker) {
-        try {
-            result.msg = CMNewString(broker, status.message.c_str(), nullptr);
-        } catch (...) {
-        }
-    }
-    return result;
-}
+// The CMPI status of an entry's answer (the message made by the broker).
+CMPIStatus _make_status(const CMPIBroker* broker, const Entry_Status& status);
+
+// The name of a CMPI return code, for the log.
+const char* _rc_to_str(int rc);
 
 // The entry and exit lines of an entry (logged as the adapter's).
 void _log_enter(const char* name);

@@ -45,6 +45,20 @@ int _write_up_call(const CMPIBroker* broker, const char* name_space, const Insta
 
 CMPI_Thread_Context::~CMPI_Thread_Context() {}
 
+Context_Scope::Context_Scope(const CMPIBroker* broker, const CMPIContext* context,
+                             CMPI_Adapter* adapter)
+    : _context(broker, context, adapter) {
+    Thread_Context::push(&_context);
+}
+
+Context_Scope::~Context_Scope() {
+    while (Thread_Context* top = Thread_Context::top()) {
+        Thread_Context::pop();
+        if (top == &_context)
+            break;
+    }
+}
+
 CMPI_Thread_Context* CMPI_Thread_Context::top() {
     return dynamic_cast<CMPI_Thread_Context*>(Thread_Context::top());
 }

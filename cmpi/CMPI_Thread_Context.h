@@ -58,6 +58,21 @@ private:
     CMPI_Adapter* _adapter;
 };
 
+// Pushes a thread context for the adapter's work for as long as it lives;
+// contexts left above it (by the provider) are taken off with it.
+class Context_Scope {
+public:
+    Context_Scope(const CMPIBroker* broker, const CMPIContext* context, CMPI_Adapter* adapter);
+    ~Context_Scope();
+    Context_Scope(const Context_Scope&) = delete;
+    Context_Scope& operator=(const Context_Scope&) = delete;
+
+    const CMPI_Thread_Context& context() const { return _context; }
+
+private:
+    CMPI_Thread_Context _context;
+};
+
 }  // namespace CPTA
 
 #endif

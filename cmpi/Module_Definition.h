@@ -24,7 +24,7 @@
 #include <cmpift.h>
 #include <cmpimacs.h>
 
-#include "cmpi/CMPI_Adapter.h"
+#include "cmpi/CMPI_MI_Factory.h"
 #include "cmpi/Provider_Proc.h"
 #include "cmpi/Registration.h"
 
@@ -66,7 +66,7 @@ static_assert(sizeof(_registrations) / sizeof(_registrations[0]) == TVRN_NUM_PRO
 struct Registrar {
     Registrar() {
         for (::CPTA::Registration& registration : _registrations)
-            ::CPTA::__register_provider(&registration);
+            ::CPTA::register_provider(&registration);
     }
 } _registrar;
 
@@ -77,16 +77,16 @@ struct Registrar {
 #include TVRN_MODULE_ROWS
 #undef TVRN_ROW
 
-#define TVRN_FACTORY(P, S, KIND, LETTER)                                                           \
-    extern "C" CMPI_EXPORT CMPI##KIND##MI* P##_Create_##KIND##MI(                                  \
-        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {                    \
-        return static_cast<CMPI##KIND##MI*>(::CPTA::__create_mi(&_cmpi_static_data_##P,            \
-                                                                &_registrations[TVRN_INDEX_##P],   \
-                                                                broker, context, #P, LETTER, rc)); \
-    }                                                                                              \
-    extern "C" CMPI_EXPORT CMPI##KIND##MI* S##_Create_##KIND##MI(                                  \
-        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {                    \
-        return P##_Create_##KIND##MI(broker, context, rc);                                         \
+#define TVRN_FACTORY(P, S, KIND, LETTER)                                                         \
+    extern "C" CMPI_EXPORT CMPI##KIND##MI* P##_Create_##KIND##MI(                                \
+        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {                  \
+        return static_cast<CMPI##KIND##MI*>(::CPTA::create_mi(&_cmpi_static_data_##P,            \
+                                                              &_registrations[TVRN_INDEX_##P],   \
+                                                              broker, context, #P, LETTER, rc)); \
+    }                                                                                            \
+    extern "C" CMPI_EXPORT CMPI##KIND##MI* S##_Create_##KIND##MI(                                \
+        const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* rc) {                  \
+        return P##_Create_##KIND##MI(broker, context, rc);                                       \
     }
 
 #define TVRN_ROW(P, S, I, A, N)                      \

@@ -18,7 +18,7 @@ struct Log_Closer {
 
 }  // namespace
 
-void __register_provider(Registration* registration) {
+void register_provider(Registration* registration) {
     static Log_Closer closer;
     (void)closer;
     const Meta_Class* meta_class = nullptr;

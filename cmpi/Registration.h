@@ -78,7 +78,7 @@ extern Registration* _cimple_registration_head;
 
 // Fills in the record's meta class (operation 0 of its proc) and pushes it
 // on the front of the list.
-void __register_provider(Registration* registration);
+void register_provider(Registration* registration);
 
 }  // namespace CPTA
 

@@ -4,8 +4,8 @@
 
 namespace CPTA {
 
-int __start_enumeration(Instance_Enumerator& enumerator, Thread_Context* context,
-                        Instance_Enumerator_Rep* rep) {
+int start_enumeration(Instance_Enumerator& enumerator, Thread_Context* context,
+                      Instance_Enumerator_Rep* rep) {
     enumerator._reset();
     if (!rep)
         return -1;
@@ -49,8 +49,8 @@ int enum_instances(const char* name_space, const Instance* model, Instance_Enume
     Thread_Context* context = Thread_Context::top();
     if (!context)
         return -1;
-    return __start_enumeration(enumerator, context,
-                               context->instance_enumerator_create(name_space, model));
+    return start_enumeration(enumerator, context,
+                             context->instance_enumerator_create(name_space, model));
 }
 
 int create_instance(const char* name_space, const Instance* instance) {

@@ -34,8 +34,8 @@ public:
     void operator++(int) { ++*this; }
 
 private:
-    friend int __start_enumeration(Instance_Enumerator& enumerator, Thread_Context* context,
-                                   Instance_Enumerator_Rep* rep);
+    friend int start_enumeration(Instance_Enumerator& enumerator, Thread_Context* context,
+                                 Instance_Enumerator_Rep* rep);
     void _reset();
 
     Thread_Context* _context;
