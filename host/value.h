@@ -53,6 +53,8 @@ std::optional<Type> typeFromName(std::string_view name);
 bool isSignedInteger(Type t);
 bool isUnsignedInteger(Type t);
 bool isInteger(Type t);
+// The width of an integer type in bits; 0 for other types.
+int integerBits(Type t);
 
 // Text forms are malformed, values out of range, and similar.
 struct ParseError : std::runtime_error {
