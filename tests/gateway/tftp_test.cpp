@@ -64,7 +64,8 @@ TEST(TftpServerText, Forms) {
 TEST_F(TftpClient, BlockNumbersWrapBeyond65535Blocks) {
     const std::string data = content(65536 * 512 + 700);
     server.addFile("big.bin", data);
-    ASSERT_EQ(fetch("big.bin"), 0) << error;
+    // 65,537 blocks: the short time-outs of the other cases would fail on a busy machine.
+    ASSERT_EQ(fetch("big.bin", TftpOptions()), 0) << error;
     EXPECT_TRUE(received() == data);
 }
 
