@@ -18,8 +18,9 @@ build=${TVRN_BUILD_DIR:-$root/build}
 jobs=${TVRN_JOBS:-2}
 
 # tftpd-hpa: the TFTP download tests start its in.tftpd on loopback themselves.
+# clang-format-14: the suite checks that every hand-written source is formatted.
 packages=(build-essential cmake pkg-config python3 libjsoncpp-dev
-          libgtest-dev libgmock-dev libbenchmark-dev tftpd-hpa)
+          libgtest-dev libgmock-dev libbenchmark-dev tftpd-hpa clang-format-14)
 
 install_missing() {
   local missing=() p

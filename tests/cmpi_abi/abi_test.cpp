@@ -52,113 +52,115 @@ static_assert(std::is_same<CMPIAccessor, CMPIData(const char*, void*)>::value,
 #endif
 
 // Context entry names are their own names.
-#define ENTRY_NAME(n) static_assert(std::string_view(n) == #n, #n);
-ENTRY_NAME(CMPIPrincipal)
-ENTRY_NAME(CMPIInvocationFlags)
-ENTRY_NAME(CMPIInitNameSpace) ENTRY_NAME(CMPIRole) ENTRY_NAME(CMPIAcceptLanguage)
-    ENTRY_NAME(CMPIContentLanguage)
+#define ENTRY_NAME(n) static_assert(std::string_view(n) == #n, #n)
+ENTRY_NAME(CMPIPrincipal);
+ENTRY_NAME(CMPIInvocationFlags);
+ENTRY_NAME(CMPIInitNameSpace);
+ENTRY_NAME(CMPIRole);
+ENTRY_NAME(CMPIAcceptLanguage);
+ENTRY_NAME(CMPIContentLanguage);
 
-    // Run time: the stub macros and the macros that are easy to get subtly wrong.
-    namespace {
-    TEST(CmpiAbi, CStubsBuildVersionedTablesAndRunTheHook) {
-        int fakeBroker = 0;
-        tvrn_abi_stub_probe p = tvrn_abi_run_c_stubs(&fakeBroker);
-        EXPECT_EQ(p.brokerSeen, &fakeBroker);
-        EXPECT_EQ(p.hookRuns, 1);
+// Run time: the stub macros and the macros that are easy to get subtly wrong.
+namespace {
+TEST(CmpiAbi, CStubsBuildVersionedTablesAndRunTheHook) {
+    int fakeBroker = 0;
+    tvrn_abi_stub_probe p = tvrn_abi_run_c_stubs(&fakeBroker);
+    EXPECT_EQ(p.brokerSeen, &fakeBroker);
+    EXPECT_EQ(p.hookRuns, 1);
 
-        auto* inst = static_cast<const CMPIInstanceMI*>(p.instanceMI);
-        ASSERT_NE(inst, nullptr);
-        EXPECT_EQ(inst->hdl, nullptr);
-        EXPECT_EQ(inst->ft->ftVersion, 200);
-        EXPECT_EQ(inst->ft->miVersion, 200);
-        EXPECT_STREQ(inst->ft->miName, "instanceTvrnProbe");
-        EXPECT_NE(inst->ft->modifyInstance, nullptr);
-        auto* ind = static_cast<const CMPIIndicationMI*>(p.indicationMI);
-        EXPECT_STREQ(ind->ft->miName, "IndicationTvrnProbe");
-        EXPECT_NE(ind->ft->enableIndications, nullptr);
-        EXPECT_NE(ind->ft->disableIndications, nullptr);
-        EXPECT_STREQ(static_cast<const CMPIMethodMI*>(p.methodMI)->ft->miName, "methodTvrnProbe");
-        // A provider built for 1.00 gets 1.00 tables.
-        EXPECT_EQ(tvrn_abi_v100_stub_mi_version(), 100);
-    }
+    auto* inst = static_cast<const CMPIInstanceMI*>(p.instanceMI);
+    ASSERT_NE(inst, nullptr);
+    EXPECT_EQ(inst->hdl, nullptr);
+    EXPECT_EQ(inst->ft->ftVersion, 200);
+    EXPECT_EQ(inst->ft->miVersion, 200);
+    EXPECT_STREQ(inst->ft->miName, "instanceTvrnProbe");
+    EXPECT_NE(inst->ft->modifyInstance, nullptr);
+    auto* ind = static_cast<const CMPIIndicationMI*>(p.indicationMI);
+    EXPECT_STREQ(ind->ft->miName, "IndicationTvrnProbe");
+    EXPECT_NE(ind->ft->enableIndications, nullptr);
+    EXPECT_NE(ind->ft->disableIndications, nullptr);
+    EXPECT_STREQ(static_cast<const CMPIMethodMI*>(p.methodMI)->ft->miName, "methodTvrnProbe");
+    // A provider built for 1.00 gets 1.00 tables.
+    EXPECT_EQ(tvrn_abi_v100_stub_mi_version(), 100);
+}
 
-    const char* seen[2];
+const char* seen[2];
 
-    CMPIEnumeration* recExecQuery(B, C, OP, const char* query, const char* lang, ST) {
-        seen[0] = query, seen[1] = lang;
-        return nullptr;
-    }
-    CMPIEnumeration* recReferences(B, C, OP, const char* resultClass, const char* role, PL, ST) {
-        seen[0] = resultClass, seen[1] = role;
-        return nullptr;
-    }
-    const char* recGetCharPtr(const CMPIString*, CMPIStatus* rc) {
-        seen[0] = rc == nullptr ? "null-rc" : "rc";
-        return "text";
-    }
-    CMPIStatus recReturnDone(const CMPIResult*) {
-        return CMPIStatus{CMPI_RC_ERR_FAILED, nullptr};
-    }
+CMPIEnumeration* recExecQuery(B, C, OP, const char* query, const char* lang, ST) {
+    seen[0] = query, seen[1] = lang;
+    return nullptr;
+}
+CMPIEnumeration* recReferences(B, C, OP, const char* resultClass, const char* role, PL, ST) {
+    seen[0] = resultClass, seen[1] = role;
+    return nullptr;
+}
+const char* recGetCharPtr(const CMPIString*, CMPIStatus* rc) {
+    seen[0] = rc == nullptr ? "null-rc" : "rc";
+    return "text";
+}
+CMPIStatus recReturnDone(const CMPIResult*) {
+    return CMPIStatus{CMPI_RC_ERR_FAILED, nullptr};
+}
 
-    CMPIStatus returnsThroughCMReturnWithChars() {
-        const CMPIBroker* none = nullptr;
-        CMReturnWithChars(none, CMPI_RC_ERR_NOT_FOUND, "ignored");
-    }
+CMPIStatus returnsThroughCMReturnWithChars() {
+    const CMPIBroker* none = nullptr;
+    CMReturnWithChars(none, CMPI_RC_ERR_NOT_FOUND, "ignored");
+}
 
-    int afterReturnData(const CMPIResult* r) {
-        CMReturnDone(r);  // an expression: execution goes on
-        return 7;
-    }
+int afterReturnData(const CMPIResult* r) {
+    CMReturnDone(r);  // an expression: execution goes on
+    return 7;
+}
 
-    TEST(CmpiAbi, MacrosPassArgumentsByPosition) {
-        CMPIBrokerFT bft{};
-        bft.execQuery = recExecQuery;
-        bft.references = recReferences;
-        CMPIBroker broker{};
-        broker.bft = &bft;
-        const CMPIBroker* b = &broker;
+TEST(CmpiAbi, MacrosPassArgumentsByPosition) {
+    CMPIBrokerFT bft{};
+    bft.execQuery = recExecQuery;
+    bft.references = recReferences;
+    CMPIBroker broker{};
+    broker.bft = &bft;
+    const CMPIBroker* b = &broker;
 
-        CBExecQuery(b, nullptr, nullptr, "fourth", "fifth", nullptr);
-        EXPECT_STREQ(seen[0], "fourth");  // goes to `query`
-        EXPECT_STREQ(seen[1], "fifth");
-        CBReferences(b, nullptr, nullptr, "CIM_Assoc", "Role", nullptr, nullptr);
-        EXPECT_STREQ(seen[0], "CIM_Assoc");  // the 4th argument is resultClass
-        EXPECT_STREQ(seen[1], "Role");
-    }
+    CBExecQuery(b, nullptr, nullptr, "fourth", "fifth", nullptr);
+    EXPECT_STREQ(seen[0], "fourth");  // goes to `query`
+    EXPECT_STREQ(seen[1], "fifth");
+    CBReferences(b, nullptr, nullptr, "CIM_Assoc", "Role", nullptr, nullptr);
+    EXPECT_STREQ(seen[0], "CIM_Assoc");  // the 4th argument is resultClass
+    EXPECT_STREQ(seen[1], "Role");
+}
 
-    TEST(CmpiAbi, StatusAndResultMacros) {
-        CMPIStringFT sft{};
-        sft.getCharPtr = recGetCharPtr;
-        CMPIString s{reinterpret_cast<void*>(1), &sft};
-        EXPECT_STREQ(CMGetCharPtr(&s), "text");
-        EXPECT_STREQ(seen[0], "null-rc");
+TEST(CmpiAbi, StatusAndResultMacros) {
+    CMPIStringFT sft{};
+    sft.getCharPtr = recGetCharPtr;
+    CMPIString s{reinterpret_cast<void*>(1), &sft};
+    EXPECT_STREQ(CMGetCharPtr(&s), "text");
+    EXPECT_STREQ(seen[0], "null-rc");
 
-        CMPIStatus st = returnsThroughCMReturnWithChars();
-        EXPECT_EQ(st.rc, CMPI_RC_ERR_NOT_FOUND);
-        EXPECT_EQ(st.msg, nullptr);
+    CMPIStatus st = returnsThroughCMReturnWithChars();
+    EXPECT_EQ(st.rc, CMPI_RC_ERR_NOT_FOUND);
+    EXPECT_EQ(st.msg, nullptr);
 
-        CMPIStatus set{CMPI_RC_OK, reinterpret_cast<CMPIString*>(&s)};
-        CMSetStatus(&set, CMPI_RC_ERR_ACCESS_DENIED);
-        EXPECT_EQ(set.rc, CMPI_RC_ERR_ACCESS_DENIED);
-        EXPECT_EQ(set.msg, nullptr);
-        CMPIStatus* none = nullptr;
-        CMSetStatus(none, CMPI_RC_ERR_FAILED);  // tolerated
+    CMPIStatus set{CMPI_RC_OK, reinterpret_cast<CMPIString*>(&s)};
+    CMSetStatus(&set, CMPI_RC_ERR_ACCESS_DENIED);
+    EXPECT_EQ(set.rc, CMPI_RC_ERR_ACCESS_DENIED);
+    EXPECT_EQ(set.msg, nullptr);
+    CMPIStatus* none = nullptr;
+    CMSetStatus(none, CMPI_RC_ERR_FAILED);  // tolerated
 
-        CMPIResultFT rft{};
-        rft.returnDone = recReturnDone;
-        CMPIResult r{nullptr, &rft};
-        EXPECT_EQ(afterReturnData(&r), 7);
+    CMPIResultFT rft{};
+    rft.returnDone = recReturnDone;
+    CMPIResult r{nullptr, &rft};
+    EXPECT_EQ(afterReturnData(&r), 7);
 
-        EXPECT_TRUE(CMIsNullObject(static_cast<CMPIResult*>(nullptr)));
-        EXPECT_TRUE(CMIsNullObject(&r));  // null handle
-        EXPECT_FALSE(CMIsNullObject(&s));
+    EXPECT_TRUE(CMIsNullObject(static_cast<CMPIResult*>(nullptr)));
+    EXPECT_TRUE(CMIsNullObject(&r));  // null handle
+    EXPECT_FALSE(CMIsNullObject(&s));
 
-        CMPIData d{};
-        d.type = CMPI_uint16A;
-        d.state = CMPI_nullValue | CMPI_keyValue;
-        EXPECT_TRUE(CMIsArray(d));
-        EXPECT_TRUE(CMIsNullValue(d));
-        EXPECT_TRUE(CMIsKeyValue(d));
-    }
+    CMPIData d{};
+    d.type = CMPI_uint16A;
+    d.state = CMPI_nullValue | CMPI_keyValue;
+    EXPECT_TRUE(CMIsArray(d));
+    EXPECT_TRUE(CMIsNullValue(d));
+    EXPECT_TRUE(CMIsKeyValue(d));
+}
 
 }  // namespace
