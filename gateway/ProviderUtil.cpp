@@ -67,7 +67,6 @@ const char* const kClassNames[MAXCLASSID] = {
     "TAVRIN_LogicalDisk",
 };
 
-const char kNamespace[] = "root/tavrin";
 const size_t kHostBufferSize = 255;
 const size_t kMacLength = 17;  // colon format
 
@@ -342,7 +341,7 @@ String ProviderUtil::updateNamespacePath(const String& className) {
     std::memset(host, 0, sizeof(host));
     getHostInfo(host, sizeof(host));
     String path("//", host, "/");
-    path.append(kNamespace);
+    path.append(NAMESPACE);
     path.append(':');
     path.append(className);
     return path;

@@ -30,14 +30,16 @@ Array<Instance*> connectors(classId_t id) {
     return PhysicalAssetHelper::getPhysicalAssetHelperObject()->getInstancesByClass(id);
 }
 
-// The routes without a builder belong to helpers still to come: the remote
-// access point (17), the software installation service (18, 19) and the
-// diagnostics (21 to 28, 31 to 33).
-const InventoryRoute kFCHBARoutes[] = {
+// The routes without a builder belong to helpers still to come: the software
+// installation service (18, 19) and the diagnostics (21 to 28, 31 to 33).
+// The server profile (10 to 15, 17, 37) lives above the inventory and fills
+// its routes when the module loads (fillRoute).
+InventoryRoute kFCHBARoutes[] = {
     {CID_COMPUTER_SYSTEM, CID_COMPUTER_SYSTEM, false, computerSystem},
     {CID_PORT_CONTROLLER, CID_PORT_CONTROLLER, true, adapters},
     {CID_FC_PORT, CID_FC_PORT_STATISTICS, true, ports},
     {CID_PHYSICAL_PACKAGE, CID_ADAPTER_SOFTWARE_IDENTITY, true, adapters},
+    {CID_REGISTERED_PROFILE, CID_PROFILE_SOFTWARE_IDENTITY, false, nullptr},
     {CID_REMOTE_SERVICE_ACCESS_POINT, CID_REMOTE_SERVICE_ACCESS_POINT, false, nullptr},
     {CID_HBA_SOFTWARE_INSTALLATION_SERVICE, CID_HBA_SOFTWARE_INSTALLATION_SERVICE_CAPABILITIES,
      true, nullptr},
@@ -48,6 +50,7 @@ const InventoryRoute kFCHBARoutes[] = {
     {CID_LAN_ENDPOINT, CID_LAN_ENDPOINT, true, ethernetPorts},
     {CID_PHYSICAL_CONNECTOR, CID_PHYSICAL_CONNECTOR, true, connectors},
     {CID_ALARM_DEVICE, CID_ALARM_DEVICE, true, ports},
+    {CID_AGENT_SERVICE, CID_AGENT_SERVICE, false, nullptr},
 };
 
 const InventoryRoute kHDRRoutes[] = {
@@ -120,6 +123,15 @@ FCHBAManager* FCHBAManager::getFCHBAManager() {
 const InventoryRoute* FCHBAManager::routes(size_t& count) {
     count = std::size(kFCHBARoutes);
     return kFCHBARoutes;
+}
+
+bool FCHBAManager::fillRoute(classId_t first, Array<Instance*> (*build)(classId_t classId)) {
+    for (InventoryRoute& r : kFCHBARoutes)
+        if (r.first == first && r.build == nullptr) {
+            r.build = build;
+            return true;
+        }
+    return false;
 }
 
 Array<Instance*> FCHBAManager::getInstances(classId_t classId) {

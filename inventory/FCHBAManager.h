@@ -1,6 +1,6 @@
 // The class dispatchers. Providers never call an inventory helper for their
 // own class: they ask FCHBAManager (adapters, ports, Ethernet, connectors, the
-// host, and later server profile, software update and diagnostics) or
+// host, the server profile, and later software update and diagnostics) or
 // HDRManager (storage extents, tape drives, logical disks) for all instances
 // of a class id. Both refuse to ask the adapter library anything while the
 // adapter driver is not usable.
@@ -55,6 +55,10 @@ public:
 
     // The routing table (for inspection).
     static const InventoryRoute* routes(size_t& count);
+    // Gives the route that starts at `first` its builder, if it has none:
+    // the layers above the inventory fill their routes when the module
+    // loads, before any request. False when there is no such route.
+    static bool fillRoute(classId_t first, Array<Instance*> (*build)(classId_t classId));
 
 private:
     FCHBAManager();
