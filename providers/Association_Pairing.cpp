@@ -22,16 +22,23 @@
 #include "inventory/HostIdentityScope.h"
 #include "schema/generated/TAVRIN_AdapterSoftwareIdentity.h"
 #include "schema/generated/TAVRIN_AlarmDevice.h"
+#include "schema/generated/TAVRIN_CIMXMLCommunicationMechanism.h"
 #include "schema/generated/TAVRIN_ComputerSystem.h"
 #include "schema/generated/TAVRIN_EthernetPort.h"
 #include "schema/generated/TAVRIN_FCPort.h"
 #include "schema/generated/TAVRIN_FCPortStatistics.h"
 #include "schema/generated/TAVRIN_LANEndpoint.h"
 #include "schema/generated/TAVRIN_LogicalPortGroup.h"
+#include "schema/generated/TAVRIN_Namespace.h"
+#include "schema/generated/TAVRIN_ObjectManager.h"
 #include "schema/generated/TAVRIN_PhysicalConnector.h"
 #include "schema/generated/TAVRIN_PhysicalPackage.h"
 #include "schema/generated/TAVRIN_PortController.h"
 #include "schema/generated/TAVRIN_Product.h"
+#include "schema/generated/TAVRIN_ProfileSoftwareIdentity.h"
+#include "schema/generated/TAVRIN_RegisteredProfile.h"
+#include "schema/generated/TAVRIN_RegisteredSubProfile.h"
+#include "schema/generated/TAVRIN_RemoteServiceAccessPoint.h"
 #include "schema/generated/TAVRIN_SCSIProtocolEndpoint.h"
 #include "schema/generated/TAVRIN_StorageExtent.h"
 #include "schema/generated/TAVRIN_TapeDrive.h"
@@ -53,6 +60,16 @@ const Meta_Class* class_of(classId_t id) {
         case CID_ADAPTER_SOFTWARE_IDENTITY:
             return &TAVRIN_AdapterSoftwareIdentity::static_meta_class;
         case CID_STORAGE_EXTENT: return &TAVRIN_StorageExtent::static_meta_class;
+        case CID_REGISTERED_PROFILE: return &TAVRIN_RegisteredProfile::static_meta_class;
+        case CID_REGISTERED_SUB_PROFILE: return &TAVRIN_RegisteredSubProfile::static_meta_class;
+        case CID_NAMESPACE: return &TAVRIN_Namespace::static_meta_class;
+        case CID_OBJECT_MANAGER: return &TAVRIN_ObjectManager::static_meta_class;
+        case CID_CIMXML_COMMUNICATION_MECHANISM:
+            return &TAVRIN_CIMXMLCommunicationMechanism::static_meta_class;
+        case CID_PROFILE_SOFTWARE_IDENTITY:
+            return &TAVRIN_ProfileSoftwareIdentity::static_meta_class;
+        case CID_REMOTE_SERVICE_ACCESS_POINT:
+            return &TAVRIN_RemoteServiceAccessPoint::static_meta_class;
         case CID_TAPE_DRIVE: return &TAVRIN_TapeDrive::static_meta_class;
         case CID_ETHERNET_PORT: return &TAVRIN_EthernetPort::static_meta_class;
         case CID_LOGICAL_PORT_GROUP: return &TAVRIN_LogicalPortGroup::static_meta_class;
@@ -256,6 +273,10 @@ const Count_Check* Pairing_Run::failed_check(uint8 set) const {
         bool failed = false;
         switch (check.rule) {
             case Count_Rule::EMPTY: failed = n == 0; break;
+            case Count_Rule::ANY_EMPTY:
+                failed =
+                    size(set, 0) == 0 || (_rule.sets[set].ids[1] != CID_NONE && size(set, 1) == 0);
+                break;
             case Count_Rule::NOT_ONE: failed = n != 1; break;
             case Count_Rule::DIFFERS: failed = n != size(check.other); break;
         }

@@ -140,7 +140,7 @@ struct Endpoint_Set {
     Key selector;      // per-element sources: which adapter
 };
 
-enum class Count_Rule : uint8 { EMPTY, NOT_ONE, DIFFERS };
+enum class Count_Rule : uint8 { EMPTY, ANY_EMPTY, NOT_ONE, DIFFERS };
 
 struct Count_Check {
     uint8 set;
@@ -228,6 +228,11 @@ struct Pairing {
     constexpr Pairing when_empty(Log_Level level, const char* message,
                                  Enum_Instances_Status result = ENUM_INSTANCES_OK) const {
         return with_check(Count_Rule::EMPTY, 0, level, message, result);
+    }
+    // A set of two classes where one of them has no instance.
+    constexpr Pairing when_any_empty(Log_Level level, const char* message,
+                                     Enum_Instances_Status result = ENUM_INSTANCES_FAILED) const {
+        return with_check(Count_Rule::ANY_EMPTY, 0, level, message, result);
     }
     constexpr Pairing when_not_one(Log_Level level, const char* message,
                                    Enum_Instances_Status result = ENUM_INSTANCES_FAILED) const {

@@ -38,15 +38,18 @@ inline Array<Instance*> fromHDRManager(classId_t classId) {
 
 // How the instances of a request are handed on.
 enum Inventory_Delivery {
-    ANNOUNCED,  // logs "Returning instances" first
-    QUIET,      // does not
-    SINGLE      // exactly one instance or the request fails
+    ANNOUNCED,    // logs "Returning instances" first
+    QUIET,        // does not
+    SINGLE,       // exactly one instance or the request fails
+    REQUIRED,     // quiet, and no instance fails the request
+    AT_MOST_ONE,  // announced; none is no failure, several fail the request
 };
 
 struct Inventory_Source {
     classId_t classId;
     Array<Instance*> (*dispatcher)(classId_t classId);
-    // Logged when the dispatcher finds no instance (for SINGLE: not exactly one).
+    // Logged when the dispatcher finds no instance (for SINGLE: not exactly
+    // one); null: nothing is logged.
     const char* noInstances;
     Log_Level noInstancesLevel;
     Inventory_Delivery delivery;
@@ -65,6 +68,7 @@ public:
     Inventory_Answer& operator=(const Inventory_Answer&) = delete;
 
     size_t size() const { return _instances.size(); }
+    const Array<Instance*>& instances() const { return _instances; }
     Instance* take(size_t i) {
         Instance* instance = _instances[i];
         _instances[i] = nullptr;
@@ -85,14 +89,21 @@ Enum_Instances_Status enumerate_inventory(const Inventory_Source& source,
     log(LL_DBG, source.file, source.line, "Entering: %s", "enum_instances");
     Inventory_Answer answer(source.dispatcher(source.classId));
 
+    if (source.delivery == AT_MOST_ONE && answer.size() > 1) {
+        log(LL_ERR, source.file, source.line, "Error: Invalid mapping information");
+        log(LL_DBG, source.file, source.line, "Returning: %s", "enum_instances");
+        return ENUM_INSTANCES_FAILED;
+    }
     const bool found = source.delivery == SINGLE ? answer.size() == 1 : answer.size() != 0;
     if (!found) {
-        log(source.noInstancesLevel, source.file, source.line, "%s", source.noInstances);
+        if (source.noInstances != nullptr)
+            log(source.noInstancesLevel, source.file, source.line, "%s", source.noInstances);
         log(LL_DBG, source.file, source.line, "Returning: %s", "enum_instances");
-        return source.delivery == SINGLE ? ENUM_INSTANCES_FAILED : ENUM_INSTANCES_OK;
+        return source.delivery == SINGLE || source.delivery == REQUIRED ? ENUM_INSTANCES_FAILED
+                                                                        : ENUM_INSTANCES_OK;
     }
 
-    if (source.delivery != QUIET)
+    if (source.delivery != QUIET && source.delivery != REQUIRED)
         log(LL_DBG, source.file, source.line, "Returning instances");
     for (size_t i = 0; i < answer.size(); i++) {
         // The dispatcher's instances are ours: handing one on hands over our

@@ -1,11 +1,15 @@
 // The provider of TAVRIN_ObjectManager.
-#include "providers/Provider_Base.h"
+#include "providers/Server_Profile.h"
 #include "providers/generated/TAVRIN_ObjectManager_Methods.h"
 
 namespace CPTA {
 
-class TAVRIN_ObjectManager_Provider : public Instance_Provider<TAVRIN_ObjectManager>,
-                                      public TAVRIN_ObjectManager_Methods {};
+const Inventory_Source TAVRIN_ObjectManager_Source = {
+    CID_OBJECT_MANAGER, fromServerManager, nullptr, LL_DBG, QUIET, TVRN_SOURCE_FILE, __LINE__};
+
+class TAVRIN_ObjectManager_Provider
+    : public Inventory_Provider<TAVRIN_ObjectManager, TAVRIN_ObjectManager_Source>,
+      public TAVRIN_ObjectManager_Methods {};
 
 }  // namespace CPTA
 

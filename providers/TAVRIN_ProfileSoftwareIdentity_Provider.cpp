@@ -1,11 +1,21 @@
 // The provider of TAVRIN_ProfileSoftwareIdentity.
-#include "providers/Provider_Base.h"
+#include "providers/Server_Profile.h"
 #include "providers/generated/TAVRIN_ProfileSoftwareIdentity_Methods.h"
 
 namespace CPTA {
 
+const Inventory_Source TAVRIN_ProfileSoftwareIdentity_Source = {
+    CID_PROFILE_SOFTWARE_IDENTITY,
+    fromServerManager,
+    "Error: Invalid number of ProfileSoftwareIdentity Instances",
+    LL_ERR,
+    REQUIRED,
+    TVRN_SOURCE_FILE,
+    __LINE__};
+
 class TAVRIN_ProfileSoftwareIdentity_Provider
-    : public Instance_Provider<TAVRIN_ProfileSoftwareIdentity>,
+    : public Inventory_Provider<TAVRIN_ProfileSoftwareIdentity,
+                                TAVRIN_ProfileSoftwareIdentity_Source>,
       public TAVRIN_ProfileSoftwareIdentity_Methods {};
 
 }  // namespace CPTA
