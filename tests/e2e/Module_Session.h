@@ -72,7 +72,8 @@ public:
     // returns what it printed, standard output then standard error, masked.
     // `status` receives its exit status.
     std::string cli(const std::string& commandLine, int* status = nullptr);
-    // `text` with the host string, where it is a whole quoted value, as "<host>".
+    // `text` with the host string, where it is a whole quoted value or the
+    // host of a URL, as "<host>".
     std::string masked(const std::string& text) const;
 
     // The log lines since the mark, and how many of them contain `text`.

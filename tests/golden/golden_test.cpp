@@ -8,20 +8,104 @@
 // the fixture, so a method call is seen by the requests after it. To add a
 // case, add a "$ " line and run with TVRN_GOLDEN_UPDATE=1 to write the
 // answers, then read them.
+//
+// The head may also hold "seed: <file>" (instances in tvrncli's --seed form,
+// path relative to the source tree, which the CIM server holds during the
+// file's requests) and "agent: running" (a process named mdcagent, the host
+// management agent, runs during the file's requests).
 #include <gtest/gtest.h>
+#include <signal.h>
+#include <spawn.h>
+#include <stdlib.h>
+#include <sys/wait.h>
 
 #include <algorithm>
 #include <cctype>
+#include <chrono>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <memory>
 #include <sstream>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "tests/e2e/Module_Session.h"
 
+extern char** environ;
+
 namespace {
+
+std::string readFile(const std::string& path) {
+    std::ifstream is(path);
+    std::stringstream text;
+    text << is.rdbuf();
+    return text.str();
+}
+
+// The instances of seed files, held by the host's stores while it lives.
+class Seeds {
+public:
+    Seeds(tvrnhost::Host& host, const std::vector<std::string>& files) : _host(host) {
+        for (const std::string& file : files)
+            for (tvrnhost::Instance& instance :
+                 tvrnhost::parseInstances(readFile(std::string(TVRN_SOURCE_DIR) + "/" + file))) {
+                tvrnhost::ObjectPath path = instance.path();
+                if (path.nameSpace().empty())
+                    path.setNameSpace(tvrne2e::kNameSpace);
+                if (_host.store(path.nameSpace()).add(instance))
+                    _paths.push_back(path);
+            }
+    }
+    ~Seeds() {
+        for (const tvrnhost::ObjectPath& path : _paths)
+            _host.store(path.nameSpace()).remove(path);
+    }
+
+private:
+    tvrnhost::Host& _host;
+    std::vector<tvrnhost::ObjectPath> _paths;
+};
+
+// A harmless program (sleep) running under the host management agent's
+// name while this lives.
+class Agent {
+public:
+    Agent() {
+        char pattern[] = "/tmp/tvrn-agent-XXXXXX";
+        if (mkdtemp(pattern) == nullptr)
+            return;
+        _dir = pattern;
+        const std::string program = _dir + "/mdcagent";
+        std::filesystem::copy_file("/bin/sleep", program);
+        char name[] = "mdcagent", seconds[] = "600";
+        char* argv[] = {name, seconds, nullptr};
+        if (posix_spawn(&_pid, program.c_str(), nullptr, nullptr, argv, environ) != 0) {
+            _pid = 0;
+            return;
+        }
+        // Named once it has started the program.
+        const std::string comm = "/proc/" + std::to_string(_pid) + "/comm";
+        for (int i = 0; i < 200 && readFile(comm) != "mdcagent\n"; i++)
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    ~Agent() {
+        if (_pid > 0) {
+            kill(_pid, SIGKILL);
+            waitpid(_pid, nullptr, 0);
+        }
+        std::error_code ignored;
+        if (!_dir.empty())
+            std::filesystem::remove_all(_dir, ignored);
+    }
+    Agent(const Agent&) = delete;
+    Agent& operator=(const Agent&) = delete;
+
+private:
+    pid_t _pid = 0;
+    std::string _dir;
+};
 
 struct Golden_Case {
     int line;
@@ -48,7 +132,8 @@ class Golden : public ::testing::TestWithParam<std::string> {};
 TEST_P(Golden, File) {
     const std::string& path = GetParam();
     std::ifstream is(path);
-    std::string head, fixture = "default", line;
+    std::string head, fixture = "default", line, agent;
+    std::vector<std::string> seeds;
     std::vector<Golden_Case> cases;
     for (int number = 1; std::getline(is, line); number++) {
         if (line.compare(0, 2, "$ ") == 0) {
@@ -57,13 +142,22 @@ TEST_P(Golden, File) {
             cases.back().expected += line + "\n";
         } else {
             head += line + "\n";
-            if (line.compare(0, 8, "fixture:") == 0)
-                std::istringstream(line.substr(8)) >> fixture;
+            std::istringstream words(line);
+            std::string word, value;
+            words >> word >> value;
+            if (word == "fixture:")
+                fixture = value;
+            else if (word == "seed:")
+                seeds.push_back(value);
+            else if (word == "agent:")
+                agent = value;
         }
     }
     ASSERT_FALSE(cases.empty()) << path << ": no \"$ \" line";
     tvrne2e::Module_Session& session = tvrne2e::Module_Session::open(fixture);
     ASSERT_TRUE(session.loaded());
+    Seeds seeded(session.host(), seeds);
+    std::unique_ptr<Agent> running(agent == "running" ? new Agent : nullptr);
 
     const char* update = std::getenv("TVRN_GOLDEN_UPDATE");
     if (update == nullptr || *update == '\0' || std::string(update) == "0") {

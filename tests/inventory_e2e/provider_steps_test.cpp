@@ -53,6 +53,13 @@ TEST(InventoryProviderSteps, OnlyInstancesOfTheProvidersClassAreDeliveredTheRest
         {SINGLE, {kPort, kPort}, ENUM_INSTANCES_FAILED, 0, 0, 1},
         {SINGLE, {kPort}, ENUM_INSTANCES_OK, 1, 1, 0},
         {SINGLE, {kProduct}, ENUM_INSTANCES_OK, 0, 1, 0},  // nothing to deliver, not a failure
+        // a provider that needs its instances fails without them, quietly otherwise
+        {REQUIRED, {}, ENUM_INSTANCES_FAILED, 0, 0, 1},
+        {REQUIRED, {kPort, kPort}, ENUM_INSTANCES_OK, 2, 0, 0},
+        // at most one: none is no failure, several are (and nothing is delivered)
+        {AT_MOST_ONE, {}, ENUM_INSTANCES_OK, 0, 0, 1},
+        {AT_MOST_ONE, {kPort}, ENUM_INSTANCES_OK, 1, 1, 0},
+        {AT_MOST_ONE, {kPort, kPort}, ENUM_INSTANCES_FAILED, 0, 0, 0},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE("delivery " + std::to_string(c.delivery) + ", " +
