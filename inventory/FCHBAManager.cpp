@@ -9,6 +9,7 @@
 #include "inventory/InventoryCommon.h"
 #include "inventory/PhysicalAssetHelper.h"
 #include "inventory/PortHelper.h"
+#include "update/SoftwareUpdateHelper.h"
 
 namespace CPTA {
 
@@ -29,10 +30,14 @@ Array<Instance*> ethernetPorts(classId_t id) {
 Array<Instance*> connectors(classId_t id) {
     return PhysicalAssetHelper::getPhysicalAssetHelperObject()->getInstancesByClass(id);
 }
+Array<Instance*> softwareUpdate(classId_t id) {
+    _adapterData host;
+    host.hostName = HostIdentityScope::hostText();
+    return SoftwareUpdateHelper::getSoftwareUpdateHelperInstance()->getInstancesByClass(host, id);
+}
 
 // The routes without a builder belong to helpers still to come: the remote
-// access point (17), the software installation service (18, 19) and the
-// diagnostics (21 to 28, 31 to 33).
+// access point (17) and the diagnostics (21 to 28, 31 to 33).
 const InventoryRoute kFCHBARoutes[] = {
     {CID_COMPUTER_SYSTEM, CID_COMPUTER_SYSTEM, false, computerSystem},
     {CID_PORT_CONTROLLER, CID_PORT_CONTROLLER, true, adapters},
@@ -40,7 +45,7 @@ const InventoryRoute kFCHBARoutes[] = {
     {CID_PHYSICAL_PACKAGE, CID_ADAPTER_SOFTWARE_IDENTITY, true, adapters},
     {CID_REMOTE_SERVICE_ACCESS_POINT, CID_REMOTE_SERVICE_ACCESS_POINT, false, nullptr},
     {CID_HBA_SOFTWARE_INSTALLATION_SERVICE, CID_HBA_SOFTWARE_INSTALLATION_SERVICE_CAPABILITIES,
-     true, nullptr},
+     true, softwareUpdate},
     {CID_ETHERNET_PORT, CID_ETHERNET_PORT, true, ethernetPorts},
     {CID_MEMORY_DIAGNOSTIC_TEST, CID_DIAGNOSTIC_COMPLETION_RECORD, true, nullptr},
     {CID_LOGICAL_PORT_GROUP, CID_LOGICAL_PORT_GROUP, true, ports},

@@ -38,9 +38,10 @@ inline Array<Instance*> fromHDRManager(classId_t classId) {
 
 // How the instances of a request are handed on.
 enum Inventory_Delivery {
-    ANNOUNCED,  // logs "Returning instances" first
-    QUIET,      // does not
-    SINGLE      // exactly one instance or the request fails
+    ANNOUNCED,         // logs "Returning instances" first
+    QUIET,             // does not
+    SINGLE,            // exactly one instance or the request fails
+    SINGLE_OR_NOTHING  // exactly one instance, else none (the request succeeds)
 };
 
 struct Inventory_Source {
@@ -85,7 +86,8 @@ Enum_Instances_Status enumerate_inventory(const Inventory_Source& source,
     log(LL_DBG, source.file, source.line, "Entering: %s", "enum_instances");
     Inventory_Answer answer(source.dispatcher(source.classId));
 
-    const bool found = source.delivery == SINGLE ? answer.size() == 1 : answer.size() != 0;
+    const bool single = source.delivery == SINGLE || source.delivery == SINGLE_OR_NOTHING;
+    const bool found = single ? answer.size() == 1 : answer.size() != 0;
     if (!found) {
         log(source.noInstancesLevel, source.file, source.line, "%s", source.noInstances);
         log(LL_DBG, source.file, source.line, "Returning: %s", "enum_instances");
