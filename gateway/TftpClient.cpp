@@ -7,6 +7,7 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <cstring>
@@ -177,6 +178,7 @@ int Transfer::run(const char* remoteName, std::string& error) {
     sendLast();
 
     const auto timeout = std::chrono::milliseconds(_options.timeoutMs > 0 ? _options.timeoutMs : 1);
+    const auto end = Clock::now() + std::chrono::milliseconds(std::max(_options.totalMs, 1));
     auto deadline = Clock::now() + timeout;
     int resent = 0;
     uint16_t expected = 1;
@@ -185,6 +187,10 @@ int Transfer::run(const char* remoteName, std::string& error) {
 
     for (;;) {
         auto now = Clock::now();
+        if (now >= end) {
+            error = "not complete after " + std::to_string(_options.totalMs) + " ms";
+            return -1;
+        }
         if (now >= deadline) {
             if (resent >= _options.retries) {
                 error = "timed out waiting for block " + std::to_string(expected);
@@ -195,7 +201,9 @@ int Transfer::run(const char* remoteName, std::string& error) {
             deadline = now + timeout;
             continue;
         }
-        auto wait = std::chrono::duration_cast<std::chrono::milliseconds>(deadline - now).count();
+        auto wait =
+            std::chrono::duration_cast<std::chrono::milliseconds>(std::min(deadline, end) - now)
+                .count();
         pollfd pfd = {_sock, POLLIN, 0};
         int ready = ::poll(&pfd, 1, int(wait) + 1);
         if (ready < 0 && errno != EINTR) {

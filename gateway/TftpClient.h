@@ -2,10 +2,13 @@
 //
 // Each packet is waited for `timeoutMs`; on a time-out the last packet sent
 // (the read request or the last acknowledgement) is sent again, at most
-// `retries` times in a row, before the transfer fails. The server's transfer
-// port is fixed by its first data packet; packets from elsewhere are refused
-// ("Unknown transfer ID") or ignored. Block numbers wrap after 65535, so
-// files beyond 32 MiB are fine up to `maxBytes`.
+// `retries` times in a row, before the transfer fails. However the server
+// paces its packets, a transfer that has not ended after `totalMs` fails: with
+// the defaults a dead server costs 18 s and any server at most 60 s (looking
+// up a server name is the resolver's business and comes on top). The
+// server's transfer port is fixed by its first data packet; packets from
+// elsewhere are refused ("Unknown transfer ID") or ignored. Block numbers wrap
+// after 65535, so files beyond 32 MiB are fine up to `maxBytes`.
 #ifndef CPTA_GATEWAY_TFTPCLIENT_H
 #define CPTA_GATEWAY_TFTPCLIENT_H
 
@@ -17,6 +20,7 @@ namespace CPTA {
 struct TftpOptions {
     int timeoutMs = 3000;
     int retries = 5;
+    int totalMs = 60000;
     uint64_t maxBytes = uint64_t(256) << 20;
 };
 

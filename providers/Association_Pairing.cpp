@@ -27,6 +27,8 @@
 #include "schema/generated/TAVRIN_EthernetPort.h"
 #include "schema/generated/TAVRIN_FCPort.h"
 #include "schema/generated/TAVRIN_FCPortStatistics.h"
+#include "schema/generated/TAVRIN_HBASoftwareInstallationService.h"
+#include "schema/generated/TAVRIN_HBASoftwareInstallationServiceCapabilities.h"
 #include "schema/generated/TAVRIN_LANEndpoint.h"
 #include "schema/generated/TAVRIN_LogicalPortGroup.h"
 #include "schema/generated/TAVRIN_Namespace.h"
@@ -71,6 +73,10 @@ const Meta_Class* class_of(classId_t id) {
         case CID_REMOTE_SERVICE_ACCESS_POINT:
             return &TAVRIN_RemoteServiceAccessPoint::static_meta_class;
         case CID_TAPE_DRIVE: return &TAVRIN_TapeDrive::static_meta_class;
+        case CID_HBA_SOFTWARE_INSTALLATION_SERVICE:
+            return &TAVRIN_HBASoftwareInstallationService::static_meta_class;
+        case CID_HBA_SOFTWARE_INSTALLATION_SERVICE_CAPABILITIES:
+            return &TAVRIN_HBASoftwareInstallationServiceCapabilities::static_meta_class;
         case CID_ETHERNET_PORT: return &TAVRIN_EthernetPort::static_meta_class;
         case CID_LOGICAL_PORT_GROUP: return &TAVRIN_LogicalPortGroup::static_meta_class;
         case CID_LAN_ENDPOINT: return &TAVRIN_LANEndpoint::static_meta_class;

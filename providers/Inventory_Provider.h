@@ -38,11 +38,12 @@ inline Array<Instance*> fromHDRManager(classId_t classId) {
 
 // How the instances of a request are handed on.
 enum Inventory_Delivery {
-    ANNOUNCED,    // logs "Returning instances" first
-    QUIET,        // does not
-    SINGLE,       // exactly one instance or the request fails
-    REQUIRED,     // quiet, and no instance fails the request
-    AT_MOST_ONE,  // announced; none is no failure, several fail the request
+    ANNOUNCED,          // logs "Returning instances" first
+    QUIET,              // does not
+    SINGLE,             // exactly one instance or the request fails
+    SINGLE_OR_NOTHING,  // exactly one instance, else none (the request succeeds)
+    REQUIRED,           // quiet, and no instance fails the request
+    AT_MOST_ONE,        // announced; none is no failure, several fail the request
 };
 
 struct Inventory_Source {
@@ -94,7 +95,8 @@ Enum_Instances_Status enumerate_inventory(const Inventory_Source& source,
         log(LL_DBG, source.file, source.line, "Returning: %s", "enum_instances");
         return ENUM_INSTANCES_FAILED;
     }
-    const bool found = source.delivery == SINGLE ? answer.size() == 1 : answer.size() != 0;
+    const bool single = source.delivery == SINGLE || source.delivery == SINGLE_OR_NOTHING;
+    const bool found = single ? answer.size() == 1 : answer.size() != 0;
     if (!found) {
         if (source.noInstances != nullptr)
             log(source.noInstancesLevel, source.file, source.line, "%s", source.noInstances);

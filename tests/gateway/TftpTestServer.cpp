@@ -148,6 +148,8 @@ void TftpTestServer::serve(const std::string& name, const sockaddr_in& client) {
             close(stray);
         }
 
+        if (faults.blockDelayMs > 0)
+            usleep(useconds_t(faults.blockDelayMs) * 1000);
         bool acked = false;
         for (int attempt = 0; attempt < 10 && !acked && !_stop; attempt++) {
             if (int(block) == faults.dropBlockOnce && !dropped)

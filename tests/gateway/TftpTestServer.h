@@ -21,6 +21,7 @@ public:
         int ignoreRequests = 0;    // read requests dropped before one is answered
         int dropBlockOnce = -1;    // first transmission of this block is not sent
         bool strayPacket = false;  // before block 2, a DATA packet from another port
+        int blockDelayMs = 0;      // each block is sent this late
     };
 
     TftpTestServer();

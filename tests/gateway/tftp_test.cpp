@@ -95,6 +95,18 @@ TEST_F(TftpClient, SilentServerTimesOutAfterTheRetries) {
     EXPECT_EQ(server.requests().size(), 4u);
 }
 
+TEST_F(TftpClient, SlowServerIsCutOffAfterTheTotalTime) {
+    // Each block comes well within its time-out, the whole file far too late.
+    server.addFile("slow.bin", content(20 * 512));
+    TftpTestServer::Faults faults;
+    faults.blockDelayMs = 100;
+    server.setFaults(faults);
+    TftpOptions options = quick();
+    options.totalMs = 500;
+    EXPECT_EQ(fetch("slow.bin", options), -1);
+    EXPECT_EQ(error, "not complete after 500 ms");
+}
+
 TEST_F(TftpClient, SizeLimit) {
     server.addFile("large.bin", content(3000));
     TftpOptions options = quick();

@@ -4,10 +4,11 @@
 // simulator fixture, "default" when not given). Each "$ " line is a tvrncli
 // command line without "tvrncli" ('...' quotes words, "<host>" stands for the
 // host string); the lines up to the next "$ " line are what it prints, stdout
-// then stderr. The requests of a file run in order on a module freshly set to
-// the fixture, so a method call is seen by the requests after it. To add a
-// case, add a "$ " line and run with TVRN_GOLDEN_UPDATE=1 to write the
-// answers, then read them.
+// then stderr; "<golden>" in a command stands for this directory, where the
+// files a request reads live. The requests of a file run in order on a module
+// freshly set to the fixture, so a method call is seen by the requests after
+// it. To add a case, add a "$ " line and run with TVRN_GOLDEN_UPDATE=1 to
+// write the answers, then read them.
 //
 // The head may also hold "seed: <file>" (instances in tvrncli's --seed form,
 // path relative to the source tree, which the CIM server holds during the
@@ -118,6 +119,15 @@ std::string withoutTrailingNewlines(std::string text) {
     return text;
 }
 
+// The command line with "<golden>" replaced by this directory.
+std::string expanded(std::string command) {
+    const std::string placeholder = "<golden>", dir = TVRN_GOLDEN_DIR;
+    for (size_t at = command.find(placeholder); at != std::string::npos;
+         at = command.find(placeholder, at + dir.size()))
+        command.replace(at, placeholder.size(), dir);
+    return command;
+}
+
 std::vector<std::string> goldenFiles() {
     std::vector<std::string> files;
     for (const auto& entry : std::filesystem::directory_iterator(TVRN_GOLDEN_DIR))
@@ -163,7 +173,7 @@ TEST_P(Golden, File) {
     if (update == nullptr || *update == '\0' || std::string(update) == "0") {
         for (const Golden_Case& c : cases)
             EXPECT_EQ(withoutTrailingNewlines(c.expected),
-                      withoutTrailingNewlines(session.cli(c.command)))
+                      withoutTrailingNewlines(session.cli(expanded(c.command))))
                 << path << ":" << c.line << ": $ " << c.command;
         return;
     }
@@ -171,7 +181,7 @@ TEST_P(Golden, File) {
     if (!withoutTrailingNewlines(head).empty())
         os << withoutTrailingNewlines(head) << "\n\n";
     for (size_t i = 0; i < cases.size(); i++) {
-        const std::string answer = withoutTrailingNewlines(session.cli(cases[i].command));
+        const std::string answer = withoutTrailingNewlines(session.cli(expanded(cases[i].command)));
         os << (i > 0 ? "\n" : "") << "$ " << cases[i].command << "\n"
            << answer << (answer.empty() ? "" : "\n");
     }

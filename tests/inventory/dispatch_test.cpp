@@ -13,7 +13,7 @@ using namespace invtest;
 
 namespace {
 
-const std::set<int> kFCHBAServed = {1, 2, 3, 4, 5, 6, 7, 8, 20, 30, 34, 35, 36};
+const std::set<int> kFCHBAServed = {1, 2, 3, 4, 5, 6, 7, 8, 18, 19, 20, 30, 34, 35, 36};
 const std::set<int> kHDRServed = {9, 16, 38};
 
 class Dispatch : public InventoryTest {};

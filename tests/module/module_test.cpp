@@ -158,8 +158,15 @@ TEST(Module, RegistersEveryProviderOnceInTableOrder) {
 }
 
 // This program runs on the simulator's "empty" host: nothing to enumerate but
-// the host itself and the server profile, nothing to change, no method but
-// SetAlarmState.
+// the host itself, the server profile and the firmware update service (with
+// the associations between them), nothing to change, no method but
+// SetAlarmState and InstallFromURI.
+const std::set<std::string> kOnePerHost = {
+    "TAVRIN_ComputerSystem", "TAVRIN_HBASoftwareInstallationService",
+    "TAVRIN_HBASoftwareInstallationServiceCapabilities",
+    "TAVRIN_HBASoftwareInstallationServiceElementCapabilities",
+    "TAVRIN_HBASoftwareInstallationServiceHostedService"};
+
 TEST(Module, EveryProviderAnswersWithoutAdapters) {
     Host host;
     ASSERT_TRUE(host.load(TVRN_MODULE, TVRN_MODULE_REG).ok());
@@ -176,10 +183,9 @@ TEST(Module, EveryProviderAnswersWithoutAdapters) {
         if (reg.kinds & kInstanceMI) {
             instance_classes++;
             const auto profile = tvrntest::serverProfileCounts().find(reg.className);
-            const size_t expected = reg.className == "TAVRIN_ComputerSystem" ? 1
-                                    : profile != tvrntest::serverProfileCounts().end()
+            const size_t expected = profile != tvrntest::serverProfileCounts().end()
                                         ? profile->second
-                                        : 0;
+                                        : kOnePerHost.count(reg.className);
             Result<Instance> all = host.enumerateInstances(NS, reg.className);
             EXPECT_TRUE(all.ok()) << all.toString();
             EXPECT_EQ(all.items.size(), expected);
@@ -204,7 +210,10 @@ TEST(Module, EveryProviderAnswersWithoutAdapters) {
         }
         for (const std::string& method : methods_of(mc)) {
             methods++;
-            const bool served = reg.className == "TAVRIN_AlarmDevice" && method == "SetAlarmState";
+            const bool served =
+                (reg.className == "TAVRIN_AlarmDevice" && method == "SetAlarmState") ||
+                (reg.className == "TAVRIN_HBASoftwareInstallationService" &&
+                 method == "InstallFromURI");
             EXPECT_EQ(host.invokeMethod(path, method).rc,
                       served ? CMPI_RC_OK : CMPI_RC_ERR_NOT_SUPPORTED)
                 << method;
