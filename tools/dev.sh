@@ -4,6 +4,11 @@
 #   tools/dev.sh run    install missing packages, build, and run the main job
 #   tools/dev.sh test   install missing packages, build, and run the whole test suite
 #   tools/dev.sh build  install missing packages and build only
+#   tools/dev.sh server sfcb|pegasus
+#                       install the prebuilt CIM server of the shared directory
+#                       beside the repository (../shared, else /work/shared)
+#                       afresh under /opt, with its run-time packages and the
+#                       client wbemcli (for the integration tests, as root)
 #
 # Environment:
 #   TVRN_BUILD_DIR    build directory (default: build at the repository root)
@@ -24,7 +29,7 @@ packages=(build-essential cmake pkg-config python3 libjsoncpp-dev
 
 install_missing() {
   local missing=() p
-  for p in "${packages[@]}"; do
+  for p in "$@"; do
     dpkg-query -W -f='${Status}' "$p" 2>/dev/null | grep -q 'install ok installed' || missing+=("$p")
   done
   [ ${#missing[@]} -eq 0 ] && return 0
@@ -57,14 +62,47 @@ configure_and_build() {
   cmake --build "$build" -j "$jobs"
 }
 
+# A CIM server package of the shared directory: its directory there, the
+# directory it unpacks to, the PID file of its running daemon, its run-time
+# packages (and the client the integration tests use).
+server_sfcb=(sfcb /opt/sfcb var/run/sfcbd.pid libcurl4 zlib1g sblim-wbemcli)
+server_pegasus=(pegasus /opt/pegasus var/run/cimserver.pid libstdc++6 libgcc-s1 libcrypt1 sblim-wbemcli)
+
+install_server() {
+  local spec
+  case ${1:-} in
+    sfcb) spec=("${server_sfcb[@]}") ;;
+    pegasus) spec=("${server_pegasus[@]}") ;;
+    *) echo "usage: $0 server sfcb|pegasus" >&2; exit 2 ;;
+  esac
+  local name=${spec[0]} dir=${spec[1]} pidfile=${spec[1]}/${spec[2]} shared="" d
+  for d in "$root/../shared" /work/shared; do
+    [ -d "$d/$name" ] && { shared=$(cd "$d/$name" && pwd); break; }
+  done
+  [ -n "$shared" ] || { echo "no $name package: neither $root/../shared/$name nor /work/shared/$name exists" >&2; exit 1; }
+  local tarballs=("$shared"/*.tar.xz)
+  [ ${#tarballs[@]} -eq 1 ] && [ -f "${tarballs[0]}" ] ||
+    { echo "expected one $name package (*.tar.xz) in $shared" >&2; exit 1; }
+  [ "$(id -u)" -eq 0 ] || { echo "installing under $dir needs root" >&2; exit 1; }
+  if [ -s "$pidfile" ] && kill -0 "$(cat "$pidfile")" 2>/dev/null; then
+    echo "$name is running (pid $(cat "$pidfile")); stop it first" >&2
+    exit 1
+  fi
+  install_missing "${spec[@]:3}"
+  rm -rf "$dir"
+  tar -xJf "${tarballs[0]}" -C /
+  echo "Installed ${tarballs[0]##*/} under $dir"
+}
+
 main_job() {
   "$root/tools/main-job.sh" "$build"
 }
 
 case "$mode" in
-  run)   install_missing; configure_and_build; main_job ;;
-  test)  install_missing; configure_and_build
+  run)   install_missing "${packages[@]}"; configure_and_build; main_job ;;
+  test)  install_missing "${packages[@]}"; configure_and_build
          ctest --test-dir "$build" --output-on-failure -j "$jobs" ;;
-  build) install_missing; configure_and_build ;;
-  *) echo "usage: $0 run|test|build" >&2; exit 2 ;;
+  build) install_missing "${packages[@]}"; configure_and_build ;;
+  server) install_server "${2:-}" ;;
+  *) echo "usage: $0 run|test|build|server sfcb|pegasus" >&2; exit 2 ;;
 esac

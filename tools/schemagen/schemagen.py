@@ -19,6 +19,7 @@ import sys
 sys.dont_write_bytecode = True  # keep the source tree clean
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 
+import emit_mof  # noqa: E402
 import emit_providers  # noqa: E402
 import emit_schema  # noqa: E402
 import model  # noqa: E402
@@ -28,10 +29,12 @@ OUTPUT_DIRS = ["schema/generated", "providers/generated"]
 
 
 def generate(cim_mof, root):
-    schema = model.build(mof.parse_file(cim_mof),
-                         mof.parse_file(os.path.join(root, "schema", "tavrin.mof")))
+    cim = mof.parse_file(cim_mof)
+    tavrin = mof.parse_file(os.path.join(root, "schema", "tavrin.mof"))
+    schema = model.build(cim, tavrin)
     result = emit_schema.files(schema)
     result.update(emit_providers.files(schema))
+    result.update(emit_mof.files(cim, tavrin))
     return result
 
 
