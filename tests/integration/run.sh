@@ -1,0 +1,156 @@
+#!/usr/bin/env bash
+# Integration tests against a real CIM server, on the adapter-library
+# simulator's built-in host:
+#
+#   tests/integration/run.sh sfcb|pegasus
+#
+# As root, from a built tree (tools/dev.sh build). It installs the prebuilt
+# server of the shared directory afresh, then installs, registers and starts
+# with the README's own commands (each is looked up in README.md before it
+# runs), and compares what wbemcli gets from the server with what tvrncli
+# gives (check.py): every class of `classes`, gi of every path returned,
+# the requests of `requests` (associations, methods, bad requests, after
+# which the provider process must be the same), then the module without
+# libdtfaj.so on the loader path, and unloading and loading it again. It
+# stops the server whatever happens. See README.md in this directory.
+set -euo pipefail
+
+server=${1:-}
+case $server in sfcb | pegasus) ;; *) echo "usage: $0 sfcb|pegasus" >&2; exit 2 ;; esac
+root=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
+cd "$root"
+here=tests/integration
+url=http://localhost:5988/root/tavrin
+scratch=$(mktemp -d)
+failures=0
+unset TVRN_SIM_FIXTURE # the built-in host, for the server and tvrncli alike
+
+say() { printf '\n== %s: %s\n' "$server" "$*"; }
+fail() {
+  echo "FAILED: $*" >&2
+  failures=$((failures + 1))
+}
+
+# Runs a command that README.md shows on a line of its own (blanks and a
+# trailing "# comment" aside), so the README is what the tests prove.
+readme() {
+  awk -v want="$1" '{ sub(/^[ \t]+/, ""); sub(/[ \t]+#.*$/, ""); if ($0 == want) found = 1 }
+                    END { exit !found }' README.md ||
+    { echo "not in README.md: $1" >&2; exit 1; }
+  echo "+ $1"
+  eval "$1"
+}
+
+# check.py with tvrncli on the loader path the server was given.
+check() { LD_LIBRARY_PATH=${loader_path:-} python3 "$here/check.py" "$@"; }
+
+stop_server() {
+  case $server in
+    sfcb) /opt/sfcb/bin/sfcb-stop >/dev/null || true ;;
+    pegasus) /opt/pegasus/bin/pegasus-stop >/dev/null || true ;;
+  esac
+}
+trap 'stop_server; rm -rf "$scratch"' EXIT
+
+# The pid of the process that has the module loaded, waiting a little for
+# it to appear or (with "gone") to go.
+module_pid() {
+  local i
+  for i in $(seq 1 ${2:-10}); do
+    if [ "${1:-}" = gone ]; then
+      check pid >/dev/null 2>&1 || return 0
+    else
+      check pid 2>/dev/null && return 0
+    fi
+    sleep 1
+  done
+  return 1
+}
+
+# Enumerations, gets, requests; the provider process is the same at the end.
+compare_all() {
+  say "enumerations and gets, property by property"
+  check classes "$here/classes" --gi || fail "classes differ"
+  local pid
+  pid=$(module_pid) || { fail "no process has the module loaded"; return; }
+  say "associations, methods, bad requests (provider pid $pid)"
+  check requests "$here/requests" || fail "requests differ"
+  [ "$(module_pid)" = "$pid" ] || fail "the provider process did not survive (pid $pid)"
+  check classes <(echo TAVRIN_AlarmDevice) || fail "a method left a change behind"
+}
+
+# Without libdtfaj.so the providers answer: the computer system, and every
+# other class with nothing.
+compare_without_library() {
+  say "without libdtfaj.so on the loader path"
+  check classes "$here/classes" || fail "classes differ without the library"
+  [ "$(wbemcli ein "$url:TAVRIN_ComputerSystem" | wc -l)" -eq 1 ] ||
+    fail "no computer system without the library"
+}
+
+# A module unloaded answers again, from a new process, once loaded again.
+reloaded_from_new_process() {
+  local before=$1
+  check classes <(printf 'TAVRIN_ComputerSystem\nTAVRIN_FCPort\n') || fail "classes differ after reloading"
+  local after
+  after=$(module_pid) || { fail "the module was not loaded again"; return; }
+  [ "$after" != "$before" ] || fail "the module was not unloaded (pid $before)"
+}
+
+run_sfcb() {
+  readme 'tools/dev.sh server sfcb'
+  readme 'tools/dev.sh build'
+  readme 'cmake --install build'
+  readme 'DTFAJ_DIR=$PWD/build/lib/sim'
+  readme 'tools/register.sh sfcb'
+  readme '/opt/sfcb/bin/sfcb-stop'
+  readme 'SFCB_LD_LIBRARY_PATH=$DTFAJ_DIR /opt/sfcb/bin/sfcb-start'
+  loader_path=$DTFAJ_DIR
+  compare_all
+  readme '/opt/sfcb/bin/sfcb-stop'
+
+  # Idle providers are unloaded after providerTimeoutInterval; shortened here.
+  sed '/^providerTimeoutInterval:/d; /^providerSampleInterval:/d' /opt/sfcb/etc/sfcb/sfcb.cfg \
+    >"$scratch/sfcb.cfg"
+  printf 'providerTimeoutInterval: 4\nproviderSampleInterval: 2\n' >>"$scratch/sfcb.cfg"
+  loader_path=
+  SFCB_CONFIG=$scratch/sfcb.cfg /opt/sfcb/bin/sfcb-start
+  compare_without_library
+  local pid
+  pid=$(module_pid) || { fail "no process has the module loaded"; return; }
+  say "idle unload (pid $pid) and load again"
+  module_pid gone 30 || fail "the module stayed loaded while idle (pid $pid)"
+  reloaded_from_new_process "$pid"
+}
+
+run_pegasus() {
+  readme 'tools/dev.sh server pegasus'
+  readme 'tools/dev.sh build'
+  readme 'cmake --install build'
+  readme 'DTFAJ_DIR=$PWD/build/lib/sim'
+  readme 'PEGASUS_LD_LIBRARY_PATH=$DTFAJ_DIR /opt/pegasus/bin/pegasus-start'
+  readme 'tools/register.sh pegasus'
+  loader_path=$DTFAJ_DIR
+  compare_all
+
+  local pid
+  pid=$(module_pid) || { fail "no process has the module loaded"; return; }
+  say "unload by disabling the module (pid $pid), load again by enabling it"
+  readme '/opt/pegasus/bin/cimprovider -d -m tvrnprovider_Module'
+  module_pid gone || fail "disabling did not unload the module (pid $pid)"
+  local answer
+  answer=$(wbemcli ein "$url:TAVRIN_FCPort" 2>&1 || true)
+  grep -q 'CIM_ERR_NOT_SUPPORTED' <<<"$answer" || fail "a disabled module still answers: $answer"
+  readme '/opt/pegasus/bin/cimprovider -e -m tvrnprovider_Module'
+  reloaded_from_new_process "$pid"
+  readme '/opt/pegasus/bin/pegasus-stop'
+
+  loader_path=
+  /opt/pegasus/bin/pegasus-start
+  compare_without_library
+}
+
+started=$SECONDS
+run_"$server"
+say "done in $((SECONDS - started)) s, $failures failure(s)"
+[ "$failures" -eq 0 ]
