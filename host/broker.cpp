@@ -387,7 +387,9 @@ CMPIInstance* eNewInstance(B b, OP op, CMPIStatus* rc) {
         setRc(rc, CMPI_RC_ERR_INVALID_PARAMETER);
         return nullptr;
     }
-    return newObject<InstanceObj>(b, rc, Instance(p->path));
+    return upcall(b, rc, static_cast<CMPIInstance*>(nullptr), [&](HostImpl& h) {
+        return &make<InstanceObj>(h.currentArena(), h.newInstance(p->path))->c;
+    });
 }
 
 CMPIObjectPath* eNewObjectPath(B b, const char* ns, const char* cn, CMPIStatus* rc) {

@@ -81,19 +81,28 @@ size_t storedSize(int type) {
     return type == STRING || type == DATETIME ? sizeof(const char*) : type_size(type);
 }
 
-// The property's default as a MOF literal.
-std::string defaultValue(const Meta_Property* mp) {
+// The property's default; a null value of its type when it has none.
+Value defaultOf(const Meta_Property* mp) {
     const void* value = mp->value;
-    if (!type_name(mp->type))
-        return "NULL";
+    const auto type = typeFromName(type_name(mp->type) ? type_name(mp->type) : "");
+    if (!type)
+        return Value();
+    if (!value)
+        return Value::null(*type, mp->subscript != 0);
     if (!mp->subscript)
-        return mofValue(storedValue(mp->type, value));
+        return storedValue(mp->type, value);
     // Every Meta_Value_Array<T> has the same layout: elements, then count.
     const auto* array = static_cast<const Meta_Value_Array<unsigned char>*>(value);
     std::vector<Value> elements;
     for (size_t i = 0; i < array->num_elements; ++i)
         elements.push_back(storedValue(mp->type, array->elements + i * storedSize(mp->type)));
-    return mofValue(Value::array(*typeFromName(type_name(mp->type)), elements));
+    return Value::array(*type, elements);
+}
+
+// The type of a reference slot: an embedded instance or a path.
+Type referenceType(const Meta_Feature* mf) {
+    return mf->flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT) ? Type::Instance
+                                                                       : Type::Reference;
 }
 
 const char* typeName(int type) {
@@ -116,7 +125,7 @@ std::string declaration(const Meta_Feature* mf, bool parameter) {
     std::string s = qualifiers(mf->flags, nullptr, parameter) + typeName(mp->type) + ' ' +
                     mf->name + arrayMark(mp->subscript);
     if (mp->value)
-        s += " = " + defaultValue(mp);
+        s += " = " + mofValue(defaultOf(mp));
     return s;
 }
 
@@ -158,6 +167,55 @@ std::string classMof(const Meta_Class& mc) {
         s += ";\n";
     }
     return s + "};\n";
+}
+
+ClassInfo classInfo(const Meta_Class& mc) {
+    ClassInfo ci;
+    ci.name = mc.name;
+    if (const Meta_Class* super = super_meta_class_of(&mc))
+        ci.superclass = super->name;
+    for (size_t i = 0; i < mc.num_meta_features; ++i) {
+        const Meta_Feature* mf = mc.meta_features[i];
+        if (mf->flags & FLAG_PROPERTY) {
+            ci.properties.push_back(
+                {mf->name, defaultOf(reinterpret_cast<const Meta_Property*>(mf))});
+        } else if (mf->flags & FLAG_REFERENCE) {
+            const auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+            ci.properties.push_back({mf->name, Value::null(referenceType(mf), mr->subscript != 0)});
+        } else if (mf->flags & FLAG_METHOD) {
+            const auto* mm = reinterpret_cast<const Meta_Method*>(mf);
+            MethodInfo m{mm->name, {}};
+            for (size_t j = 0; j < mm->num_meta_features; ++j) {
+                const Meta_Feature* p = mm->meta_features[j];
+                if (!(p->flags & FLAG_IN) || std::strcmp(p->name, "return_value") == 0)
+                    continue;
+                if (p->flags & FLAG_REFERENCE) {
+                    const auto* r = reinterpret_cast<const Meta_Reference*>(p);
+                    m.parameters.push_back({p->name, referenceType(p), r->subscript != 0});
+                } else {
+                    const auto* pp = reinterpret_cast<const Meta_Property*>(p);
+                    const auto type = typeFromName(type_name(pp->type) ? type_name(pp->type) : "");
+                    if (type)
+                        m.parameters.push_back({p->name, *type, pp->subscript != 0});
+                }
+            }
+            ci.methods.push_back(std::move(m));
+        }
+    }
+    return ci;
+}
+
+RepositoryClasses::RepositoryClasses(const Meta_Repository& repository) {
+    for (size_t i = 0; i < repository.num_meta_classes; ++i) {
+        ClassInfo ci = classInfo(*repository.meta_classes[i]);
+        std::string key = toLower(ci.name);
+        classes_.emplace(std::move(key), std::move(ci));
+    }
+}
+
+const ClassInfo* RepositoryClasses::find(std::string_view className) const {
+    auto it = classes_.find(toLower(className));
+    return it == classes_.end() ? nullptr : &it->second;
 }
 
 std::vector<std::string> RepositoryCatalog::classNames() const {

@@ -6,6 +6,7 @@
 #ifndef TVRN_HOST_CLASSINFO_H
 #define TVRN_HOST_CLASSINFO_H
 
+#include <map>
 #include <optional>
 #include <string>
 #include <vector>
@@ -35,14 +36,30 @@ std::vector<std::string> classNames(const CPTA::Meta_Repository& repository);
 // ("Class"). Every parameter states In: `In` or `In (false)`.
 std::string classMof(const CPTA::Meta_Class& meta_class);
 
+// The class as the host takes it from a repository (host.h): properties and
+// their defaults, the input parameters of its methods.
+ClassInfo classInfo(const CPTA::Meta_Class& meta_class);
+
+class RepositoryClasses : public ClassRepository {
+public:
+    explicit RepositoryClasses(const CPTA::Meta_Repository& repository);
+    const ClassInfo* find(std::string_view className) const override;
+
+private:
+    std::map<std::string, ClassInfo> classes_;  // by lower-case name
+};
+
 class RepositoryCatalog : public cli::ClassCatalog {
 public:
-    explicit RepositoryCatalog(const CPTA::Meta_Repository& repository) : repository_(repository) {}
+    explicit RepositoryCatalog(const CPTA::Meta_Repository& repository)
+        : repository_(repository), classes_(repository) {}
     std::vector<std::string> classNames() const override;
     std::optional<std::string> classMof(const std::string& name) const override;
+    const ClassRepository* classes() const override { return &classes_; }
 
 private:
     const CPTA::Meta_Repository& repository_;
+    RepositoryClasses classes_;
 };
 
 // The catalog over the module's own repository.

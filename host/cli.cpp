@@ -659,6 +659,7 @@ int run(const std::vector<std::string>& args, std::ostream& out, std::ostream& e
     }
     HostOptions options;
     options.principal = inv.principal;
+    options.classes = inv.catalog ? inv.catalog->classes() : nullptr;
     Host host(options);
     if (!usesModule(inv.command))
         return execute(host, inv, out, err);

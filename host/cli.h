@@ -31,6 +31,8 @@ public:
     virtual std::vector<std::string> classNames() const = 0;
     // The class declaration in MOF, or nullopt for an unknown class.
     virtual std::optional<std::string> classMof(const std::string& name) const = 0;
+    // The classes for the host to serve requests with (HostOptions::classes).
+    virtual const ClassRepository* classes() const { return nullptr; }
 };
 
 struct Defaults {

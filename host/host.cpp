@@ -286,9 +286,14 @@ bool HostImpl::isA(const std::string& cls, const std::string& super) const {
         if (c == target)
             return true;
         auto it = superOf.find(c);
-        if (it == superOf.end())
+        if (it != superOf.end()) {
+            c = it->second;
+            continue;
+        }
+        const ClassInfo* ci = opts.classes ? opts.classes->find(c) : nullptr;
+        if (!ci || ci->superclass.empty())
             return false;
-        c = it->second;
+        c = toLower(ci->superclass);
     }
     return false;
 }
@@ -342,8 +347,10 @@ bool HostImpl::nameSpaceKnown(const std::string& ns) const {
 }
 
 bool HostImpl::classKnown(const std::string& ns, const std::string& cls) const {
+    // The class repository holds the classes of the namespaces served.
+    const bool inRepository = opts.classes && opts.classes->find(cls);
     for (const auto& e : classes)
-        if (equalsIgnoreCase(e.ns, ns) && isA(e.className, cls))
+        if (equalsIgnoreCase(e.ns, ns) && (inRepository || isA(e.className, cls)))
             return true;
     {
         std::lock_guard<std::mutex> g(classMutex);
@@ -717,12 +724,16 @@ Status HostImpl::invokeMethod(const Req& r, const ObjectPath& p, const std::stri
             return st;
         return Status{CMPI_RC_ERR_NOT_SUPPORTED, "no method provider for " + p.className()};
     }
+    PropertyVector args = in;
+    Status typed = typedArguments(p, method, args);
+    if (!typed.ok())
+        return typed;
     std::vector<Value> items;
     Status st = callMI<CMPIMethodMI>(
         *e->provider, r, ns, &items,
         [&](CMPIMethodMI* mi, const CMPIContext* ctx, const CMPIResult* res, Arena& a) {
             auto* op = make<PathObj>(a, p);
-            auto* ai = make<ArgsObj>(a, in);
+            auto* ai = make<ArgsObj>(a, args);
             auto* ao = make<ArgsObj>(a);
             CMPIStatus cs =
                 mi->ft->invokeMethod(mi, ctx, res, &op->c, method.c_str(), &ai->c, &ao->c);

@@ -18,6 +18,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "host/registration.h"
@@ -89,10 +90,47 @@ public:
     virtual void clear() = 0;
 };
 
+// A class as a CIM server knows it from its class repository.
+struct ParameterInfo {
+    std::string name;
+    Type type = Type::String;  // Reference for a REF, Instance for an embedded instance
+    bool array = false;
+};
+
+struct MethodInfo {
+    std::string name;
+    std::vector<ParameterInfo> parameters;  // the input parameters
+};
+
+struct ClassInfo {
+    std::string name;
+    std::string superclass;  // empty for a root class
+    // Every property, inherited ones too, in the class's order, with the
+    // class's default (a null value of the property's type where it has none).
+    PropertyVector properties;
+    std::vector<MethodInfo> methods;
+};
+
+// The classes of the namespaces the host serves. With one, the host does
+// what a server does with its repository: new instances start with the
+// class's defaults, a superclass of a served class is a class it knows (as
+// the class of an enumeration, an association class or a result class),
+// and method arguments are converted to the declared parameter types.
+class ClassRepository {
+public:
+    virtual ~ClassRepository() = default;
+    // Case-insensitive; null for an unknown class.
+    virtual const ClassInfo* find(std::string_view className) const = 0;
+};
+
 struct HostOptions {
     std::string principal = "root";  // context entry CMPIPrincipal
     unsigned invocationFlags = 0;    // context entry CMPIInvocationFlags
     bool keepMapped = false;         // do not dlclose provider libraries
+    // Classes of the served namespaces; none: the host knows only the
+    // classes the registrations name and those declared by addSubclass.
+    // Not owned; it must outlive the host.
+    const ClassRepository* classes = nullptr;
 };
 
 namespace detail {

@@ -333,6 +333,13 @@ public:
     void deliver(const std::string& ns, Instance inst);
     void log(std::string line);
     bool isA(const std::string& cls, const std::string& super) const;
+    // A new instance on `path`, with the class's defaults when the host
+    // knows the class (classes.cpp).
+    Instance newInstance(const ObjectPath& path) const;
+    // The arguments as the declared parameters of the method take them;
+    // not OK for an argument that does not convert (classes.cpp).
+    Status typedArguments(const ObjectPath& target, const std::string& method,
+                          PropertyVector& args) const;
     StoreImpl& store(const std::string& ns);  // made on first use
     std::vector<Instance> storedInstances(const std::string& ns) const;
 

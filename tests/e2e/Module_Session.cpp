@@ -13,6 +13,7 @@
 #include <gtest/gtest.h>
 #include <json/json.h>
 
+#include "host/classinfo.h"
 #include "host/cli.h"
 
 namespace tvrne2e {
@@ -145,7 +146,10 @@ bool Module_Session::start(const std::string& fixture, const std::string& logLev
         std::cerr << "Module_Session: fixture " << fixture << ": " << tvrn_sim_last_error() << "\n";
         return false;
     }
-    _host.reset(new tvrnhost::Host);
+    // The module's classes, as a server has them from its repository.
+    tvrnhost::HostOptions options;
+    options.classes = tvrnhost::classinfo::moduleCatalog().classes();
+    _host.reset(new tvrnhost::Host(options));
     tvrnhost::Status st = _host->load(TVRN_MODULE, TVRN_MODULE_REG);
     if (!st.ok()) {
         std::cerr << "Module_Session: " << st.toString() << "\n";

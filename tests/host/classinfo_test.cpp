@@ -3,6 +3,8 @@
 // the built program in cli_test.cpp.
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 #include "framework/Meta_Lookup.h"
 #include "host/classinfo.h"
 #include "schema/Repository.h"
@@ -141,6 +143,28 @@ TEST(ClassMof, CatalogLooksClassesUpWithoutRegardToCase) {
     EXPECT_EQ(catalog.classMof("test_leaf"), classinfo::classMof(kLeaf));
     EXPECT_EQ(catalog.classMof("Test_Other"), std::nullopt);
     EXPECT_EQ(catalog.classMof(""), std::nullopt);
+}
+
+// What the host serves requests with: properties in order with their
+// defaults, superclass, typed input parameters.
+TEST(RepositoryClasses, AsTheHostTakesThem) {
+    const ClassInfo* extent = classinfo::moduleCatalog().classes()->find("tavrin_storageextent");
+    ASSERT_NE(extent, nullptr);
+    EXPECT_EQ(extent->superclass, "CIM_StorageExtent");
+    EXPECT_EQ(extent->properties.front().name, "InstanceID");
+    EXPECT_EQ(*findProperty(extent->properties, "NameFormat"), tvrnhost::Value::uint16(12));
+    EXPECT_EQ(*findProperty(extent->properties, "Name"),
+              tvrnhost::Value::null(tvrnhost::Type::String));
+    EXPECT_EQ(*findProperty(extent->properties, "OperationalStatus"),
+              tvrnhost::Value::null(tvrnhost::Type::Uint16, true));
+    const ClassInfo* alarm = classinfo::moduleCatalog().classes()->find("TAVRIN_AlarmDevice");
+    ASSERT_NE(alarm, nullptr);
+    const auto set = std::find_if(alarm->methods.begin(), alarm->methods.end(),
+                                  [](const MethodInfo& m) { return m.name == "SetAlarmState"; });
+    ASSERT_NE(set, alarm->methods.end());
+    ASSERT_EQ(set->parameters.size(), 1u);
+    EXPECT_EQ(set->parameters[0].name, "RequestedAlarmState");
+    EXPECT_EQ(set->parameters[0].type, tvrnhost::Type::Uint16);
 }
 
 }  // namespace
