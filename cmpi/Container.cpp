@@ -13,6 +13,13 @@ bool _selected(const Meta_Feature* mf, uint32 flags) {
     return flags == 0 || (mf->flags & flags) != 0;
 }
 
+// A null property that the class gives a default: it is sent as a null,
+// since a server that fills new instances with the class defaults would
+// otherwise show the default instead.
+bool _null_over_default(const Meta_Feature* mf) {
+    return __is_property(mf) && __as_property(mf)->value != nullptr;
+}
+
 // Whether the slot of the feature holds nothing to convert.
 bool _is_null(const Instance* instance, const Meta_Feature* mf) {
     if (__is_property(mf)) {
@@ -53,7 +60,7 @@ int Container::convert(const Instance* instance, uint32 flags) {
         const Meta_Feature* mf = mc->meta_features[i];
         if (!_selected(mf, flags) || !(__is_property(mf) || __is_reference(mf)))
             continue;
-        if (_is_null(instance, mf))
+        if (_is_null(instance, mf) && !_null_over_default(mf))
             continue;
         Value value;
         if (value.set(instance, mf) != 0) {

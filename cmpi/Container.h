@@ -27,7 +27,8 @@ public:
     // Stores a value under name; flags are those of the feature: 0 or -1.
     virtual int set_value(const char* name, const Value& value, uint32 flags) = 0;
 
-    // Model to container: every feature of the instance that is not null
+    // Model to container: every feature of the instance that is not null,
+    // and every null property whose class gives it a default, as a null
     // (restricted to features with one of the flag bits when flags is not 0).
     // Features that cannot be converted are logged and skipped. -1 only for
     // a missing instance.
