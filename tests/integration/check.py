@@ -7,8 +7,9 @@ answers.
                                     and with --gi every returned path gets
                                     the same instance back
     check.py requests FILE          every request line of FILE (see below)
-    check.py pid                    the pid of the process that has the
-                                    module loaded (none: exit 1)
+    check.py pid LIBRARY            the pid of the one process that has
+                                    LIBRARY (a path) loaded; exit 1 when
+                                    none or several have
 
 Options before the command: --url (default http://localhost:5988/root/tavrin),
 --tvrncli (default build/bin/tvrncli), --module (tvrncli's module; default
@@ -420,14 +421,14 @@ def check_requests(clients, path):
     return ok
 
 
-def module_pid():
+def module_pids(library):
     pids = []
     for entry in os.listdir("/proc"):
         if not entry.isdigit():
             continue
         try:
             with open("/proc/%s/maps" % entry) as f:
-                if MODULE_FILE in f.read():
+                if library in f.read():
                     pids.append(int(entry))
         except OSError:
             pass
@@ -445,14 +446,14 @@ def main(argv):
     c.add_argument("--gi", action="store_true")
     r = sub.add_parser("requests")
     r.add_argument("file")
-    sub.add_parser("pid")
+    sub.add_parser("pid").add_argument("library")
     args = ap.parse_args(argv)
     clients = Clients(args)
     try:
         if args.command == "pid":
-            pids = module_pid()
+            pids = module_pids(os.path.realpath(args.library))
             if len(pids) != 1:
-                print("processes with %s loaded: %s" % (MODULE_FILE, pids or "none"), file=sys.stderr)
+                print("processes with %s loaded: %s" % (args.library, pids or "none"), file=sys.stderr)
                 return 1
             print(pids[0])
             return 0

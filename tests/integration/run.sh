@@ -52,15 +52,15 @@ stop_server() {
 }
 trap 'stop_server; rm -rf "$scratch"' EXIT
 
-# The pid of the process that has the module loaded, waiting a little for
-# it to appear or (with "gone") to go.
+# The pid of the process that has the server's copy of the module loaded,
+# waiting a little for it to appear or (with "gone") to go.
 module_pid() {
   local i
   for i in $(seq 1 ${2:-10}); do
     if [ "${1:-}" = gone ]; then
-      check pid >/dev/null 2>&1 || return 0
+      check pid "$server_module" >/dev/null 2>&1 || return 0
     else
-      check pid 2>/dev/null && return 0
+      check pid "$server_module" 2>/dev/null && return 0
     fi
     sleep 1
   done
@@ -98,6 +98,7 @@ reloaded_from_new_process() {
 }
 
 run_sfcb() {
+  server_module=/opt/sfcb/lib/cmpi/libtvrnprovider.so
   readme 'tools/dev.sh server sfcb'
   readme 'tools/dev.sh build'
   readme 'cmake --install build'
@@ -124,6 +125,7 @@ run_sfcb() {
 }
 
 run_pegasus() {
+  server_module=/opt/pegasus/providers/libtvrnprovider.so
   readme 'tools/dev.sh server pegasus'
   readme 'tools/dev.sh build'
   readme 'cmake --install build'
