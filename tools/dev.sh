@@ -69,13 +69,13 @@ server_sfcb=(sfcb /opt/sfcb var/run/sfcbd.pid libcurl4 zlib1g sblim-wbemcli)
 server_pegasus=(pegasus /opt/pegasus var/run/cimserver.pid libstdc++6 libgcc-s1 libcrypt1 sblim-wbemcli)
 
 install_server() {
-  local spec
+  local package
   case ${1:-} in
-    sfcb) spec=("${server_sfcb[@]}") ;;
-    pegasus) spec=("${server_pegasus[@]}") ;;
+    sfcb) package=("${server_sfcb[@]}") ;;
+    pegasus) package=("${server_pegasus[@]}") ;;
     *) echo "usage: $0 server sfcb|pegasus" >&2; exit 2 ;;
   esac
-  local name=${spec[0]} dir=${spec[1]} pidfile=${spec[1]}/${spec[2]} shared="" d
+  local name=${package[0]} dir=${package[1]} pidfile=${package[1]}/${package[2]} shared="" d
   for d in "$root/../shared" /work/shared; do
     [ -d "$d/$name" ] && { shared=$(cd "$d/$name" && pwd); break; }
   done
@@ -88,7 +88,7 @@ install_server() {
     echo "$name is running (pid $(cat "$pidfile")); stop it first" >&2
     exit 1
   fi
-  install_missing "${spec[@]:3}"
+  install_missing "${package[@]:3}"
   rm -rf "$dir"
   tar -xJf "${tarballs[0]}" -C /
   echo "Installed ${tarballs[0]##*/} under $dir"
