@@ -15,7 +15,7 @@
 set -euo pipefail
 
 usage() {
-  sed -n '7,9s/^# *//p' "$0" | sed 's/^/usage: /' >&2
+  { echo "usage:"; sed -n '7,9s/^#//p' "$0"; } >&2
   exit 2
 }
 die() {
