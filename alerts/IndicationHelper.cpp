@@ -1,7 +1,10 @@
 #include "alerts/IndicationHelper.h"
 
+#include <chrono>
 #include <cstdio>
+#include <cstring>
 #include <memory>
+#include <mutex>
 #include <string>
 
 #include <json/json.h>
@@ -14,7 +17,6 @@
 #include "gateway/GuardedCall.h"
 #include "gateway/JsonAccess.h"
 #include "gateway/ProviderUtil.h"
-#include "inventory/HostIdentityScope.h"
 #include "schema/generated/TAVRIN_ComputerSystem.h"
 #include "schema/generated/TAVRIN_EthernetPort.h"
 #include "schema/generated/TAVRIN_FCPort.h"
@@ -53,6 +55,25 @@ const Event_Member kEventMembers[] = {
 
 // Only event names of this form are passed on.
 const char kEventNamePrefix[] = "TFA_";
+
+// The text naming this host in indications and paths. A look-up costs some
+// 100 microseconds (the resolver reads its files every time), which a burst
+// of events would pay for every event; an answer is used for a second.
+String hostText() {
+    static std::mutex mutex;
+    static String text;
+    static std::chrono::steady_clock::time_point expires;
+    const auto now = std::chrono::steady_clock::now();
+    std::lock_guard<std::mutex> lock(mutex);
+    if (text.size() == 0 || now >= expires) {
+        char host[255];
+        std::memset(host, 0, sizeof(host));
+        ProviderUtil::getHostInfo(host, sizeof(host));
+        text = host;
+        expires = now + std::chrono::seconds(1);
+    }
+    return text;
+}
 
 struct Indication_Deleter {
     void operator()(TAVRIN_AlertIndication* indication) const { destroy(indication); }
@@ -137,7 +158,7 @@ Indication_Ptr baseIndication(const Event& event, const String& eventName) {
     TAVRIN_AlertIndication& i = *indication;
     i.AlertingElementFormat.set(2);  // CIM object path
     i.SystemCreationClassName.set(ProviderUtil::getClassName(CID_COMPUTER_SYSTEM));
-    i.SystemName.set(HostIdentityScope::hostText());
+    i.SystemName.set(hostText());
     i.ProviderName.set("tvrnprovider");
     const Datetime now = Datetime::now();
     i.EventTime.set(now);
@@ -172,7 +193,6 @@ int translate(const char* eventText, IndicationHelper& helper) {
     Event event;
     if (!event.read(eventText))
         return 0;
-    HostIdentityScope scope;
     const int category = event.category();
     const int id = event.id();
     const String name = event.text("eventIdValue");
@@ -265,7 +285,7 @@ struct Path_Model {
             TVRN_LOG(LL_ERR, "Unable to build the object path of a %s", C::static_meta_class.name);
             return String();
         }
-        return ProviderUtil::updateNamespacePath(model);
+        return ProviderUtil::namespacePath(hostText().c_str(), model);
     }
 
     C* instance;
@@ -277,7 +297,7 @@ String devicePath(classId_t classId, const String& deviceId) {
     if (model.instance) {
         model.instance->SystemCreationClassName.set(
             ProviderUtil::getClassName(CID_COMPUTER_SYSTEM));
-        model.instance->SystemName.set(HostIdentityScope::hostText());
+        model.instance->SystemName.set(hostText());
         model.instance->CreationClassName.set(ProviderUtil::getClassName(classId));
         model.instance->DeviceID.set(deviceId);
     }
@@ -379,7 +399,7 @@ String getComputerSystemObjectPath() {
     Path_Model<TAVRIN_ComputerSystem> model;
     if (model.instance) {
         model.instance->CreationClassName.set(ProviderUtil::getClassName(CID_COMPUTER_SYSTEM));
-        model.instance->Name.set(HostIdentityScope::hostText());
+        model.instance->Name.set(hostText());
     }
     return model.path();
 }

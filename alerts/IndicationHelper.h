@@ -20,10 +20,10 @@ namespace CPTA {
 
 class IndicationHelper {
 public:
-    // Indications that may wait for delivery. Each takes 1 to 2 KB, so a full
-    // queue holds about 20 MB of the CIM server's memory; that holds a storm
-    // in which every remote port of a large SAN logs out at once (some
-    // thousands of events) even while the server does not take indications.
+    // Indications that may wait for delivery. Each takes about 1.5 KB, so a
+    // full queue holds some 15 MB of the CIM server's memory; that holds a
+    // storm in which every remote port of a large SAN logs out at once (some
+    // thousands of events) even while the server takes no indications.
     static constexpr size_t kQueueBound = 10000;
 
     static IndicationHelper* getIndicationHelperInstance();

@@ -264,6 +264,27 @@ TEST_F(Alerts, AFailedThreadStartUnsubscribes) {
     EXPECT_EQ(logged("ERR", "Unable to start the indication thread"), 1);
 }
 
+// While the server does not take indications, the oldest make room; the
+// delivery thread logs how many.
+TEST_F(Alerts, DropsBeyondTheBoundAreLogged) {
+    Receiver receiver;
+    ASSERT_EQ(delivery.enable(receiver.handler()), ENABLE_INDICATIONS_OK);
+    receiver.hold();
+    IndicationQueue& queue = IndicationHelper::getIndicationHelperInstance()->queue();
+    std::vector<TAVRIN_AlertIndication*> burst(queue.bound() + 6);
+    for (TAVRIN_AlertIndication*& indication : burst)
+        indication = create<TAVRIN_AlertIndication>(true);
+    queue.push(burst.data(), 1);
+    ASSERT_TRUE(receiver.waitFor(1));  // the thread waits in the handler
+    queue.push(burst.data() + 1, burst.size() - 1);
+    receiver.release();
+    ASSERT_TRUE(receiver.waitFor(queue.bound() + 1));
+    EXPECT_EQ(delivery.disable(), DISABLE_INDICATIONS_OK);
+    EXPECT_EQ(logged("WARN", "5 indications dropped: more than 10000 were waiting"), 1);
+    const auto got = receiver.delivered();
+    EXPECT_EQ(got[1].sequence, got[0].sequence + 6);
+}
+
 // What was queued and not delivered when delivery stopped is not handed to
 // the next subscriber.
 TEST_F(Alerts, QueuedIndicationsDoNotOutliveADisable) {
