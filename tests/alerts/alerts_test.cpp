@@ -296,7 +296,7 @@ TEST_F(Alerts, QueuedIndicationsDoNotOutliveADisable) {
     tvrn_sim_emit_event(portEvent("stale").c_str());
     tvrn_sim_wait_events(10000);
     std::thread disabling([&] { delivery.disable(); });
-    while (tvrn_sim_emit_event(kPortEvent) == 1)  // until unsubscribed
+    while (delivery.running())  // until told to stop
         std::this_thread::sleep_for(std::chrono::milliseconds(1));
     first.release();
     disabling.join();
