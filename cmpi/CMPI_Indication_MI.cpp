@@ -147,17 +147,9 @@ CMPIStatus enableIndications(CMPIIndicationMI* mi, const CMPIContext* context) {
 CMPIStatus disableIndications(CMPIIndicationMI* mi, const CMPIContext* context) {
     return run_entry("disableIndications", mi ? mi->hdl : nullptr, context,
                      [&](CMPI_Adapter* adapter, Entry_Scope&) -> Entry_Status {
-                         if (!adapter->indications().enabled)
-                             return CMPI_RC_OK;
-                         struct Disabling {
-                             std::atomic<bool>& flag;
-                             explicit Disabling(std::atomic<bool>& f) : flag(f) { flag = true; }
-                             ~Disabling() { flag = false; }
-                         } disabling(adapter->indications().disabling);
-                         Disable_Indications_Status status = adapter->disable_indications();
-                         adapter->indications().enabled = false;
-                         return status == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED
-                                                                     : CMPI_RC_OK;
+                         return stop_indications(adapter) == DISABLE_INDICATIONS_FAILED
+                                    ? CMPI_RC_ERR_FAILED
+                                    : CMPI_RC_OK;
                      });
 }
 
@@ -170,6 +162,19 @@ void set_indication_entries(CMPIIndicationMIFT& ft) {
     ft.deActivateFilter = deactivateFilter;
     ft.enableIndications = enableIndications;
     ft.disableIndications = disableIndications;
+}
+
+Disable_Indications_Status stop_indications(CMPI_Adapter* adapter) {
+    if (!adapter->indications().enabled)
+        return DISABLE_INDICATIONS_OK;
+    struct Disabling {
+        std::atomic<bool>& flag;
+        explicit Disabling(std::atomic<bool>& f) : flag(f) { flag = true; }
+        ~Disabling() { flag = false; }
+    } disabling(adapter->indications().disabling);
+    Disable_Indications_Status status = adapter->disable_indications();
+    adapter->indications().enabled = false;
+    return status;
 }
 
 }  // namespace CPTA

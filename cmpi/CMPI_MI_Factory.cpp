@@ -39,6 +39,9 @@ CMPIStatus _cleanup(CMPI_Adapter* adapter, bool terminating) {
         status.rc = CMPI_RC_DO_NOT_UNLOAD;
     } else if (adapter->mi_count() == 1) {
         try {
+            // No request of the provider runs any more; a delivery may, and
+            // may hold the adapter's mutex until it is done.
+            stop_indications(adapter);
             adapter->unload();
         } catch (...) {
             TVRN_LOG(LL_ERR, "unload of %s failed", adapter->registration()->provider_name);

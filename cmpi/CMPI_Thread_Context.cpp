@@ -91,6 +91,18 @@ void CMPI_Thread_Context::thread_exit_hook() {
     }
 }
 
+// The broker has no service that drops a prepared context, but detaching
+// releases the context of an attached thread: attached and detached at once,
+// the context made for a thread that never ran is released.
+void CMPI_Thread_Context::thread_not_started_hook() {
+    try {
+        if (CBAttachThread(_broker, _context).rc == CMPI_RC_OK)
+            CBDetachThread(_broker, _context);
+    } catch (...) {
+        TVRN_LOG(LL_ERR, "cannot release the context prepared for a thread");
+    }
+}
+
 //------------------------------------------------------------------------------
 // Enumeration
 //------------------------------------------------------------------------------

@@ -29,6 +29,7 @@ public:
     Thread_Context* thread_create_hook(void* arg) override;
     void thread_start_hook() override;
     void thread_exit_hook() override;
+    void thread_not_started_hook() override;
 
     Instance_Enumerator_Rep* instance_enumerator_create(const char* name_space,
                                                         const Instance* model) override;

@@ -85,15 +85,18 @@ int Thread::_create(Thread& thread, Thread_Proc proc, void* arg, bool detached) 
 
     pthread_attr_t attr;
     int r = pthread_attr_init(&attr);
-    if (r != 0)
-        return r;
-    pthread_attr_setdetachstate(&attr,
-                                detached ? PTHREAD_CREATE_DETACHED : PTHREAD_CREATE_JOINABLE);
     pthread_t tid;
-    r = pthread_create(&tid, &attr, _thread_proc, start.get());
-    pthread_attr_destroy(&attr);
-    if (r != 0)
+    if (r == 0) {
+        pthread_attr_setdetachstate(&attr,
+                                    detached ? PTHREAD_CREATE_DETACHED : PTHREAD_CREATE_JOINABLE);
+        r = pthread_create(&tid, &attr, _thread_proc, start.get());
+        pthread_attr_destroy(&attr);
+    }
+    if (r != 0) {
+        if (context)
+            context->thread_not_started_hook();
         return r;  // the context and the start record are destroyed here
+    }
     thread._tid = tid;
     start.release();  // now owned by the new thread
     context.release();

@@ -26,6 +26,10 @@ public:
     // Called on the new thread around its procedure.
     virtual void thread_start_hook() = 0;
     virtual void thread_exit_hook() = 0;
+    // Called on the creating thread instead, when the thread that a context
+    // from thread_create_hook() was made for could not be started: releases
+    // what was prepared for it.
+    virtual void thread_not_started_hook() {}
 
     virtual Instance_Enumerator_Rep* instance_enumerator_create(const char* name_space,
                                                                 const Instance* model) = 0;

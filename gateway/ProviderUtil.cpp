@@ -340,6 +340,10 @@ String ProviderUtil::updateNamespacePath(const String& className) {
     char host[kHostBufferSize];
     std::memset(host, 0, sizeof(host));
     getHostInfo(host, sizeof(host));
+    return namespacePath(host, className);
+}
+
+String ProviderUtil::namespacePath(const char* host, const String& className) {
     String path("//", host, "/");
     path.append(NAMESPACE);
     path.append(':');

@@ -72,6 +72,8 @@ public:
     static String getHostName();  // uname's node name, or "localhost"
     // "//<host>/root/tavrin:<className>"
     static String updateNamespacePath(const String& className);
+    // The same for a host text already looked up.
+    static String namespacePath(const char* host, const String& className);
     // The CIM namespace of this module's classes.
     static constexpr const char* NAMESPACE = "root/tavrin";
     // Replaces the system look-up (null restores it).

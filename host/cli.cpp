@@ -221,6 +221,28 @@ int cmdCallMethod(Env& e, const CommandArgs& a) {
     return report(e, e.host.invokeMethod(p, a.positional[1], in), formatMethodResult);
 }
 
+// The indication as printed: only the properties of --props, when given.
+Instance shownIndication(const Env& e, Instance inst) {
+    if (!e.inv.props)
+        return inst;
+    std::vector<std::string> drop;
+    for (const auto& prop : inst.properties())
+        if (std::none_of(e.inv.props->begin(), e.inv.props->end(),
+                         [&](const std::string& n) { return equalsIgnoreCase(n, prop.name); }))
+            drop.push_back(prop.name);
+    for (const auto& name : drop)
+        inst.remove(name);
+    return inst;
+}
+
+size_t countArg(const std::string& text) {
+    char* end = nullptr;
+    const unsigned long long n = std::strtoull(text.c_str(), &end, 10);
+    if (text.empty() || !end || *end || text[0] == '-' || n == 0)
+        throw ParseError("--count must be a positive number");
+    return size_t(n);
+}
+
 int cmdIndications(Env& e, const CommandArgs& a) {
     double seconds = 10;
     if (a.positional.size() == 2) {
@@ -229,6 +251,7 @@ int cmdIndications(Env& e, const CommandArgs& a) {
         if (!end || *end || seconds < 0)
             throw ParseError("SECONDS must be a non-negative number");
     }
+    const size_t count = a.options.count("count") ? countArg(a.option("count")) : SIZE_MAX;
     const std::string &ns = e.inv.nameSpace, &cls = a.positional[0];
     e.host.clearIndications();
     Status st = e.host.subscribe(ns, cls);
@@ -237,17 +260,24 @@ int cmdIndications(Env& e, const CommandArgs& a) {
     const auto deadline = std::chrono::steady_clock::now() +
                           std::chrono::milliseconds(static_cast<long long>(seconds * 1000));
     size_t printed = 0;
-    for (;;) {
+    while (printed < count) {
         const auto now = std::chrono::steady_clock::now();
         if (now >= deadline)
             break;
         e.host.waitForIndications(
             printed + 1, std::chrono::duration_cast<std::chrono::milliseconds>(deadline - now));
         const auto all = e.host.indications();
-        for (; printed < all.size(); ++printed)
-            e.out << (printed ? "\n" : "") << formatInstance(all[printed].instance) << std::flush;
+        for (; printed < all.size() && printed < count; ++printed)
+            e.out << (printed ? "\n" : "")
+                  << formatInstance(shownIndication(e, all[printed].instance)) << std::flush;
     }
-    return reportStatus(e, e.host.unsubscribe(ns, cls));
+    const int rc = reportStatus(e, e.host.unsubscribe(ns, cls));
+    if (count != SIZE_MAX && printed < count) {
+        e.err << "tvrncli: " << printed << " of " << count << " indications arrived within "
+              << seconds << " s\n";
+        return 1;
+    }
+    return rc;
 }
 
 const ClassCatalog& catalog(const Env& e) {
@@ -408,9 +438,9 @@ const Command kCommands[] = {
      cmdCallMethod},
     {"im", "PATH METHOD [ARG=VALUE]...", "", {}, 2, SIZE_MAX, true, true, cmdCallMethod},
     {"ind",
-     "CLASS [SECONDS]",
-     "subscribe and print indications (default 10 s)",
-     {},
+     "CLASS [SECONDS] [--count N]",
+     "subscribe and print indications for SECONDS (default 10) or until N came",
+     {"count"},
      1,
      2,
      true,

@@ -1057,6 +1057,13 @@ std::vector<Indication> Host::indications() const {
     return impl_->inds;
 }
 
+std::vector<Indication> Host::takeIndications() {
+    std::lock_guard<std::mutex> g(impl_->indMutex);
+    std::vector<Indication> taken;
+    taken.swap(impl_->inds);
+    return taken;
+}
+
 void Host::clearIndications() {
     std::lock_guard<std::mutex> g(impl_->indMutex);
     impl_->inds.clear();

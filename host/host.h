@@ -187,6 +187,9 @@ public:
     Status unsubscribe(const std::string& ns, const std::string& className);
     // Indications delivered so far, in order of delivery.
     std::vector<Indication> indications() const;
+    // The same, removing them: none is missed or seen twice by a caller that
+    // takes them while more arrive.
+    std::vector<Indication> takeIndications();
     void clearIndications();
     // Waits until at least `count` indications have been delivered.
     bool waitForIndications(std::size_t count, std::chrono::milliseconds timeout) const;

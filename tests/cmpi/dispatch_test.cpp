@@ -3,6 +3,8 @@
 // fallbacks, methods, indications, unloading and threads.
 #include <gtest/gtest.h>
 
+#include <pthread.h>
+
 #include <chrono>
 #include <functional>
 #include <future>
@@ -520,10 +522,43 @@ TEST_F(Indications, EnablingTwiceAsksTheProviderOnce) {
     EXPECT_EQ(control("count:enable"), 3);
 
     EXPECT_EQ(mi->ft->cleanup(mi, nullptr, 1).rc, CMPI_RC_OK);
-    EXPECT_EQ(control("count:disable"), 2);  // the provider's unload stops its thread
+    // Stopped by the cleanup, then once more by the provider's own unload.
+    EXPECT_EQ(control("count:disable"), 3);
 
     // The MI is dead now.
     EXPECT_EQ(mi->ft->enableIndications(mi, nullptr).rc, CMPI_RC_ERR_FAILED);
+}
+
+// The server's last cleanup of a provider that does not stop its own
+// indications: the binding stops them before the adapter goes.
+TEST_F(Indications, CleanupStopsIndicationsTheProviderLeftRunning) {
+    control("flood", 100);
+    ASSERT_TRUE(host.subscribe("root/test", "TAVRIN_AlertIndication").ok());
+    ASSERT_TRUE(host.waitForIndications(5, std::chrono::seconds(20)));
+    control("force:unload", 0);
+    host.cleanup(true);
+    EXPECT_EQ(control("count:disable"), 1);
+    control("force:unload", -1);
+}
+
+// A delivery thread that cannot start leaves nothing of the server's behind.
+TEST_F(Indications, AThreadThatCannotStartReleasesItsContext) {
+    CMPIIndicationMI* mi = make_mi<CMPIIndicationMI>("Test_Alert_Create_IndicationMI");
+    ASSERT_TRUE(mi);
+    const size_t live = Host::liveObjects();
+    // Threads that ask for more stack than the address space holds cannot start.
+    pthread_attr_t defaults, huge;
+    ASSERT_EQ(pthread_getattr_default_np(&defaults), 0);
+    pthread_attr_init(&huge);
+    pthread_attr_setstacksize(&huge, size_t(1) << 46);
+    ASSERT_EQ(pthread_setattr_default_np(&huge), 0);
+    const CMPIrc rc = mi->ft->enableIndications(mi, nullptr).rc;
+    pthread_setattr_default_np(&defaults);
+    pthread_attr_destroy(&huge);
+    pthread_attr_destroy(&defaults);
+    EXPECT_EQ(rc, CMPI_RC_ERR_FAILED);
+    EXPECT_EQ(Host::liveObjects(), live);
+    EXPECT_EQ(mi->ft->cleanup(mi, nullptr, 1).rc, CMPI_RC_OK);
 }
 
 TEST_F(Indications, DisablingWhileTheThreadDeliversDoesNotHang) {

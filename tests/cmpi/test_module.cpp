@@ -384,8 +384,10 @@ public:
         return Indication_Provider<TAVRIN_AlertIndication>::disable_indications();
     }
 
+    // A forced unload answers at once, leaving its indications running.
     Unload_Status unload() {
-        disable_indications();
+        if (forced("unload") < 0)
+            disable_indications();
         return UNLOAD_OK;
     }
 
@@ -481,7 +483,7 @@ std::string _text;
 // "count:<name>"  a counter: load, unload, enum, enable, disable, delivered
 // "force:<op>"    forces value as the status of get, enum, create, modify,
 //                 delete, invoke, link.enum, associator_names, associators,
-//                 references, enable (-1: no longer)
+//                 references, enable, unload (-1: no longer)
 // "flood"         the alert thread delivers continuously, pausing value
 //                 microseconds between indications (-1: only on request)
 // "deliver"       the alert thread delivers value indications

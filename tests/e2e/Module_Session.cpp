@@ -235,7 +235,8 @@ std::string Module_Session::masked(const std::string& text) const {
     if (_hostName.empty())
         return text;
     // Only whole quoted values: "host" in MOF and in paths, \"host\" in a
-    // path quoted inside a reference value; and the host of a URL, //host:.
+    // path quoted inside a reference value; the host of a URL, //host:, and
+    // the host part of a path written as text, //host/.
     std::string out;
     std::size_t from = 0;
     for (std::size_t at = text.find(_hostName); at != std::string::npos;
@@ -243,8 +244,8 @@ std::string Module_Session::masked(const std::string& text) const {
         const std::size_t end = at + _hostName.size();
         const bool opens = at > 0 && text[at - 1] == '"';
         const bool closes = end < text.size() && (text[end] == '"' || text[end] == '\\');
-        const bool url =
-            at > 1 && text.compare(at - 2, 2, "//") == 0 && end < text.size() && text[end] == ':';
+        const bool url = at > 1 && text.compare(at - 2, 2, "//") == 0 && end < text.size() &&
+                         (text[end] == ':' || text[end] == '/');
         if (!(opens && closes) && !url)
             continue;
         out.append(text, from, at - from);

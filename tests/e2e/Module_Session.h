@@ -72,8 +72,8 @@ public:
     // returns what it printed, standard output then standard error, masked.
     // `status` receives its exit status.
     std::string cli(const std::string& commandLine, int* status = nullptr);
-    // `text` with the host string, where it is a whole quoted value or the
-    // host of a URL, as "<host>".
+    // `text` with the host string, where it is a whole quoted value, the host
+    // of a URL or the host part of a path ("//host/..."), as "<host>".
     std::string masked(const std::string& text) const;
 
     // The log lines since the mark, and how many of them contain `text`.

@@ -12,8 +12,10 @@
 //
 // The head may also hold "seed: <file>" (instances in tvrncli's --seed form,
 // path relative to the source tree, which the CIM server holds during the
-// file's requests) and "agent: running" (a process named mdcagent, the host
-// management agent, runs during the file's requests).
+// file's requests), "agent: running" (a process named mdcagent, the host
+// management agent, runs during the file's requests) and "mask: <Property>..."
+// (properties whose values, such as times, change from run to run: printed as
+// "<masked>").
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <spawn.h>
@@ -128,6 +130,22 @@ std::string expanded(std::string command) {
     return command;
 }
 
+// `answer` with the value of every MOF line "    <Property> = ...;" of a
+// masked property replaced.
+std::string maskedProperties(const std::string& answer, const std::vector<std::string>& masked) {
+    std::istringstream is(answer);
+    std::string out, line;
+    while (std::getline(is, line)) {
+        for (const std::string& property : masked) {
+            const std::string head = "    " + property + " = ";
+            if (line.compare(0, head.size(), head) == 0)
+                line = head + "<masked>;";
+        }
+        out += line + "\n";
+    }
+    return out;
+}
+
 std::vector<std::string> goldenFiles() {
     std::vector<std::string> files;
     for (const auto& entry : std::filesystem::directory_iterator(TVRN_GOLDEN_DIR))
@@ -143,7 +161,7 @@ TEST_P(Golden, File) {
     const std::string& path = GetParam();
     std::ifstream is(path);
     std::string head, fixture = "default", line, agent;
-    std::vector<std::string> seeds;
+    std::vector<std::string> seeds, masked;
     std::vector<Golden_Case> cases;
     for (int number = 1; std::getline(is, line); number++) {
         if (line.compare(0, 2, "$ ") == 0) {
@@ -161,6 +179,9 @@ TEST_P(Golden, File) {
                 seeds.push_back(value);
             else if (word == "agent:")
                 agent = value;
+            else if (word == "mask:")
+                for (masked.push_back(value); words >> value;)
+                    masked.push_back(value);
         }
     }
     ASSERT_FALSE(cases.empty()) << path << ": no \"$ \" line";
@@ -168,12 +189,14 @@ TEST_P(Golden, File) {
     ASSERT_TRUE(session.loaded());
     Seeds seeded(session.host(), seeds);
     std::unique_ptr<Agent> running(agent == "running" ? new Agent : nullptr);
+    auto answer = [&](const std::string& command) {
+        return withoutTrailingNewlines(maskedProperties(session.cli(expanded(command)), masked));
+    };
 
     const char* update = std::getenv("TVRN_GOLDEN_UPDATE");
     if (update == nullptr || *update == '\0' || std::string(update) == "0") {
         for (const Golden_Case& c : cases)
-            EXPECT_EQ(withoutTrailingNewlines(c.expected),
-                      withoutTrailingNewlines(session.cli(expanded(c.command))))
+            EXPECT_EQ(withoutTrailingNewlines(c.expected), answer(c.command))
                 << path << ":" << c.line << ": $ " << c.command;
         return;
     }
@@ -181,9 +204,9 @@ TEST_P(Golden, File) {
     if (!withoutTrailingNewlines(head).empty())
         os << withoutTrailingNewlines(head) << "\n\n";
     for (size_t i = 0; i < cases.size(); i++) {
-        const std::string answer = withoutTrailingNewlines(session.cli(expanded(cases[i].command)));
+        const std::string printed = answer(cases[i].command);
         os << (i > 0 ? "\n" : "") << "$ " << cases[i].command << "\n"
-           << answer << (answer.empty() ? "" : "\n");
+           << printed << (printed.empty() ? "" : "\n");
     }
 }
 

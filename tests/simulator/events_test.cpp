@@ -84,10 +84,11 @@ TEST_F(Events, QueuedUntilACallbackIsSetAndDroppedOnRequest) {
     EXPECT_EQ((std::vector<std::string>{"first", "fresh"}), texts());
 }
 
+// Comments of the fixture stay out of the event texts.
 TEST_F(Events, FixtureEventsFollowRegistration) {
-    ASSERT_EQ(
-        0, tvrn_sim_load_fixture_text(
-               R"({"events": [{"eventId": 3, "portIndexString": "00051e8a4b01"}, "raw text"]})"));
+    ASSERT_EQ(0, tvrn_sim_load_fixture_text(R"({"events": [
+                     // an Ethernet event
+                     {"eventId": 3, "portIndexString": "00051e8a4b01"}, "raw text"]})"));
     registerEventProcessingCb(collect);
     const unsigned long long before = tvrn_sim_events_delivered();
     subscribe();
