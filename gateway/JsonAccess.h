@@ -1,4 +1,5 @@
-// Reading members of library answers without exceptions.
+// Reading members of library answers without exceptions, and building the
+// simple requests.
 //
 // The adapter library answers with JSON of its own making, so a member may be
 // absent or of an unexpected type. Json::Value's own accessors throw on a type
@@ -105,6 +106,20 @@ inline const Json::Value& jsonObject(const Json::Value& v, const char* name) {
     static const Json::Value empty(Json::objectValue);
     const Json::Value* m = jsonMember(v, name);
     return m != nullptr && m->isObject() ? *m : empty;
+}
+
+// ---- building requests ------------------------------------------------------
+
+// A JSON string holding the text (which may hold NUL characters).
+inline Json::Value jsonText(const String& text) {
+    return Json::Value(text.c_str(), text.c_str() + text.size());
+}
+
+// A request with one member.
+inline Json::Value keyRequest(const char* member, const String& key) {
+    Json::Value request(Json::objectValue);
+    request[member] = jsonText(key);
+    return request;
 }
 
 }  // namespace CPTA

@@ -1,6 +1,7 @@
-// Utilities shared by every part of the module: class identifiers, the two
-// address forms, the host's identity, adapter look-ups through the adapter
-// library and a few system services.
+// Utilities shared by every part of the module: class names, the two address
+// forms and the text helpers, the host's identity, adapter look-ups through
+// the adapter library and a few system services (each duty in a source of
+// its own, ProviderUtil*.cpp).
 //
 // Address forms: the library is always addressed in colon format
 // ("10:00:00:05:33:a0:b1:c2", 23 characters for a WWN, 17 for a MAC); CIM key
@@ -24,9 +25,10 @@
 
 #include "framework/String.h"
 #include "gateway/ClassId.h"
-#include "gateway/TftpClient.h"
 
 namespace CPTA {
+
+struct TftpOptions;
 
 // How the host is looked up; replaceable so that tests can play any host.
 struct HostLookup {
@@ -63,7 +65,7 @@ public:
     // characters from 24 on. The second argument is not used.
     static String getNodeMACOrWWNFromTag(const String& tag, const String& unused = String());
 
-    // ---- host identity ----------------------------------------------------
+    // ---- host identity (ProviderUtil_Host.cpp) ----------------------------
     // Fills hostString (at most `length` bytes, NUL included) with the text
     // naming this host in keys and paths. Returns 0 when it is the first
     // non-loopback IPv4 address, 2 when it is the host name, 3 when it is
@@ -79,7 +81,7 @@ public:
     // Replaces the system look-up (null restores it).
     static void setHostLookup(const HostLookup* lookup);
 
-    // ---- adapter look-ups -------------------------------------------------
+    // ---- adapter look-ups (ProviderUtil_Adapters.cpp) ---------------------
     // Stores the library's adapter list in `adapters`; the number of adapters,
     // or -1 when the list is unusable.
     static int getNumberOfAdapters(Json::Value& adapters);
@@ -108,7 +110,7 @@ public:
     typedef int (*EthPortDetailsFn)(const String& portKey, Json::Value& port);
     static void setEthPortDetailsHook(EthPortDetailsFn hook);
 
-    // ---- system services --------------------------------------------------
+    // ---- system services (ProviderUtil_System.cpp) ------------------------
     static constexpr int AGENT_PORT = 34568;
     // AGENT_PORT when the host management agent (a process named mdcagent)
     // is running, else 0.
@@ -117,6 +119,13 @@ public:
     // listed under procRoot.
     static bool isProcessRunning(const char* name, const char* procRoot = "/proc");
 
+    static bool IsFileExist(const char* path);
+
+    // Log callback handed to the library: library levels 1..5 map to DBG,
+    // INFO, WARN, ERR, INFO (others DBG).
+    static void logMsg(int level, const char* file, int line, const char* message) noexcept;
+
+    // ---- TFTP downloads (ProviderUtil_Tftp.cpp) ---------------------------
     // Fetches `file` from TFTP server `server` ("host" or "host:port") into
     // the download directory, replacing any earlier copy; 0 on success, -1 on
     // failure (nothing left behind). The name must be relative, without ".."
@@ -128,10 +137,10 @@ public:
     // The download directory; "." (the process's working directory) unless set.
     static void setTftpDownloadDir(const String& dir);
     static String getTftpDownloadDir();
+    // Time-outs and size limit of the client (gateway/TftpClient.h).
     static void setTftpOptions(const TftpOptions& options);
 
-    static bool IsFileExist(const char* path);
-
+    // ---- text -------------------------------------------------------------
     // Copies input without leading and trailing blanks into output (at most
     // outputSize bytes, NUL included).
     static void trimString(const char* input, char* output, size_t outputSize);
@@ -139,13 +148,13 @@ public:
     static void trimString(const char* input, char (&output)[N]) {
         trimString(input, output, N);
     }
-
+    // The text without leading and trailing blanks, as trimString leaves it
+    // in a buffer of `width` bytes.
+    static String trimString(const String& text, size_t width);
+    // The first `width` characters.
+    static String firstChars(const String& text, size_t width);
     // Whether the first byte may begin a UTF-8 character.
     static bool valid_UTF_string(const char* text);
-
-    // Log callback handed to the library: library levels 1..5 map to DBG,
-    // INFO, WARN, ERR, INFO (others DBG).
-    static void logMsg(int level, const char* file, int line, const char* message) noexcept;
 };
 
 }  // namespace CPTA

@@ -4,6 +4,7 @@
 
 #include "gateway/CIMProviderTfaj.h"
 #include "gateway/JsonAccess.h"
+#include "gateway/ProviderUtil.h"
 #include "inventory/InventoryCommon.h"
 #include "schema/generated/TAVRIN_AdapterSoftwareIdentity.h"
 #include "schema/generated/TAVRIN_PhysicalPackage.h"
@@ -50,7 +51,7 @@ void fillCommonFields(AdapterHelper* helper, const Json::Value& hba, const Json:
     helper->fillVPDInfo(hba, &record);
     record.vendorCode = kVendorCode;
     record.firmwareVersion =
-        trimmedText(jsonString(firmware, "version"), _adapterData::VERSION_WIDTH);
+        ProviderUtil::trimString(jsonString(firmware, "version"), _adapterData::VERSION_WIDTH);
     record.model = jsonString(hba, "model");
 }
 
@@ -127,21 +128,21 @@ void AdapterHelper::walk(classId_t classId, InstanceList& out) {
         }
         record.hostName = HostIdentityScope::hostText();
         if (record.isCNA)
-            record.adapterMac = colonFree(jsonString(hba, "hbaMAC"));
+            record.adapterMac = ProviderUtil::eraseColonsFromIndex(jsonString(hba, "hbaMAC"));
 
         bool commonFilled = false;
         if (jsonHas(driver, "networkDriverName", Json::stringValue)) {
             record.networkDriverName = jsonString(driver, "networkDriverName");
-            record.networkDriverVersion = trimmedText(jsonString(driver, "networkDriverVersion"),
-                                                      _adapterData::VERSION_WIDTH);
+            record.networkDriverVersion = ProviderUtil::trimString(
+                jsonString(driver, "networkDriverVersion"), _adapterData::VERSION_WIDTH);
             fillCommonFields(this, hba, firmware, record);
             commonFilled = true;
         }
         if (jsonHas(driver, "storageDriverName", Json::stringValue)) {
-            record.adapterWwn = colonFree(jsonString(hba, "wwn"));
+            record.adapterWwn = ProviderUtil::eraseColonsFromIndex(jsonString(hba, "wwn"));
             record.storageDriverName = jsonString(driver, "storageDriverName");
-            record.storageDriverVersion = trimmedText(jsonString(driver, "storageDriverVersion"),
-                                                      _adapterData::VERSION_WIDTH);
+            record.storageDriverVersion = ProviderUtil::trimString(
+                jsonString(driver, "storageDriverVersion"), _adapterData::VERSION_WIDTH);
             if (!commonFilled)
                 fillCommonFields(this, hba, firmware, record);
         }
@@ -162,8 +163,8 @@ void AdapterHelper::walk(classId_t classId, InstanceList& out) {
                     out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, false));
                     storageDriverReported = true;
                 }
-                record.biosVersion =
-                    trimmedText(jsonString(firmware, "biosVersion"), _adapterData::VERSION_WIDTH);
+                record.biosVersion = ProviderUtil::trimString(jsonString(firmware, "biosVersion"),
+                                                              _adapterData::VERSION_WIDTH);
                 if (!ProviderUtil::valid_UTF_string(record.biosVersion.c_str()))
                     record.biosVersion.clear();
                 Json::Value flash = libGetFlashInfo(keyRequest("indexStr", key));

@@ -3,6 +3,7 @@
 #include <cstring>
 
 #include "framework/Log.h"
+#include "gateway/ProviderUtil.h"
 #include "inventory/InventoryCommon.h"
 #include "schema/generated/TAVRIN_ComputerSystem.h"
 

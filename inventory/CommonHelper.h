@@ -5,7 +5,7 @@
 
 #include "framework/Array.h"
 #include "framework/Instance.h"
-#include "gateway/ProviderUtil.h"
+#include "gateway/ClassId.h"
 
 namespace CPTA {
 

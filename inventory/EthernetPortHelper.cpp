@@ -68,7 +68,8 @@ Array<Instance*> EthernetPortHelper::getEthernetPortInstancesByAdapter(const Str
     return runWalk("EthernetPortHelper::getEthernetPortInstancesByAdapter", [&](InstanceList& out) {
         TVRN_LOG(LL_DBG, "getEthernetPortInstancesByMacAddress invoked with MAC Address = %s",
                  portKey.c_str());
-        Json::Value answer = libGetAdapterIdByPort(keyRequest("indexStr", colonForm(portKey)));
+        Json::Value answer = libGetAdapterIdByPort(
+            keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(portKey)));
         const Json::Value* id = jsonMember(answer, "adapterId");
         if (!ProviderUtil::isValidJsonResponse(answer) || id == nullptr ||
             !(id->isUInt() || id->isInt())) {
@@ -106,7 +107,7 @@ void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId
         const Json::Value& eth = jsonObject(details, "ethData");
         _ethPortInfo record;
         record.portNumber = sint32(i);
-        record.macId = colonFree(portKey);
+        record.macId = ProviderUtil::eraseColonsFromIndex(portKey);
         record.permanentMac = record.macId;
         record.hostName = HostIdentityScope::hostText();
         record.deviceName = jsonString(eth, "ethDev");
@@ -134,7 +135,8 @@ void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId
 
 int EthernetPortHelper::getEthPortDetails(const String& portKey, Json::Value& port) {
     if (!guardedCall(LibCall("libGetEthPortByEthMac", portKey, LibCall::KEY_AFTER_DEFAULT),
-                     libGetEthPortByEthMac, keyRequest("mac", colonForm(portKey)), port))
+                     libGetEthPortByEthMac,
+                     keyRequest("mac", ProviderUtil::getIndexInColonFormat(portKey)), port))
         return -1;
     if (!ProviderUtil::isValidJsonResponse(port) || !jsonHas(port, "ethData", Json::objectValue)) {
         TVRN_LOG(LL_ERR, "Ethernet Port Info is NOT available");

@@ -3,6 +3,7 @@
 #include <iterator>
 
 #include "framework/Log.h"
+#include "gateway/ProviderUtil.h"
 #include "inventory/AdapterHelper.h"
 #include "inventory/CommonHelper.h"
 #include "inventory/EthernetPortHelper.h"

@@ -15,7 +15,7 @@
 #include "framework/Array.h"
 #include "framework/Instance.h"
 #include "framework/String.h"
-#include "gateway/ProviderUtil.h"
+#include "gateway/ClassId.h"
 
 namespace CPTA {
 

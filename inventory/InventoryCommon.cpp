@@ -6,6 +6,7 @@
 #include "gateway/CIMProviderTfaj.h"
 #include "gateway/GuardedCall.h"
 #include "gateway/JsonAccess.h"
+#include "gateway/ProviderUtil.h"
 
 namespace CPTA {
 
@@ -53,34 +54,6 @@ void logWalkException(const char* operation, const HbaAgentError* user,
         TVRN_LOG(LL_ERR, "%s ended by default exception", operation);
 }
 
-String trimmedText(const String& text, size_t width) {
-    if (width == 0)
-        return String();
-    std::vector<char> buffer(width, '\0');
-    ProviderUtil::trimString(text.c_str(), buffer.data(), width);
-    return String(buffer.data());
-}
-
-String firstChars(const String& text, size_t width) {
-    return text.size() > width ? text.substr(0, width) : text;
-}
-
-Json::Value jsonText(const String& text) {
-    return Json::Value(text.c_str(), text.c_str() + text.size());
-}
-
-Json::Value keyRequest(const char* member, const String& key) {
-    Json::Value request(Json::objectValue);
-    request[member] = jsonText(key);
-    return request;
-}
-
-String decimal(long long value) {
-    char text[24];
-    std::snprintf(text, sizeof(text), "%lld", value);
-    return String(text);
-}
-
 uint16 enabledStateOf(long long portState) {
     switch (portState) {
         case 8: return 9;
@@ -113,7 +86,7 @@ String adapterKeyAt(const Json::Value& answer, int number) {
 }
 
 bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
-    const Json::Value colonId = jsonText(colonForm(portId));
+    const Json::Value colonId = jsonText(ProviderUtil::getIndexInColonFormat(portId));
     request = Json::Value(Json::objectValue);
     request["pPortWwn"] = colonId;
     request["lPortWwn"] = colonId;

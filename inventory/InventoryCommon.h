@@ -1,6 +1,7 @@
 // What the inventory helpers share: an owning list of built instances, the
-// shield that keeps library exceptions inside a walk, text and JSON helpers,
-// the CIM key and state rules common to several classes, and the adapter list.
+// shield that keeps library exceptions inside a walk, the CIM key and state
+// rules common to several classes, and the adapter list. (Text and address
+// helpers are ProviderUtil's, JSON helpers gateway/JsonAccess.h's.)
 #ifndef CPTA_INVENTORY_INVENTORYCOMMON_H
 #define CPTA_INVENTORY_INVENTORYCOMMON_H
 
@@ -16,7 +17,6 @@
 #include "framework/Log.h"
 #include "framework/String.h"
 #include "gateway/HbaAgentError.h"
-#include "gateway/ProviderUtil.h"
 #include "inventory/HostIdentityScope.h"
 
 namespace CPTA {
@@ -69,26 +69,6 @@ Array<Instance*> runWalk(const char* operation, Fill&& fill) noexcept {
     }
     return Array<Instance*>();
 }
-
-// ---- text ---------------------------------------------------------------------
-
-// The text without leading and trailing blanks, as ProviderUtil::trimString
-// leaves it in a buffer of `width` bytes.
-String trimmedText(const String& text, size_t width);
-// The first `width` characters.
-String firstChars(const String& text, size_t width);
-inline String colonFree(const String& key) {
-    return ProviderUtil::eraseColonsFromIndex(key);
-}
-inline String colonForm(const String& key) {
-    return ProviderUtil::getIndexInColonFormat(key);
-}
-// A JSON string holding the text.
-Json::Value jsonText(const String& text);
-// A request with one member.
-Json::Value keyRequest(const char* member, const String& key);
-// Decimal text of a number.
-String decimal(long long value);
 
 // ---- values ---------------------------------------------------------------------
 

@@ -1,6 +1,8 @@
 #include "inventory/PhysicalAssetHelper.h"
 
 #include "gateway/JsonAccess.h"
+#include "gateway/ProviderUtil.h"
+#include "inventory/ConnectorTag.h"
 #include "inventory/InventoryCommon.h"
 #include "inventory/PortHelper.h"
 #include "schema/generated/TAVRIN_PhysicalConnector.h"
@@ -59,17 +61,17 @@ void PhysicalAssetHelper::walk(classId_t classId, InstanceList& out) {
 _sfpInfo PhysicalAssetHelper::readOptic(const Json::Value& sfp, int adapterNumber,
                                         int portPosition) {
     _sfpInfo record;
-    record.vendorName = trimmedText(jsonString(sfp, "vendorName"), _sfpInfo::IDENT_WIDTH);
-    record.serialNo = trimmedText(jsonString(sfp, "serialNo"), _sfpInfo::IDENT_WIDTH);
-    record.vendorPart = trimmedText(jsonString(sfp, "vendorPart"), _sfpInfo::IDENT_WIDTH);
-    record.revision = trimmedText(jsonString(sfp, "revision"), _sfpInfo::REVISION_WIDTH);
-    record.speed = firstChars(jsonString(sfp, "speed"), _sfpInfo::SPEED_WIDTH);
-    record.extendedId = firstChars(jsonString(sfp, "extendedID"), _sfpInfo::EXTENDED_ID_WIDTH);
-    record.tag = record.serialNo;
-    record.tag.append('_');
-    record.tag.append(decimal(adapterNumber));
-    record.tag.append('_');
-    record.tag.append(decimal(portPosition));
+    record.vendorName =
+        ProviderUtil::trimString(jsonString(sfp, "vendorName"), _sfpInfo::IDENT_WIDTH);
+    record.serialNo = ProviderUtil::trimString(jsonString(sfp, "serialNo"), _sfpInfo::IDENT_WIDTH);
+    record.vendorPart =
+        ProviderUtil::trimString(jsonString(sfp, "vendorPart"), _sfpInfo::IDENT_WIDTH);
+    record.revision =
+        ProviderUtil::trimString(jsonString(sfp, "revision"), _sfpInfo::REVISION_WIDTH);
+    record.speed = ProviderUtil::firstChars(jsonString(sfp, "speed"), _sfpInfo::SPEED_WIDTH);
+    record.extendedId =
+        ProviderUtil::firstChars(jsonString(sfp, "extendedID"), _sfpInfo::EXTENDED_ID_WIDTH);
+    record.tag = connectorTag(record.serialNo, unsigned(adapterNumber), unsigned(portPosition));
     return record;
 }
 

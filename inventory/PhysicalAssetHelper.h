@@ -7,7 +7,7 @@
 
 #include "framework/Array.h"
 #include "framework/Instance.h"
-#include "gateway/ProviderUtil.h"
+#include "gateway/ClassId.h"
 #include "inventory/InventoryRecords.h"
 
 namespace CPTA {

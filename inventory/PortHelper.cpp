@@ -7,6 +7,7 @@
 #include "gateway/CIMProviderTfaj.h"
 #include "gateway/GuardedCall.h"
 #include "gateway/JsonAccess.h"
+#include "gateway/ProviderUtil.h"
 #include "inventory/InventoryCommon.h"
 #include "inventory/TargetHelper.h"
 #include "schema/generated/TAVRIN_AlarmDevice.h"
@@ -130,7 +131,7 @@ Array<Instance*> PortHelper::getInstancesByAdapterId(int adapterNumber, classId_
 Array<Instance*> PortHelper::getInstancesByAdapterAddress(const String& adapterKey,
                                                           classId_t classId) {
     return runWalk("PortHelper::getInstancesByAdapterAddress", [&](InstanceList& out) {
-        walkAdapter(colonForm(adapterKey), classId, BY_ADDRESS, out);
+        walkAdapter(ProviderUtil::getIndexInColonFormat(adapterKey), classId, BY_ADDRESS, out);
     });
 }
 
@@ -173,8 +174,8 @@ void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkFo
         _hbaPortInfo record;
         record.portNumber = sint32(i);
         record.hostName = HostIdentityScope::hostText();
-        record.portId = colonFree(jsonString(port, "wwn"));
-        record.nodeWwn = colonFree(jsonString(port, "nodeWwn"));
+        record.portId = ProviderUtil::eraseColonsFromIndex(jsonString(port, "wwn"));
+        record.nodeWwn = ProviderUtil::eraseColonsFromIndex(jsonString(port, "nodeWwn"));
         record.symbolicName = jsonString(port, "PortSymbolicName");
         const sint64 speed = jsonInt64(port, "operatingSpeed");
         record.speed = speed == kSpeedUnknown ? 0 : bitsPerSecond(speed);
@@ -246,7 +247,7 @@ void PortHelper::addEndpoints(_hbaPortInfo& record, InstanceList& out) {
         if (!jsonBool(device, "isTarget"))
             continue;
         record.portId.append('_');
-        record.portId.append(colonFree(remoteWwn));
+        record.portId.append(ProviderUtil::eraseColonsFromIndex(remoteWwn));
         record.portState = jsonInt(device, "stateMofValue");
         out.add(getSCSIProtocolEndpointInstance(record, false));
     }
@@ -290,7 +291,8 @@ prov_pport_stats_s PortHelper::readStatistics(const Json::Value& list, bool isFC
 
 int PortHelper::getNumberOfPorts(const String& adapterKey, Json::Value& ports) {
     try {
-        ports = libGetFcPhyPortIndicesByAdapter(keyRequest("indexStr", colonForm(adapterKey)));
+        ports = libGetFcPhyPortIndicesByAdapter(
+            keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(adapterKey)));
     } catch (const HbaAgentError& e) {
         logWalkException("PortHelper::getNumberOfPorts", &e, nullptr);
         return -1;
@@ -312,8 +314,8 @@ int PortHelper::getNumberOfPorts(const String& adapterKey, Json::Value& ports) {
 }
 
 int PortHelper::getPortDetails(const String& portKey, Json::Value& port) {
-    const Json::Value request =
-        keyRequest(portKey.size() == 12 ? "mac" : "wwn", colonForm(portKey));
+    const Json::Value request = keyRequest(portKey.size() == 12 ? "mac" : "wwn",
+                                           ProviderUtil::getIndexInColonFormat(portKey));
     if (!guardedCall(LibCall("libGetPortByWwn", portKey, LibCall::KEY_AFTER_DEFAULT),
                      libGetPortByWwn, request, port))
         return -1;
@@ -338,7 +340,7 @@ bool PortHelper::isPortDisabled(const String& portKey) {
 
 int PortHelper::getOpticsInfo(const String& portKey, Json::Value& sfp) {
     if (!guardedCall(LibCall("libGetOpticsSFP", portKey), libGetOpticsSFP,
-                     keyRequest("indexStr", colonForm(portKey)), sfp))
+                     keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(portKey)), sfp))
         return -1;
     if (!ProviderUtil::isValidJsonResponse(sfp)) {
         TVRN_LOG(LL_ERR, "Unable to get SFP info for %s", portKey.c_str());
@@ -348,7 +350,7 @@ int PortHelper::getOpticsInfo(const String& portKey, Json::Value& sfp) {
 }
 
 int PortHelper::setAlarmState(const String& deviceId, int state) {
-    const String key = colonForm(deviceId);
+    const String key = ProviderUtil::getIndexInColonFormat(deviceId);
     Json::Value port;
     if (!guardedCall(LibCall("libGetPortByWwn"), libGetPortByWwn, keyRequest("wwn", key), port))
         return ALARM_FAILED;

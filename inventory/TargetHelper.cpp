@@ -5,6 +5,7 @@
 #include "gateway/CIMProviderTfaj.h"
 #include "gateway/GuardedCall.h"
 #include "gateway/JsonAccess.h"
+#include "gateway/ProviderUtil.h"
 #include "inventory/InventoryCommon.h"
 #include "schema/generated/TAVRIN_LogicalDisk.h"
 #include "schema/generated/TAVRIN_StorageExtent.h"
@@ -44,11 +45,12 @@ String lunName(const _hbaLunInfo& lun, const LunNaming* naming) {
         return String();
     switch (naming->source) {
         case LunNaming::COMPOSED: {
-            String name = trimmedText(lun.vendor, _hbaLunInfo::VENDOR_WIDTH + 1);
+            String name = ProviderUtil::trimString(lun.vendor, _hbaLunInfo::VENDOR_WIDTH + 1);
             name.append('+');
-            name.append(trimmedText(lun.productId, _hbaLunInfo::PRODUCT_ID_WIDTH + 1));
+            name.append(ProviderUtil::trimString(lun.productId, _hbaLunInfo::PRODUCT_ID_WIDTH + 1));
             name.append('+');
-            name.append(trimmedText(lun.productSerialNumber, _hbaLunInfo::SERIAL_WIDTH + 1));
+            name.append(
+                ProviderUtil::trimString(lun.productSerialNumber, _hbaLunInfo::SERIAL_WIDTH + 1));
             return name;
         }
         case LunNaming::DESCRIPTION: return lun.lunDescription;
@@ -68,9 +70,9 @@ C* newLunInstance(const char* className, const char* description, const _hbaPort
     std::snprintf(element, sizeof(element), "LUN_%u", unsigned(lun.lunNumber));
     String deviceId(port.portId.c_str(), "_", lun.remotePortWwn.c_str());
     deviceId.append('_');
-    deviceId.append(trimmedText(lun.vendor, _hbaLunInfo::VENDOR_WIDTH + 1));
+    deviceId.append(ProviderUtil::trimString(lun.vendor, _hbaLunInfo::VENDOR_WIDTH + 1));
     deviceId.append('_');
-    deviceId.append(trimmedText(lun.productId, _hbaLunInfo::PRODUCT_ID_WIDTH + 1));
+    deviceId.append(ProviderUtil::trimString(lun.productId, _hbaLunInfo::PRODUCT_ID_WIDTH + 1));
     deviceId.append('_');
     deviceId.append(element);
     setDeviceKeys(instance, className, port.hostName, deviceId);
@@ -92,22 +94,23 @@ TargetHelper* TargetHelper::getTargetHelperObject() {
 
 bool TargetHelper::readLun(const Json::Value& u, const String& remotePortWwn, _hbaLunInfo& lun) {
     lun = _hbaLunInfo();
-    lun.remotePortWwn = colonFree(remotePortWwn);
+    lun.remotePortWwn = ProviderUtil::eraseColonsFromIndex(remotePortWwn);
     if (!jsonHas(u, "vendor", Json::stringValue) || !jsonHas(u, "number", Json::uintValue) ||
         !jsonHas(u, "productID", Json::stringValue)) {
         TVRN_LOG(LL_ERR, "LUN info is NOT available");
         return false;
     }
     lun.lunNumber = jsonUInt(u, "number");
-    lun.vendor = firstChars(jsonString(u, "vendor"), _hbaLunInfo::VENDOR_WIDTH);
-    lun.productId = firstChars(jsonString(u, "productID"), _hbaLunInfo::PRODUCT_ID_WIDTH);
+    lun.vendor = ProviderUtil::firstChars(jsonString(u, "vendor"), _hbaLunInfo::VENDOR_WIDTH);
+    lun.productId =
+        ProviderUtil::firstChars(jsonString(u, "productID"), _hbaLunInfo::PRODUCT_ID_WIDTH);
     lun.lunDescIdType = jsonUInt(u, "lunDescIdType");
     if (jsonHas(u, "lunDescription", Json::stringValue)) {
-        lun.lunDescription =
-            firstChars(jsonString(u, "lunDescription"), _hbaLunInfo::DESCRIPTION_WIDTH);
+        lun.lunDescription = ProviderUtil::firstChars(jsonString(u, "lunDescription"),
+                                                      _hbaLunInfo::DESCRIPTION_WIDTH);
     } else if (jsonHas(u, "productSerialNumber", Json::stringValue)) {
-        lun.productSerialNumber =
-            firstChars(jsonString(u, "productSerialNumber"), _hbaLunInfo::SERIAL_WIDTH);
+        lun.productSerialNumber = ProviderUtil::firstChars(jsonString(u, "productSerialNumber"),
+                                                           _hbaLunInfo::SERIAL_WIDTH);
         lun.lunDescIdType = kIdTypeSerial;
     } else {
         lun.lunDescIdType = kIdTypeNone;

@@ -4,9 +4,11 @@
 #ifndef CPTA_INVENTORY_TARGETHELPER_H
 #define CPTA_INVENTORY_TARGETHELPER_H
 
+#include <json/json.h>
+
 #include "framework/Array.h"
 #include "framework/Instance.h"
-#include "gateway/ProviderUtil.h"
+#include "gateway/ClassId.h"
 #include "inventory/InventoryRecords.h"
 
 namespace CPTA {

@@ -23,7 +23,6 @@
 #include "gateway/ClassId.h"
 #include "inventory/FCHBAManager.h"
 #include "inventory/HostIdentityScope.h"
-#include "inventory/InventoryCommon.h"
 #include "providers/Provider_Base.h"
 
 namespace CPTA {
@@ -64,7 +63,10 @@ struct Inventory_Source {
 class Inventory_Answer {
 public:
     explicit Inventory_Answer(const Array<Instance*>& instances) : _instances(instances) {}
-    ~Inventory_Answer() { destroyInstances(_instances); }
+    ~Inventory_Answer() {
+        for (size_t i = 0; i < _instances.size(); i++)
+            destroy(_instances[i]);
+    }
     Inventory_Answer(const Inventory_Answer&) = delete;
     Inventory_Answer& operator=(const Inventory_Answer&) = delete;
 
