@@ -12,7 +12,7 @@ void adapter_serial_number(Key_Sink& keys, const Instance* connector) {
     unsigned adapter = 0, position = 0;
     if (!parse_connector_tag(connector, adapter, position))
         return;
-    String serial = keys.facts().serialNumber(adapter);
+    String serial = keys.sources().adapter_serial_number(adapter);
     // An adapter that could not be read identifies no package.
     if (serial.size() != 0)
         keys.add(serial);
