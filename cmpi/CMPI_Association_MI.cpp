@@ -114,11 +114,11 @@ void _restrict_properties(Instance* instance, const char* const* properties) {
         const Meta_Feature* mf = mc->meta_features[i];
         if (_names_listed(properties, mf->name))
             continue;
-        if (__is_property(mf)) {
-            const Meta_Property* mp = __as_property(mf);
-            __null_flag(__slot(instance, mp->offset), mp) = 1;
-        } else if (__is_reference(mf) && __as_reference(mf)->subscript) {
-            __ref_array_null(__slot(instance, __as_reference(mf)->offset)) = 1;
+        if (is_property(mf)) {
+            const Meta_Property* mp = as_property(mf);
+            null_flag(slot_of(instance, mp->offset), mp) = 1;
+        } else if (is_reference(mf) && as_reference(mf)->subscript) {
+            ref_array_null(slot_of(instance, as_reference(mf)->offset)) = 1;
         }
     }
 }

@@ -22,27 +22,27 @@ bool _null_over_default(const Meta_Feature* mf) {
 
 // Whether the slot of the feature holds nothing to convert.
 bool _is_null(const Instance* instance, const Meta_Feature* mf) {
-    if (__is_property(mf)) {
-        const Meta_Property* mp = __as_property(mf);
-        return __null_flag(__slot(instance, mp->offset), mp) != 0;
+    if (is_property(mf)) {
+        const Meta_Property* mp = as_property(mf);
+        return null_flag(slot_of(instance, mp->offset), mp) != 0;
     }
-    const Meta_Reference* mr = __as_reference(mf);
-    const unsigned char* slot = __slot(instance, mr->offset);
-    return mr->subscript ? __ref_array_null(slot) != 0 : __ref_slot(slot) == nullptr;
+    const Meta_Reference* mr = as_reference(mf);
+    const unsigned char* slot = slot_of(instance, mr->offset);
+    return mr->subscript ? ref_array_null(slot) != 0 : reference_in(slot) == nullptr;
 }
 
 void _set_null(Instance* instance, const Meta_Feature* mf) {
-    if (__is_property(mf)) {
-        const Meta_Property* mp = __as_property(mf);
-        __null_flag(__slot(instance, mp->offset), mp) = 1;
+    if (is_property(mf)) {
+        const Meta_Property* mp = as_property(mf);
+        null_flag(slot_of(instance, mp->offset), mp) = 1;
         return;
     }
-    const Meta_Reference* mr = __as_reference(mf);
-    unsigned char* slot = __slot(instance, mr->offset);
+    const Meta_Reference* mr = as_reference(mf);
+    unsigned char* slot = slot_of(instance, mr->offset);
     if (mr->subscript) {
-        __ref_array_null(slot) = 1;
+        ref_array_null(slot) = 1;
     } else {
-        Instance*& p = __ref_slot(slot);
+        Instance*& p = reference_in(slot);
         unref(p);
         p = nullptr;
     }
@@ -58,7 +58,7 @@ int Container::convert(const Instance* instance, uint32 flags) {
     const Meta_Class* mc = instance->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!_selected(mf, flags) || !(__is_property(mf) || __is_reference(mf)))
+        if (!_selected(mf, flags) || !(is_property(mf) || is_reference(mf)))
             continue;
         if (_is_null(instance, mf) && !_null_over_default(mf))
             continue;
@@ -86,7 +86,7 @@ int Container::convert(const Meta_Class* meta_class, uint32 flags, Instance*& in
         const Meta_Class* mc = instance->meta_class;
         for (size_t i = 0; i < mc->num_meta_features; i++) {
             const Meta_Feature* mf = mc->meta_features[i];
-            if (_selected(mf, flags) && (__is_property(mf) || __is_reference(mf)))
+            if (_selected(mf, flags) && (is_property(mf) || is_reference(mf)))
                 _set_null(instance, mf);
         }
     }

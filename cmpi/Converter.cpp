@@ -129,7 +129,7 @@ int make_cmpi_instance(const CMPIBroker* broker, const Instance* instance, const
         const Meta_Class* mc = instance->meta_class;
         std::vector<const char*> keys;
         for (size_t i = 0; i < mc->num_meta_features; i++) {
-            if (__is_key(mc->meta_features[i]))
+            if (is_key(mc->meta_features[i]))
                 keys.push_back(mc->meta_features[i]->name);
         }
         keys.push_back(nullptr);

@@ -164,8 +164,8 @@ public:
         x._rep = t;
     }
 
-    __Array_Rep*& __rep() { return _rep; }
-    const __Array_Rep* __rep() const { return _rep; }
+    __Array_Rep*& rep() { return _rep; }
+    const __Array_Rep* rep() const { return _rep; }
 
 private:
     __Array_Rep* _rep;
@@ -173,12 +173,12 @@ private:
 
 template <class T>
 inline bool operator==(const Array<T>& a, const Array<T>& b) {
-    return __equal(a.__rep(), b.__rep());
+    return __equal(a.rep(), b.rep());
 }
 
 template <class T>
 inline bool operator!=(const Array<T>& a, const Array<T>& b) {
-    return !__equal(a.__rep(), b.__rep());
+    return !__equal(a.rep(), b.rep());
 }
 
 }  // namespace CPTA

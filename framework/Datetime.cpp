@@ -88,7 +88,7 @@ void Datetime::_unshare() {
     _unref(old);
 }
 
-uint32 Datetime::__refs() const {
+uint32 Datetime::ref_count() const {
     return atomic_get(&_rep->refs);
 }
 

@@ -87,7 +87,7 @@ public:
 
     // Number of Datetime objects sharing the representation (the static zero
     // interval reports 2 and is never counted).
-    uint32 __refs() const;
+    uint32 ref_count() const;
 
 private:
     void _unshare();

@@ -60,7 +60,7 @@ void _set_default_scalar(unsigned char* slot, const Meta_Property* mp) {
         case DATETIME:
             if (!reinterpret_cast<Datetime*>(slot)->set(
                     static_cast<const Meta_Value_Scalar<const char*>*>(value)->value))
-                __null_flag(slot, mp) = 1;
+                null_flag(slot, mp) = 1;
             break;
         default: std::memcpy(slot, value, type_size(mp->type)); break;
     }
@@ -91,19 +91,19 @@ void _append_default_array(__Array_Rep*& rep, const Meta_Property* mp) {
 }
 
 void _construct_slot(const Meta_Feature* mf, Instance* instance, bool defaults) {
-    if (__is_property(mf)) {
-        const Meta_Property* mp = __as_property(mf);
+    if (is_property(mf)) {
+        const Meta_Property* mp = as_property(mf);
         if (!_valid_type(mp))
             return;
-        unsigned char* slot = __slot(instance, mp->offset);
-        uint8& null = __null_flag(slot, mp);
+        unsigned char* slot = slot_of(instance, mp->offset);
+        uint8& null = null_flag(slot, mp);
         null = 0;
         if (mp->subscript) {
-            __array_rep(slot) = nullptr;  // so that a failed construction is undone safely
-            __construct(__array_rep(slot), __cim_array_traits[mp->type], nullptr, 0);
+            array_rep_in(slot) = nullptr;  // so that a failed construction is undone safely
+            __construct(array_rep_in(slot), __cim_array_traits[mp->type], nullptr, 0);
             if (defaults) {
                 if (mp->value)
-                    _append_default_array(__array_rep(slot), mp);
+                    _append_default_array(array_rep_in(slot), mp);
                 else
                     null = 1;
             }
@@ -121,48 +121,49 @@ void _construct_slot(const Meta_Feature* mf, Instance* instance, bool defaults) 
             else
                 null = 1;
         }
-    } else if (__is_reference(mf)) {
-        const Meta_Reference* mr = __as_reference(mf);
-        unsigned char* slot = __slot(instance, mr->offset);
+    } else if (is_reference(mf)) {
+        const Meta_Reference* mr = as_reference(mf);
+        unsigned char* slot = slot_of(instance, mr->offset);
         if (mr->subscript) {
-            __array_rep(slot) = nullptr;
-            __construct(__array_rep(slot), __Array_Traits_Factory_Raw<void*>::traits(), nullptr, 0);
-            __ref_array_null(slot) = 0;
+            array_rep_in(slot) = nullptr;
+            __construct(array_rep_in(slot), __Array_Traits_Factory_Raw<void*>::traits(), nullptr,
+                        0);
+            ref_array_null(slot) = 0;
         } else {
-            __ref_slot(slot) = nullptr;
+            reference_in(slot) = nullptr;
         }
     }
 }
 
 void _destroy_slot(const Meta_Feature* mf, Instance* instance) {
-    if (__is_property(mf)) {
-        const Meta_Property* mp = __as_property(mf);
+    if (is_property(mf)) {
+        const Meta_Property* mp = as_property(mf);
         if (!_valid_type(mp))
             return;
-        unsigned char* slot = __slot(instance, mp->offset);
+        unsigned char* slot = slot_of(instance, mp->offset);
         if (mp->subscript) {
-            __destruct(__array_rep(slot));
-            __array_rep(slot) = nullptr;
+            __destruct(array_rep_in(slot));
+            array_rep_in(slot) = nullptr;
         } else if (mp->type == STRING) {
             reinterpret_cast<String*>(slot)->~String();
         } else if (mp->type == DATETIME) {
             reinterpret_cast<Datetime*>(slot)->~Datetime();
         }
-    } else if (__is_reference(mf)) {
-        const Meta_Reference* mr = __as_reference(mf);
-        unsigned char* slot = __slot(instance, mr->offset);
+    } else if (is_reference(mf)) {
+        const Meta_Reference* mr = as_reference(mf);
+        unsigned char* slot = slot_of(instance, mr->offset);
         if (mr->subscript) {
-            __Array_Rep* rep = __array_rep(slot);
+            __Array_Rep* rep = array_rep_in(slot);
             if (rep) {
                 Instance* const* p = reinterpret_cast<Instance* const*>(rep->data());
                 for (size_t i = 0; i < rep->size; i++)
                     unref(p[i]);
             }
             __destruct(rep);
-            __array_rep(slot) = nullptr;
+            array_rep_in(slot) = nullptr;
         } else {
-            unref(__ref_slot(slot));
-            __ref_slot(slot) = nullptr;
+            unref(reference_in(slot));
+            reference_in(slot) = nullptr;
         }
     }
 }
@@ -190,15 +191,15 @@ void _free(Instance* instance) {
 Instance* _clone(const Instance* src);
 
 void _clone_slot(const Meta_Feature* mf, Instance* dst, const Instance* src) {
-    if (__is_property(mf)) {
-        const Meta_Property* mp = __as_property(mf);
+    if (is_property(mf)) {
+        const Meta_Property* mp = as_property(mf);
         if (!_valid_type(mp))
             return;
-        unsigned char* d = __slot(dst, mp->offset);
-        const unsigned char* s = __slot(src, mp->offset);
+        unsigned char* d = slot_of(dst, mp->offset);
+        const unsigned char* s = slot_of(src, mp->offset);
         if (mp->subscript) {
-            const __Array_Rep* rep = __array_rep(s);
-            __construct(__array_rep(d), rep->traits, rep->data(), rep->size);
+            const __Array_Rep* rep = array_rep_in(s);
+            __construct(array_rep_in(d), rep->traits, rep->data(), rep->size);
         } else if (mp->type == STRING) {
             new (d) String(*reinterpret_cast<const String*>(s));
         } else if (mp->type == DATETIME) {
@@ -206,25 +207,25 @@ void _clone_slot(const Meta_Feature* mf, Instance* dst, const Instance* src) {
         } else {
             std::memcpy(d, s, type_size(mp->type));
         }
-        __null_flag(d, mp) = __null_flag(s, mp);
-    } else if (__is_reference(mf)) {
-        const Meta_Reference* mr = __as_reference(mf);
-        unsigned char* d = __slot(dst, mr->offset);
-        const unsigned char* s = __slot(src, mr->offset);
+        null_flag(d, mp) = null_flag(s, mp);
+    } else if (is_reference(mf)) {
+        const Meta_Reference* mr = as_reference(mf);
+        unsigned char* d = slot_of(dst, mr->offset);
+        const unsigned char* s = slot_of(src, mr->offset);
         if (mr->subscript) {
-            const __Array_Rep* from = __array_rep(s);
-            __Array_Rep*& to = __array_rep(d);
+            const __Array_Rep* from = array_rep_in(s);
+            __Array_Rep*& to = array_rep_in(d);
             __construct(to, from->traits, nullptr, 0);
             __reserve(to, from->size);
-            Instance* const* p = __ref_array_data(s);
+            Instance* const* p = ref_array_data(s);
             for (size_t i = 0; i < from->size; i++) {
                 Instance* x = p[i] ? _clone(p[i]) : nullptr;
                 __append(to, &x, 1);  // cannot fail after the reserve
             }
-            __ref_array_null(d) = __ref_array_null(s);
+            ref_array_null(d) = ref_array_null(s);
         } else {
-            Instance* p = __ref_slot(s);
-            __ref_slot(d) = p ? _clone(p) : nullptr;
+            Instance* p = reference_in(s);
+            reference_in(d) = p ? _clone(p) : nullptr;
         }
     }
 }
@@ -333,10 +334,10 @@ namespace {
 // Two property slots are equal when both are null, or neither is and their
 // values are equal.
 bool _property_equal(const Meta_Property* mp, const unsigned char* a, const unsigned char* b) {
-    uint8 na = __null_flag(a, mp);
-    if (na != __null_flag(b, mp))
+    uint8 na = null_flag(a, mp);
+    if (na != null_flag(b, mp))
         return false;
-    return na || __property_value_equal(mp, a, b);
+    return na || property_value_equal(mp, a, b);
 }
 
 bool _key_eq(const Instance* a, const Instance* b, int depth) {
@@ -348,18 +349,18 @@ bool _key_eq(const Instance* a, const Instance* b, int depth) {
     const Meta_Class* mcb = b->meta_class;
     for (size_t i = 0; i < mca->num_meta_features; i++) {
         const Meta_Feature* mf = mca->meta_features[i];
-        if (!__is_key(mf))
+        if (!is_key(mf))
             continue;
-        if (__is_property(mf)) {
-            const Meta_Property* mpa = __as_property(mf);
+        if (is_property(mf)) {
+            const Meta_Property* mpa = as_property(mf);
             const Meta_Property* mpb = find_property(mcb, mf->name);
             if (!mpb || !(mpb->flags & FLAG_KEY) || mpb->type != mpa->type ||
                 mpb->subscript != mpa->subscript || !_valid_type(mpa))
                 return false;
-            if (!_property_equal(mpa, __slot(a, mpa->offset), __slot(b, mpb->offset)))
+            if (!_property_equal(mpa, slot_of(a, mpa->offset), slot_of(b, mpb->offset)))
                 return false;
-        } else if (__is_reference(mf)) {
-            const Meta_Reference* mra = __as_reference(mf);
+        } else if (is_reference(mf)) {
+            const Meta_Reference* mra = as_reference(mf);
             if (mra->subscript)
                 continue;
             const Meta_Reference* mrb = find_reference(mcb, mf->name);
@@ -368,8 +369,8 @@ bool _key_eq(const Instance* a, const Instance* b, int depth) {
             if (!is_subclass(mra->meta_class, mrb->meta_class) &&
                 !is_subclass(mrb->meta_class, mra->meta_class))
                 return false;
-            const Instance* ra = __ref_slot(__slot(a, mra->offset));
-            const Instance* rb = __ref_slot(__slot(b, mrb->offset));
+            const Instance* ra = reference_in(slot_of(a, mra->offset));
+            const Instance* rb = reference_in(slot_of(b, mrb->offset));
             if (!ra || !rb) {
                 if (ra != rb)
                     return false;
@@ -392,30 +393,30 @@ bool _identical(const Instance* a, const Instance* b, int depth) {
     const Meta_Class* mc = a->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (__is_property(mf)) {
-            const Meta_Property* mp = __as_property(mf);
+        if (is_property(mf)) {
+            const Meta_Property* mp = as_property(mf);
             if (_valid_type(mp) &&
-                !_property_equal(mp, __slot(a, mp->offset), __slot(b, mp->offset)))
+                !_property_equal(mp, slot_of(a, mp->offset), slot_of(b, mp->offset)))
                 return false;
-        } else if (__is_reference(mf)) {
-            const Meta_Reference* mr = __as_reference(mf);
-            const unsigned char* sa = __slot(a, mr->offset);
-            const unsigned char* sb = __slot(b, mr->offset);
+        } else if (is_reference(mf)) {
+            const Meta_Reference* mr = as_reference(mf);
+            const unsigned char* sa = slot_of(a, mr->offset);
+            const unsigned char* sb = slot_of(b, mr->offset);
             if (!mr->subscript) {
-                if (!_identical(__ref_slot(sa), __ref_slot(sb), depth + 1))
+                if (!_identical(reference_in(sa), reference_in(sb), depth + 1))
                     return false;
                 continue;
             }
-            if (__ref_array_null(sa) != __ref_array_null(sb))
+            if (ref_array_null(sa) != ref_array_null(sb))
                 return false;
-            if (__ref_array_null(sa))
+            if (ref_array_null(sa))
                 continue;
-            const __Array_Rep* ra = __array_rep(sa);
-            const __Array_Rep* rb = __array_rep(sb);
+            const __Array_Rep* ra = array_rep_in(sa);
+            const __Array_Rep* rb = array_rep_in(sb);
             if (ra->size != rb->size)
                 return false;
             for (size_t j = 0; j < ra->size; j++) {
-                if (!_identical(__ref_array_data(sa)[j], __ref_array_data(sb)[j], depth + 1))
+                if (!_identical(ref_array_data(sa)[j], ref_array_data(sb)[j], depth + 1))
                     return false;
             }
         }
@@ -443,14 +444,14 @@ void __set_null_flags(Instance* instance, bool keys, bool non_keys, bool value) 
     const Meta_Class* mc = instance->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!(__is_key(mf) ? keys : non_keys))
+        if (!(is_key(mf) ? keys : non_keys))
             continue;
-        if (__is_property(mf)) {
-            const Meta_Property* mp = __as_property(mf);
+        if (is_property(mf)) {
+            const Meta_Property* mp = as_property(mf);
             if (_valid_type(mp))
-                __null_flag(__slot(instance, mp->offset), mp) = value;
-        } else if (__is_reference(mf) && __as_reference(mf)->subscript) {
-            __ref_array_null(__slot(instance, __as_reference(mf)->offset)) = value;
+                null_flag(slot_of(instance, mp->offset), mp) = value;
+        } else if (is_reference(mf) && as_reference(mf)->subscript) {
+            ref_array_null(slot_of(instance, as_reference(mf)->offset)) = value;
         }
     }
 }
@@ -471,19 +472,19 @@ int filter_properties(Instance* instance, const char* const* names, bool keep_ke
             continue;
         if (mf->flags & FLAG_METHOD)
             return -1;
-        if (__is_key(mf))
+        if (is_key(mf))
             continue;
-        if (__is_property(mf)) {
-            const Meta_Property* mp = __as_property(mf);
+        if (is_property(mf)) {
+            const Meta_Property* mp = as_property(mf);
             if (_valid_type(mp))
-                __null_flag(__slot(instance, mp->offset), mp) = 0;
-        } else if (__is_reference(mf)) {
-            const Meta_Reference* mr = __as_reference(mf);
-            unsigned char* slot = __slot(instance, mr->offset);
+                null_flag(slot_of(instance, mp->offset), mp) = 0;
+        } else if (is_reference(mf)) {
+            const Meta_Reference* mr = as_reference(mf);
+            unsigned char* slot = slot_of(instance, mr->offset);
             if (mr->subscript)
-                __ref_array_null(slot) = 0;
-            else if (!__ref_slot(slot))
-                __ref_slot(slot) = create(mr->meta_class, false);
+                ref_array_null(slot) = 0;
+            else if (!reference_in(slot))
+                reference_in(slot) = create(mr->meta_class, false);
         }
     }
     return 0;
@@ -499,17 +500,17 @@ void _set_name_space(Instance* instance, const char* name_space, bool force, int
     const Meta_Class* mc = instance->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!__is_reference(mf))
+        if (!is_reference(mf))
             continue;
-        const Meta_Reference* mr = __as_reference(mf);
-        unsigned char* slot = __slot(instance, mr->offset);
+        const Meta_Reference* mr = as_reference(mf);
+        unsigned char* slot = slot_of(instance, mr->offset);
         if (!mr->subscript) {
-            _set_name_space(__ref_slot(slot), name_space, force, depth + 1);
+            _set_name_space(reference_in(slot), name_space, force, depth + 1);
             continue;
         }
-        const __Array_Rep* rep = __array_rep(slot);
+        const __Array_Rep* rep = array_rep_in(slot);
         for (size_t j = 0; j < rep->size; j++)
-            _set_name_space(__ref_array_data(slot)[j], name_space, force, depth + 1);
+            _set_name_space(ref_array_data(slot)[j], name_space, force, depth + 1);
     }
 }
 
@@ -585,24 +586,24 @@ int _model_path(const Instance* instance, String& out, int depth) {
     size_t keys = 0;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!__is_key(mf) || !(__is_property(mf) || __is_reference(mf)))
+        if (!is_key(mf) || !(is_property(mf) || is_reference(mf)))
             continue;
         if (keys++)
             out.append(',');
         out.append(mf->name);
         out.append('=');
-        if (__is_property(mf)) {
-            const Meta_Property* mp = __as_property(mf);
-            const unsigned char* slot = __slot(instance, mp->offset);
-            if (mp->subscript || !_valid_type(mp) || __null_flag(slot, mp))
+        if (is_property(mf)) {
+            const Meta_Property* mp = as_property(mf);
+            const unsigned char* slot = slot_of(instance, mp->offset);
+            if (mp->subscript || !_valid_type(mp) || null_flag(slot, mp))
                 return -1;
             _append_key_value(out, mp->type, slot);
         } else {
-            const Meta_Reference* mr = __as_reference(mf);
+            const Meta_Reference* mr = as_reference(mf);
             if (mr->subscript)
                 return -1;
             String nested;
-            if (_model_path(__ref_slot(__slot(instance, mr->offset)), nested, depth + 1) != 0)
+            if (_model_path(reference_in(slot_of(instance, mr->offset)), nested, depth + 1) != 0)
                 return -1;
             out.append('"');
             for (size_t j = 0; j < nested.size(); j++) {
@@ -648,11 +649,11 @@ bool is_reference_of(const Instance* instance, const Instance* association, cons
     const Meta_Class* mc = association->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!__is_reference(mf) || __as_reference(mf)->subscript)
+        if (!is_reference(mf) || as_reference(mf)->subscript)
             continue;
         if (_given(role) && !_eqi(mf->name, role))
             continue;
-        const Instance* p = __ref_slot(__slot(association, __as_reference(mf)->offset));
+        const Instance* p = reference_in(slot_of(association, as_reference(mf)->offset));
         if (p && key_eq(instance, p))
             return true;
     }
@@ -668,10 +669,10 @@ int get_associators(const Instance* instance, const Instance* association, const
     const Meta_Class* mc = association->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!__is_reference(mf) || __as_reference(mf)->subscript)
+        if (!is_reference(mf) || as_reference(mf)->subscript)
             continue;
-        const Meta_Reference* mr = __as_reference(mf);
-        const Instance* p = __ref_slot(__slot(association, mr->offset));
+        const Meta_Reference* mr = as_reference(mf);
+        const Instance* p = reference_in(slot_of(association, mr->offset));
         if (!p)
             continue;
         if (is_subclass(mr->meta_class, instance->meta_class) && key_eq(instance, p)) {
@@ -723,43 +724,43 @@ void _fprint(FILE* os, const Instance* instance, bool keys_only, int level) {
     fprintf(os, "    string __name_space = \"%s\";\n", instance->__name_space.c_str());
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (keys_only && !__is_key(mf))
+        if (keys_only && !is_key(mf))
             continue;
-        if (__is_property(mf)) {
-            const Meta_Property* mp = __as_property(mf);
+        if (is_property(mf)) {
+            const Meta_Property* mp = as_property(mf);
             if (!_valid_type(mp))
                 continue;
-            const unsigned char* slot = __slot(instance, mp->offset);
+            const unsigned char* slot = slot_of(instance, mp->offset);
             _indent(os, level + 1);
             fprintf(os, "%s %s%s = ", type_name(mp->type), mf->name, mp->subscript ? "[]" : "");
-            if (__null_flag(slot, mp))
+            if (null_flag(slot, mp))
                 fputs("NULL", os);
             else if (mp->subscript)
-                __print_array(os, mp->type, __array_rep(slot));
+                print_array(os, mp->type, array_rep_in(slot));
             else
-                __print_scalar(os, mp->type, slot);
+                print_scalar(os, mp->type, slot);
             fputs(";\n", os);
-        } else if (__is_reference(mf)) {
-            const Meta_Reference* mr = __as_reference(mf);
-            const unsigned char* slot = __slot(instance, mr->offset);
+        } else if (is_reference(mf)) {
+            const Meta_Reference* mr = as_reference(mf);
+            const unsigned char* slot = slot_of(instance, mr->offset);
             const char* cls = mr->meta_class ? mr->meta_class->name : "Instance";
             _indent(os, level + 1);
             if (!mr->subscript) {
                 fprintf(os, "%s %s =", cls, mf->name);
-                _fprint_nested(os, __ref_slot(slot), level + 2);
+                _fprint_nested(os, reference_in(slot), level + 2);
                 continue;
             }
             fprintf(os, "%s %s[] =", cls, mf->name);
-            if (__ref_array_null(slot)) {
+            if (ref_array_null(slot)) {
                 fputs(" NULL;\n", os);
                 continue;
             }
             fputs("\n", os);
             _indent(os, level + 1);
             fputs("{\n", os);
-            const __Array_Rep* rep = __array_rep(slot);
+            const __Array_Rep* rep = array_rep_in(slot);
             for (size_t j = 0; j < rep->size; j++) {
-                const Instance* p = __ref_array_data(slot)[j];
+                const Instance* p = ref_array_data(slot)[j];
                 if (p) {
                     _fprint(os, p, false, level + 2);
                 } else {

@@ -14,7 +14,7 @@ bool _eq(const void* a, const void* b) {
 
 }  // namespace
 
-bool __scalar_equal(int type, const void* a, const void* b) {
+bool scalar_equal(int type, const void* a, const void* b) {
     switch (type) {
         case BOOLEAN: return _eq<boolean>(a, b);
         case REAL32: return _eq<real32>(a, b);
@@ -25,14 +25,13 @@ bool __scalar_equal(int type, const void* a, const void* b) {
     }
 }
 
-bool __property_value_equal(const Meta_Property* mp, const unsigned char* a,
-                            const unsigned char* b) {
+bool property_value_equal(const Meta_Property* mp, const unsigned char* a, const unsigned char* b) {
     if (mp->subscript)
-        return __equal(__array_rep(a), __array_rep(b));
-    return __scalar_equal(mp->type, a, b);
+        return __equal(array_rep_in(a), array_rep_in(b));
+    return scalar_equal(mp->type, a, b);
 }
 
-void __print_scalar(FILE* os, int type, const void* p, bool prettify) {
+void print_scalar(FILE* os, int type, const void* p, bool prettify) {
     switch (type) {
         case BOOLEAN: fputs(*static_cast<const boolean*>(p) ? "true" : "false", os); break;
         case UINT8: fprintf(os, "%u", unsigned(*static_cast<const uint8*>(p))); break;
@@ -68,12 +67,12 @@ void __print_scalar(FILE* os, int type, const void* p, bool prettify) {
     }
 }
 
-void __print_array(FILE* os, int type, const __Array_Rep* rep, bool prettify) {
+void print_array(FILE* os, int type, const __Array_Rep* rep, bool prettify) {
     fputc('{', os);
     for (size_t i = 0; i < rep->size; i++) {
         if (i)
             fputs(", ", os);
-        __print_scalar(os, type, rep->data() + i * rep->traits->size, prettify);
+        print_scalar(os, type, rep->data() + i * rep->traits->size, prettify);
     }
     fputc('}', os);
 }

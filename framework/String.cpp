@@ -12,7 +12,7 @@ namespace CPTA {
 
 // The count starts at 2 so that the representation never looks unshared and
 // is never modified in place; it is never counted or freed either.
-__String_Rep String::_empty = {2, 0, 0, {0}};
+String_Rep String::_empty = {2, 0, 0, {0}};
 
 namespace {
 
@@ -30,11 +30,11 @@ size_t _next_pow_2(size_t n) {
     return p;
 }
 
-__String_Rep* _new_rep(size_t cap) {
-    void* p = std::malloc(offsetof(__String_Rep, data) + cap + 1);
+String_Rep* _new_rep(size_t cap) {
+    void* p = std::malloc(offsetof(String_Rep, data) + cap + 1);
     if (!p)
         throw std::bad_alloc();
-    __String_Rep* rep = static_cast<__String_Rep*>(p);
+    String_Rep* rep = static_cast<String_Rep*>(p);
     rep->refs = 1;
     rep->size = 0;
     rep->cap = uint32(cap);
@@ -53,31 +53,31 @@ bool _eqi(const char* a, const char* b, size_t n) {
 
 }  // namespace
 
-struct __String_Access {
-    static void ref(__String_Rep* rep) {
+struct String_Access {
+    static void ref(String_Rep* rep) {
         if (rep != &String::_empty)
             atomic_inc(&rep->refs);
     }
 
-    static void unref(__String_Rep* rep) {
+    static void unref(String_Rep* rep) {
         if (rep != &String::_empty && atomic_dec_and_test(&rep->refs))
             std::free(rep);
     }
 
-    static bool unshared(const __String_Rep* rep) {
+    static bool unshared(const String_Rep* rep) {
         return rep != &String::_empty && atomic_get(&rep->refs) == 1;
     }
 
     // A new representation holding s1 (n1 bytes) followed by s2 (n2 bytes),
     // with room for at least min_cap bytes.
-    static __String_Rep* make(const char* s1, size_t n1, const char* s2, size_t n2,
-                              size_t min_cap = 0) {
+    static String_Rep* make(const char* s1, size_t n1, const char* s2, size_t n2,
+                            size_t min_cap = 0) {
         if (n1 > MAX_STRING_SIZE || n2 > MAX_STRING_SIZE - n1)
             throw std::length_error("String too long");
         size_t n = n1 + n2;
         if (n == 0 && min_cap == 0)
             return &String::_empty;
-        __String_Rep* rep = _new_rep(_next_pow_2(n > min_cap ? n : min_cap));
+        String_Rep* rep = _new_rep(_next_pow_2(n > min_cap ? n : min_cap));
         if (n1)
             std::memcpy(rep->data, s1, n1);
         if (n2)
@@ -89,7 +89,7 @@ struct __String_Access {
 
     // Gives s its own representation with room for at least cap bytes.
     static void unshare(String& s, size_t cap) {
-        __String_Rep* old = s._rep;
+        String_Rep* old = s._rep;
         if (unshared(old) && old->cap >= cap)
             return;
         s._rep = make(old->data, old->size, nullptr, 0, cap > old->cap ? cap : old->cap);
@@ -100,20 +100,19 @@ struct __String_Access {
 String::String() : _rep(&_empty) {}
 
 String::String(const String& x) : _rep(x._rep) {
-    __String_Access::ref(_rep);
+    String_Access::ref(_rep);
 }
 
 String::String(String&& x) noexcept : _rep(x._rep) {
     x._rep = &_empty;
 }
 
-String::String(const char* s)
-    : _rep(__String_Access::make(s, s ? std::strlen(s) : 0, nullptr, 0)) {}
+String::String(const char* s) : _rep(String_Access::make(s, s ? std::strlen(s) : 0, nullptr, 0)) {}
 
-String::String(const char* s, size_t n) : _rep(__String_Access::make(s, s ? n : 0, nullptr, 0)) {}
+String::String(const char* s, size_t n) : _rep(String_Access::make(s, s ? n : 0, nullptr, 0)) {}
 
 String::String(const char* s1, const char* s2)
-    : _rep(__String_Access::make(s1, s1 ? std::strlen(s1) : 0, s2, s2 ? std::strlen(s2) : 0)) {}
+    : _rep(String_Access::make(s1, s1 ? std::strlen(s1) : 0, s2, s2 ? std::strlen(s2) : 0)) {}
 
 String::String(const char* s1, const char* s2, const char* s3) : _rep(&_empty) {
     size_t n1 = s1 ? std::strlen(s1) : 0;
@@ -121,12 +120,12 @@ String::String(const char* s1, const char* s2, const char* s3) : _rep(&_empty) {
     size_t n3 = s3 ? std::strlen(s3) : 0;
     if (n1 + n2 + n3 == 0)
         return;
-    _rep = __String_Access::make(s1, n1, s2, n2, n1 + n2 + n3);
+    _rep = String_Access::make(s1, n1, s2, n2, n1 + n2 + n3);
     append(s3, n3);
 }
 
 String::~String() {
-    __String_Access::unref(_rep);
+    String_Access::unref(_rep);
 }
 
 String& String::operator=(const String& x) {
@@ -136,7 +135,7 @@ String& String::operator=(const String& x) {
 
 String& String::operator=(String&& x) noexcept {
     if (this != &x) {
-        __String_Access::unref(_rep);
+        String_Access::unref(_rep);
         _rep = x._rep;
         x._rep = &_empty;
     }
@@ -148,22 +147,22 @@ String& String::operator=(const char* s) {
     return *this;
 }
 
-uint32 String::__refs() const {
+uint32 String::ref_count() const {
     return atomic_get(&_rep->refs);
 }
 
 void String::set(size_t i, char c) {
     if (i >= _rep->size)
         return;
-    __String_Access::unshare(*this, _rep->cap);
+    String_Access::unshare(*this, _rep->cap);
     _rep->data[i] = c;
 }
 
 void String::assign(const String& x) {
     if (x._rep == _rep)
         return;
-    __String_Access::ref(x._rep);
-    __String_Access::unref(_rep);
+    String_Access::ref(x._rep);
+    String_Access::unref(_rep);
     _rep = x._rep;
 }
 
@@ -174,28 +173,28 @@ void String::assign(const char* s) {
 void String::assign(const char* s, size_t n) {
     if (!s)
         n = 0;
-    if (__String_Access::unshared(_rep) && _rep->cap >= n) {
+    if (String_Access::unshared(_rep) && _rep->cap >= n) {
         std::memmove(_rep->data, s, n);
         _rep->size = uint32(n);
         _rep->data[n] = '\0';
         return;
     }
     // s may point into the old representation: copy before releasing it.
-    __String_Rep* old = _rep;
-    _rep = __String_Access::make(s, n, nullptr, 0);
-    __String_Access::unref(old);
+    String_Rep* old = _rep;
+    _rep = String_Access::make(s, n, nullptr, 0);
+    String_Access::unref(old);
 }
 
 void String::append(char c) {
-    if (__String_Access::unshared(_rep) && _rep->size < _rep->cap) {
+    if (String_Access::unshared(_rep) && _rep->size < _rep->cap) {
         _rep->data[_rep->size++] = c;
         _rep->data[_rep->size] = '\0';
         return;
     }
     size_t cap = _rep->cap ? _next_pow_2(size_t(_rep->cap) * 2) : 32;
-    __String_Rep* old = _rep;
-    _rep = __String_Access::make(old->data, old->size, &c, 1, cap);
-    __String_Access::unref(old);
+    String_Rep* old = _rep;
+    _rep = String_Access::make(old->data, old->size, &c, 1, cap);
+    String_Access::unref(old);
 }
 
 void String::append(const char* s) {
@@ -209,16 +208,16 @@ void String::append(const char* s, size_t n) {
     if (n > MAX_STRING_SIZE - _rep->size)
         throw std::length_error("String too long");
     size_t size = _rep->size + n;
-    if (__String_Access::unshared(_rep) && _rep->cap >= size) {
+    if (String_Access::unshared(_rep) && _rep->cap >= size) {
         std::memmove(_rep->data + _rep->size, s, n);
         _rep->size = uint32(size);
         _rep->data[size] = '\0';
         return;
     }
     // s may point into the old representation: copy before releasing it.
-    __String_Rep* old = _rep;
-    _rep = __String_Access::make(old->data, old->size, s, n, size);
-    __String_Access::unref(old);
+    String_Rep* old = _rep;
+    _rep = String_Access::make(old->data, old->size, s, n, size);
+    String_Access::unref(old);
 }
 
 void String::append(const String& x) {
@@ -230,18 +229,18 @@ void String::append(const String& x) {
 void String::reserve(size_t n) {
     if (n == 0 && _rep->size == 0)
         return;
-    __String_Access::unshare(*this, n);
+    String_Access::unshare(*this, n);
 }
 
 void String::clear() {
     if (_rep->size == 0)
         return;
-    if (__String_Access::unshared(_rep)) {
+    if (String_Access::unshared(_rep)) {
         _rep->size = 0;
         _rep->data[0] = '\0';
         return;
     }
-    __String_Access::unref(_rep);
+    String_Access::unref(_rep);
     _rep = &_empty;
 }
 
@@ -253,7 +252,7 @@ void String::remove(size_t pos, size_t n) {
         n = size - pos;
     if (n == 0)
         return;
-    __String_Access::unshare(*this, _rep->cap);
+    String_Access::unshare(*this, _rep->cap);
     std::memmove(_rep->data + pos, _rep->data + pos + n, size - pos - n + 1);
     _rep->size = uint32(size - n);
 }

@@ -14,7 +14,7 @@
 
 namespace CPTA {
 
-struct __String_Rep {
+struct String_Rep {
     uint32 refs;
     uint32 size;
     uint32 cap;
@@ -81,22 +81,22 @@ public:
     size_t find(const String& x) const;
 
     // Whether this string uses the shared empty representation (no storage).
-    bool __is_static_empty() const { return _rep == &_empty; }
+    bool is_static_empty() const { return _rep == &_empty; }
     // Number of String objects sharing the representation (2 for the static
     // empty one, which is never counted).
-    uint32 __refs() const;
+    uint32 ref_count() const;
 
     void swap(String& x) noexcept {
-        __String_Rep* t = _rep;
+        String_Rep* t = _rep;
         _rep = x._rep;
         x._rep = t;
     }
 
 private:
-    static __String_Rep _empty;
-    __String_Rep* _rep;
+    static String_Rep _empty;
+    String_Rep* _rep;
 
-    friend struct __String_Access;
+    friend struct String_Access;
 };
 
 inline bool operator==(const String& a, const String& b) {

@@ -223,18 +223,18 @@ int Value::_get_array(Type type, __Array_Rep*& rep) const {
     return 0;
 }
 
-#define CPTA_VALUE_SCALAR(T, TAG)                  \
-    void Value::set_value(T x) {                   \
-        _set_scalar(TAG, &x, sizeof(x));           \
-    }                                              \
-    int Value::get_value(T& x) const {             \
-        return _get_scalar(TAG, &x, sizeof(x));    \
-    }                                              \
-    void Value::set_value(const Array<T>& x) {     \
-        _set_array(TAG##_ARRAY, x.__rep());        \
-    }                                              \
-    int Value::get_value(Array<T>& x) const {      \
-        return _get_array(TAG##_ARRAY, x.__rep()); \
+#define CPTA_VALUE_SCALAR(T, TAG)                \
+    void Value::set_value(T x) {                 \
+        _set_scalar(TAG, &x, sizeof(x));         \
+    }                                            \
+    int Value::get_value(T& x) const {           \
+        return _get_scalar(TAG, &x, sizeof(x));  \
+    }                                            \
+    void Value::set_value(const Array<T>& x) {   \
+        _set_array(TAG##_ARRAY, x.rep());        \
+    }                                            \
+    int Value::get_value(Array<T>& x) const {    \
+        return _get_array(TAG##_ARRAY, x.rep()); \
     }
 
 CPTA_VALUE_SCALAR(boolean, BOOLEAN)
@@ -278,15 +278,15 @@ void Value::set_value(Instance* x) {
 }
 
 void Value::set_value(const Array<String>& x) {
-    _set_array(STRING_ARRAY, x.__rep());
+    _set_array(STRING_ARRAY, x.rep());
 }
 
 void Value::set_value(const Array<Datetime>& x) {
-    _set_array(DATETIME_ARRAY, x.__rep());
+    _set_array(DATETIME_ARRAY, x.rep());
 }
 
 void Value::set_value(const Array<Instance*>& x) {
-    _set_instances(x.__rep());
+    _set_instances(x.rep());
 }
 
 int Value::get_value(String& x) const {
@@ -311,15 +311,15 @@ int Value::get_value(Instance*& x) const {
 }
 
 int Value::get_value(Array<String>& x) const {
-    return _get_array(STRING_ARRAY, x.__rep());
+    return _get_array(STRING_ARRAY, x.rep());
 }
 
 int Value::get_value(Array<Datetime>& x) const {
-    return _get_array(DATETIME_ARRAY, x.__rep());
+    return _get_array(DATETIME_ARRAY, x.rep());
 }
 
 int Value::get_value(Array<Instance*>& x) const {
-    return _get_array(INSTANCE_ARRAY, x.__rep());
+    return _get_array(INSTANCE_ARRAY, x.rep());
 }
 
 //------------------------------------------------------------------------------
@@ -353,9 +353,9 @@ int Value::get(Instance* instance, const Meta_Feature* feature) const {
 
     if (feature->flags & FLAG_PROPERTY) {
         const Meta_Property* mp = reinterpret_cast<const Meta_Property*>(feature);
-        unsigned char* slot = __slot(instance, mp->offset);
+        unsigned char* slot = slot_of(instance, mp->offset);
         if (mp->subscript)
-            __assign(__array_rep(slot), static_cast<const __Array_Rep*>(_u.ptr));
+            __assign(array_rep_in(slot), static_cast<const __Array_Rep*>(_u.ptr));
         else if (mp->type == STRING)
             *reinterpret_cast<String*>(slot) =
                 _string(const_cast<void*>(static_cast<const void*>(&_u)));
@@ -364,12 +364,12 @@ int Value::get(Instance* instance, const Meta_Feature* feature) const {
                 _datetime(const_cast<void*>(static_cast<const void*>(&_u)));
         else
             std::memcpy(slot, &_u, type_size(mp->type));
-        __null_flag(slot, mp) = _null;
+        null_flag(slot, mp) = _null;
         return 0;
     }
 
     const Meta_Reference* mr = reinterpret_cast<const Meta_Reference*>(feature);
-    unsigned char* slot = __slot(instance, mr->offset);
+    unsigned char* slot = slot_of(instance, mr->offset);
     const char* target = mr->meta_class ? mr->meta_class->name : "Instance";
 
     if (!mr->subscript) {
@@ -379,7 +379,7 @@ int Value::get(Instance* instance, const Meta_Feature* feature) const {
                       feature->name);
             return -1;
         }
-        Instance*& p = __ref_slot(slot);
+        Instance*& p = reference_in(slot);
         Instance* old = p;
         ref(x);
         p = x;
@@ -401,11 +401,11 @@ int Value::get(Instance* instance, const Meta_Feature* feature) const {
     __Array_Rep* copy;
     __construct(copy, __Array_Traits_Factory_Raw<void*>::traits(), rep->data(), rep->size);
     _ref_elements(copy);
-    __Array_Rep*& old = __array_rep(slot);
+    __Array_Rep*& old = array_rep_in(slot);
     _unref_elements(old);
     __destruct(old);
     old = copy;
-    __ref_array_null(slot) = _null;
+    ref_array_null(slot) = _null;
     return 0;
 }
 
@@ -421,9 +421,9 @@ int Value::set(const Instance* instance, const Meta_Feature* feature) {
     Value tmp;
     if (feature->flags & FLAG_PROPERTY) {
         const Meta_Property* mp = reinterpret_cast<const Meta_Property*>(feature);
-        const unsigned char* slot = __slot(instance, mp->offset);
+        const unsigned char* slot = slot_of(instance, mp->offset);
         if (mp->subscript) {
-            const __Array_Rep* rep = __array_rep(slot);
+            const __Array_Rep* rep = array_rep_in(slot);
             __Array_Rep* copy;
             __construct(copy, rep->traits, rep->data(), rep->size);
             tmp._u.ptr = copy;
@@ -435,19 +435,19 @@ int Value::set(const Instance* instance, const Meta_Feature* feature) {
             std::memcpy(&tmp._u, slot, type_size(mp->type));
         }
         tmp._type = type;
-        tmp._null = __null_flag(slot, mp);
+        tmp._null = null_flag(slot, mp);
     } else {
         const Meta_Reference* mr = reinterpret_cast<const Meta_Reference*>(feature);
-        const unsigned char* slot = __slot(instance, mr->offset);
+        const unsigned char* slot = slot_of(instance, mr->offset);
         if (mr->subscript) {
-            const __Array_Rep* rep = __array_rep(slot);
+            const __Array_Rep* rep = array_rep_in(slot);
             __Array_Rep* copy;
             __construct(copy, rep->traits, rep->data(), rep->size);
             _ref_elements(copy);
             tmp._u.ptr = copy;
-            tmp._null = __ref_array_null(slot);
+            tmp._null = ref_array_null(slot);
         } else {
-            Instance* p = __ref_slot(slot);
+            Instance* p = reference_in(slot);
             ref(p);
             tmp._u.ptr = p;
             tmp._null = p == nullptr;
@@ -487,10 +487,10 @@ void Value::fprint(FILE* os, bool prettify) const {
                 CPTA::fprint(os, p);
         }
     } else if (_is_array(_type)) {
-        __print_array(os, _type - ARRAY, static_cast<const __Array_Rep*>(_u.ptr), prettify);
+        print_array(os, _type - ARRAY, static_cast<const __Array_Rep*>(_u.ptr), prettify);
         fputc('\n', os);
     } else {
-        __print_scalar(os, _type, &_u, prettify);
+        print_scalar(os, _type, &_u, prettify);
         fputc('\n', os);
     }
 }

@@ -104,7 +104,7 @@ public:
 
     template <class C>
     void set_value(const Array<C*>& x) {
-        _set_instances(x.__rep());
+        _set_instances(x.rep());
     }
 
     // Copies the value out when the tag is exactly the requested type and

@@ -230,7 +230,7 @@ std::optional<std::string> RepositoryCatalog::classMof(const std::string& name) 
 }
 
 const cli::ClassCatalog& moduleCatalog() {
-    static const RepositoryCatalog catalog(__meta_repository);
+    static const RepositoryCatalog catalog(schema_repository);
     return catalog;
 }
 

@@ -371,8 +371,8 @@ void Pairing_Run::property_keys(const char* name, const Instance* instance, Key_
     }
     if (mp == nullptr || mp->subscript != 0)
         return;
-    const unsigned char* slot = __slot(instance, mp->offset);
-    if (__null_flag(slot, mp))
+    const unsigned char* slot = slot_of(instance, mp->offset);
+    if (null_flag(slot, mp))
         return;
     switch (mp->type) {
         case STRING: keys.add(*reinterpret_cast<const String*>(slot)); break;
@@ -412,7 +412,7 @@ void Pairing_Run::deliver() {
             destroy(association);
             throw std::bad_alloc();
         }
-        __ref_slot(__slot(association, _offsets[e])) = copy;
+        reference_in(slot_of(association, _offsets[e])) = copy;
     }
     _sink(association, _target);
 }
@@ -451,7 +451,7 @@ const Property<String>* text_property(const Instance* instance, const char* name
     const Meta_Property* mp = instance ? find_property(instance->meta_class, name) : nullptr;
     if (mp == nullptr || mp->type != STRING || mp->subscript != 0)
         return nullptr;
-    return reinterpret_cast<const Property<String>*>(__slot(instance, mp->offset));
+    return reinterpret_cast<const Property<String>*>(slot_of(instance, mp->offset));
 }
 
 }  // namespace CPTA

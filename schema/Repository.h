@@ -7,7 +7,7 @@
 
 namespace CPTA {
 
-extern const Meta_Repository __meta_repository;
+extern const Meta_Repository schema_repository;
 
 }  // namespace CPTA
 

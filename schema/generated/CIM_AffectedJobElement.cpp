@@ -55,6 +55,6 @@ const bool CIM_AffectedJobElement_locals[] = {
 
 const Meta_Class CIM_AffectedJobElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_AffectedJobElement", nullptr, 0,
-    CIM_AffectedJobElement_features, 4, sizeof(CIM_AffectedJobElement), CIM_AffectedJobElement_locals, nullptr, 2, &__meta_repository };
+    CIM_AffectedJobElement_features, 4, sizeof(CIM_AffectedJobElement), CIM_AffectedJobElement_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -293,6 +293,6 @@ const bool CIM_AlarmDevice_locals[] = {
 
 const Meta_Class CIM_AlarmDevice::static_meta_class = {
     0, FLAG_CLASS, "CIM_AlarmDevice", nullptr, 0,
-    CIM_AlarmDevice_features, 59, sizeof(CIM_AlarmDevice), CIM_AlarmDevice_locals, &CIM_LogicalDevice::static_meta_class, 4, &__meta_repository };
+    CIM_AlarmDevice_features, 59, sizeof(CIM_AlarmDevice), CIM_AlarmDevice_locals, &CIM_LogicalDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -177,6 +177,6 @@ const bool CIM_AlertIndication_locals[] = {
 
 const Meta_Class CIM_AlertIndication::static_meta_class = {
     0, FLAG_CLASS | FLAG_INDICATION, "CIM_AlertIndication", nullptr, 0,
-    CIM_AlertIndication_features, 27, sizeof(CIM_AlertIndication), CIM_AlertIndication_locals, &CIM_ProcessIndication::static_meta_class, 0, &__meta_repository };
+    CIM_AlertIndication_features, 27, sizeof(CIM_AlertIndication), CIM_AlertIndication_locals, &CIM_ProcessIndication::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

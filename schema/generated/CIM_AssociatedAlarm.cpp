@@ -44,6 +44,6 @@ const bool CIM_AssociatedAlarm_locals[] = {
 
 const Meta_Class CIM_AssociatedAlarm::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_AssociatedAlarm", nullptr, 0,
-    CIM_AssociatedAlarm_features, 2, sizeof(CIM_AssociatedAlarm), CIM_AssociatedAlarm_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_AssociatedAlarm_features, 2, sizeof(CIM_AssociatedAlarm), CIM_AssociatedAlarm_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

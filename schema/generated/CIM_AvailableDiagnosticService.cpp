@@ -59,6 +59,6 @@ const bool CIM_AvailableDiagnosticService_locals[] = {
 
 const Meta_Class CIM_AvailableDiagnosticService::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_AvailableDiagnosticService", nullptr, 0,
-    CIM_AvailableDiagnosticService_features, 5, sizeof(CIM_AvailableDiagnosticService), CIM_AvailableDiagnosticService_locals, &CIM_ServiceAvailableToElement::static_meta_class, 2, &__meta_repository };
+    CIM_AvailableDiagnosticService_features, 5, sizeof(CIM_AvailableDiagnosticService), CIM_AvailableDiagnosticService_locals, &CIM_ServiceAvailableToElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

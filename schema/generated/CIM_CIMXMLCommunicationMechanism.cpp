@@ -195,6 +195,6 @@ const bool CIM_CIMXMLCommunicationMechanism_locals[] = {
 
 const Meta_Class CIM_CIMXMLCommunicationMechanism::static_meta_class = {
     0, FLAG_CLASS, "CIM_CIMXMLCommunicationMechanism", nullptr, 0,
-    CIM_CIMXMLCommunicationMechanism_features, 43, sizeof(CIM_CIMXMLCommunicationMechanism), CIM_CIMXMLCommunicationMechanism_locals, &CIM_ObjectManagerCommunicationMechanism::static_meta_class, 4, &__meta_repository };
+    CIM_CIMXMLCommunicationMechanism_features, 43, sizeof(CIM_CIMXMLCommunicationMechanism), CIM_CIMXMLCommunicationMechanism_locals, &CIM_ObjectManagerCommunicationMechanism::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -80,6 +80,6 @@ const bool CIM_Capabilities_locals[] = {
 
 const Meta_Class CIM_Capabilities::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_Capabilities", nullptr, 0,
-    CIM_Capabilities_features, 6, sizeof(CIM_Capabilities), CIM_Capabilities_locals, &CIM_ManagedElement::static_meta_class, 1, &__meta_repository };
+    CIM_Capabilities_features, 6, sizeof(CIM_Capabilities), CIM_Capabilities_locals, &CIM_ManagedElement::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

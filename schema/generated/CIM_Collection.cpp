@@ -42,6 +42,6 @@ const bool CIM_Collection_locals[] = {
 
 const Meta_Class CIM_Collection::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_Collection", nullptr, 0,
-    CIM_Collection_features, 5, sizeof(CIM_Collection), CIM_Collection_locals, &CIM_ManagedElement::static_meta_class, 0, &__meta_repository };
+    CIM_Collection_features, 5, sizeof(CIM_Collection), CIM_Collection_locals, &CIM_ManagedElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -53,6 +53,6 @@ const bool CIM_CollectionOfMSEs_locals[] = {
 
 const Meta_Class CIM_CollectionOfMSEs::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_CollectionOfMSEs", nullptr, 0,
-    CIM_CollectionOfMSEs_features, 6, sizeof(CIM_CollectionOfMSEs), CIM_CollectionOfMSEs_locals, &CIM_Collection::static_meta_class, 0, &__meta_repository };
+    CIM_CollectionOfMSEs_features, 6, sizeof(CIM_CollectionOfMSEs), CIM_CollectionOfMSEs_locals, &CIM_Collection::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool CIM_CommMechanismForManager_locals[] = {
 
 const Meta_Class CIM_CommMechanismForManager::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_CommMechanismForManager", nullptr, 0,
-    CIM_CommMechanismForManager_features, 2, sizeof(CIM_CommMechanismForManager), CIM_CommMechanismForManager_locals, &CIM_ServiceAccessBySAP::static_meta_class, 2, &__meta_repository };
+    CIM_CommMechanismForManager_features, 2, sizeof(CIM_CommMechanismForManager), CIM_CommMechanismForManager_locals, &CIM_ServiceAccessBySAP::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -42,6 +42,6 @@ const bool CIM_Component_locals[] = {
 
 const Meta_Class CIM_Component::static_meta_class = {
     0, FLAG_ABSTRACT | FLAG_AGGREGATION | FLAG_ASSOCIATION, "CIM_Component", nullptr, 0,
-    CIM_Component_features, 2, sizeof(CIM_Component), CIM_Component_locals, nullptr, 2, &__meta_repository };
+    CIM_Component_features, 2, sizeof(CIM_Component), CIM_Component_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -180,6 +180,6 @@ const bool CIM_ComputerSystem_locals[] = {
 
 const Meta_Class CIM_ComputerSystem::static_meta_class = {
     0, FLAG_CLASS, "CIM_ComputerSystem", nullptr, 0,
-    CIM_ComputerSystem_features, 35, sizeof(CIM_ComputerSystem), CIM_ComputerSystem_locals, &CIM_System::static_meta_class, 2, &__meta_repository };
+    CIM_ComputerSystem_features, 35, sizeof(CIM_ComputerSystem), CIM_ComputerSystem_locals, &CIM_System::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

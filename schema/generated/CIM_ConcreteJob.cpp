@@ -265,6 +265,6 @@ const bool CIM_ConcreteJob_locals[] = {
 
 const Meta_Class CIM_ConcreteJob::static_meta_class = {
     0, FLAG_CLASS, "CIM_ConcreteJob", nullptr, 0,
-    CIM_ConcreteJob_features, 46, sizeof(CIM_ConcreteJob), CIM_ConcreteJob_locals, &CIM_Job::static_meta_class, 1, &__meta_repository };
+    CIM_ConcreteJob_features, 46, sizeof(CIM_ConcreteJob), CIM_ConcreteJob_locals, &CIM_Job::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -50,6 +50,6 @@ const bool CIM_Container_locals[] = {
 
 const Meta_Class CIM_Container::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION, "CIM_Container", nullptr, 0,
-    CIM_Container_features, 3, sizeof(CIM_Container), CIM_Container_locals, &CIM_Component::static_meta_class, 2, &__meta_repository };
+    CIM_Container_features, 3, sizeof(CIM_Container), CIM_Container_locals, &CIM_Component::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -94,6 +94,6 @@ const bool CIM_ControlledBy_locals[] = {
 
 const Meta_Class CIM_ControlledBy::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ControlledBy", nullptr, 0,
-    CIM_ControlledBy_features, 11, sizeof(CIM_ControlledBy), CIM_ControlledBy_locals, &CIM_DeviceConnection::static_meta_class, 2, &__meta_repository };
+    CIM_ControlledBy_features, 11, sizeof(CIM_ControlledBy), CIM_ControlledBy_locals, &CIM_DeviceConnection::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

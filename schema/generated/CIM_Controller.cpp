@@ -192,6 +192,6 @@ const bool CIM_Controller_locals[] = {
 
 const Meta_Class CIM_Controller::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_Controller", nullptr, 0,
-    CIM_Controller_features, 52, sizeof(CIM_Controller), CIM_Controller_locals, &CIM_LogicalDevice::static_meta_class, 4, &__meta_repository };
+    CIM_Controller_features, 52, sizeof(CIM_Controller), CIM_Controller_locals, &CIM_LogicalDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -42,6 +42,6 @@ const bool CIM_Dependency_locals[] = {
 
 const Meta_Class CIM_Dependency::static_meta_class = {
     0, FLAG_ABSTRACT | FLAG_ASSOCIATION, "CIM_Dependency", nullptr, 0,
-    CIM_Dependency_features, 2, sizeof(CIM_Dependency), CIM_Dependency_locals, nullptr, 2, &__meta_repository };
+    CIM_Dependency_features, 2, sizeof(CIM_Dependency), CIM_Dependency_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

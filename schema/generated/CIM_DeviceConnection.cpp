@@ -55,6 +55,6 @@ const bool CIM_DeviceConnection_locals[] = {
 
 const Meta_Class CIM_DeviceConnection::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_DeviceConnection", nullptr, 0,
-    CIM_DeviceConnection_features, 4, sizeof(CIM_DeviceConnection), CIM_DeviceConnection_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_DeviceConnection_features, 4, sizeof(CIM_DeviceConnection), CIM_DeviceConnection_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

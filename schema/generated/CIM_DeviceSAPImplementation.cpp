@@ -44,6 +44,6 @@ const bool CIM_DeviceSAPImplementation_locals[] = {
 
 const Meta_Class CIM_DeviceSAPImplementation::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_DeviceSAPImplementation", nullptr, 0,
-    CIM_DeviceSAPImplementation_features, 2, sizeof(CIM_DeviceSAPImplementation), CIM_DeviceSAPImplementation_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_DeviceSAPImplementation_features, 2, sizeof(CIM_DeviceSAPImplementation), CIM_DeviceSAPImplementation_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -105,6 +105,6 @@ const bool CIM_DiagnosticCompletionRecord_locals[] = {
 
 const Meta_Class CIM_DiagnosticCompletionRecord::static_meta_class = {
     0, FLAG_CLASS, "CIM_DiagnosticCompletionRecord", nullptr, 0,
-    CIM_DiagnosticCompletionRecord_features, 21, sizeof(CIM_DiagnosticCompletionRecord), CIM_DiagnosticCompletionRecord_locals, &CIM_DiagnosticServiceRecord::static_meta_class, 1, &__meta_repository };
+    CIM_DiagnosticCompletionRecord_features, 21, sizeof(CIM_DiagnosticCompletionRecord), CIM_DiagnosticCompletionRecord_locals, &CIM_DiagnosticServiceRecord::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

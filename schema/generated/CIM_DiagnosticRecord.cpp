@@ -99,6 +99,6 @@ const bool CIM_DiagnosticRecord_locals[] = {
 
 const Meta_Class CIM_DiagnosticRecord::static_meta_class = {
     0, FLAG_CLASS, "CIM_DiagnosticRecord", nullptr, 0,
-    CIM_DiagnosticRecord_features, 15, sizeof(CIM_DiagnosticRecord), CIM_DiagnosticRecord_locals, &CIM_RecordForLog::static_meta_class, 1, &__meta_repository };
+    CIM_DiagnosticRecord_features, 15, sizeof(CIM_DiagnosticRecord), CIM_DiagnosticRecord_locals, &CIM_RecordForLog::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

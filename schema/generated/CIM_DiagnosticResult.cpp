@@ -175,6 +175,6 @@ const bool CIM_DiagnosticResult_locals[] = {
 
 const Meta_Class CIM_DiagnosticResult::static_meta_class = {
     0, FLAG_CLASS, "CIM_DiagnosticResult", nullptr, 0,
-    CIM_DiagnosticResult_features, 24, sizeof(CIM_DiagnosticResult), CIM_DiagnosticResult_locals, nullptr, 5, &__meta_repository };
+    CIM_DiagnosticResult_features, 24, sizeof(CIM_DiagnosticResult), CIM_DiagnosticResult_locals, nullptr, 5, &schema_repository };
 
 }  // namespace CPTA

@@ -209,6 +209,6 @@ const bool CIM_DiagnosticService_locals[] = {
 
 const Meta_Class CIM_DiagnosticService::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_DiagnosticService", nullptr, 0,
-    CIM_DiagnosticService_features, 37, sizeof(CIM_DiagnosticService), CIM_DiagnosticService_locals, &CIM_Service::static_meta_class, 4, &__meta_repository };
+    CIM_DiagnosticService_features, 37, sizeof(CIM_DiagnosticService), CIM_DiagnosticService_locals, &CIM_Service::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -104,6 +104,6 @@ const bool CIM_DiagnosticServiceRecord_locals[] = {
 
 const Meta_Class CIM_DiagnosticServiceRecord::static_meta_class = {
     0, FLAG_CLASS, "CIM_DiagnosticServiceRecord", nullptr, 0,
-    CIM_DiagnosticServiceRecord_features, 19, sizeof(CIM_DiagnosticServiceRecord), CIM_DiagnosticServiceRecord_locals, &CIM_DiagnosticRecord::static_meta_class, 1, &__meta_repository };
+    CIM_DiagnosticServiceRecord_features, 19, sizeof(CIM_DiagnosticServiceRecord), CIM_DiagnosticServiceRecord_locals, &CIM_DiagnosticRecord::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

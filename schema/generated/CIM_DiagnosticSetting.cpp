@@ -166,6 +166,6 @@ const bool CIM_DiagnosticSetting_locals[] = {
 
 const Meta_Class CIM_DiagnosticSetting::static_meta_class = {
     0, FLAG_CLASS, "CIM_DiagnosticSetting", nullptr, 0,
-    CIM_DiagnosticSetting_features, 31, sizeof(CIM_DiagnosticSetting), CIM_DiagnosticSetting_locals, &CIM_Setting::static_meta_class, 1, &__meta_repository };
+    CIM_DiagnosticSetting_features, 31, sizeof(CIM_DiagnosticSetting), CIM_DiagnosticSetting_locals, &CIM_Setting::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -150,6 +150,6 @@ const bool CIM_DiagnosticSettingData_locals[] = {
 
 const Meta_Class CIM_DiagnosticSettingData::static_meta_class = {
     0, FLAG_CLASS | FLAG_EXPERIMENTAL, "CIM_DiagnosticSettingData", nullptr, 0,
-    CIM_DiagnosticSettingData_features, 24, sizeof(CIM_DiagnosticSettingData), CIM_DiagnosticSettingData_locals, &CIM_SettingData::static_meta_class, 1, &__meta_repository };
+    CIM_DiagnosticSettingData_features, 24, sizeof(CIM_DiagnosticSettingData), CIM_DiagnosticSettingData_locals, &CIM_SettingData::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

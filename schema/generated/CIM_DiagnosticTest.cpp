@@ -274,6 +274,6 @@ const bool CIM_DiagnosticTest_locals[] = {
 
 const Meta_Class CIM_DiagnosticTest::static_meta_class = {
     0, FLAG_CLASS, "CIM_DiagnosticTest", nullptr, 0,
-    CIM_DiagnosticTest_features, 47, sizeof(CIM_DiagnosticTest), CIM_DiagnosticTest_locals, &CIM_DiagnosticService::static_meta_class, 4, &__meta_repository };
+    CIM_DiagnosticTest_features, 47, sizeof(CIM_DiagnosticTest), CIM_DiagnosticTest_locals, &CIM_DiagnosticService::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

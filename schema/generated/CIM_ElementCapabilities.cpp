@@ -49,6 +49,6 @@ const bool CIM_ElementCapabilities_locals[] = {
 
 const Meta_Class CIM_ElementCapabilities::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ElementCapabilities", nullptr, 0,
-    CIM_ElementCapabilities_features, 3, sizeof(CIM_ElementCapabilities), CIM_ElementCapabilities_locals, nullptr, 2, &__meta_repository };
+    CIM_ElementCapabilities_features, 3, sizeof(CIM_ElementCapabilities), CIM_ElementCapabilities_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -43,6 +43,6 @@ const bool CIM_ElementConformsToProfile_locals[] = {
 
 const Meta_Class CIM_ElementConformsToProfile::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ElementConformsToProfile", nullptr, 0,
-    CIM_ElementConformsToProfile_features, 2, sizeof(CIM_ElementConformsToProfile), CIM_ElementConformsToProfile_locals, nullptr, 2, &__meta_repository };
+    CIM_ElementConformsToProfile_features, 2, sizeof(CIM_ElementConformsToProfile), CIM_ElementConformsToProfile_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -62,6 +62,6 @@ const bool CIM_ElementSoftwareIdentity_locals[] = {
 
 const Meta_Class CIM_ElementSoftwareIdentity::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ElementSoftwareIdentity", nullptr, 0,
-    CIM_ElementSoftwareIdentity_features, 5, sizeof(CIM_ElementSoftwareIdentity), CIM_ElementSoftwareIdentity_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_ElementSoftwareIdentity_features, 5, sizeof(CIM_ElementSoftwareIdentity), CIM_ElementSoftwareIdentity_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

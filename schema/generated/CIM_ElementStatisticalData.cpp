@@ -43,6 +43,6 @@ const bool CIM_ElementStatisticalData_locals[] = {
 
 const Meta_Class CIM_ElementStatisticalData::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ElementStatisticalData", nullptr, 0,
-    CIM_ElementStatisticalData_features, 2, sizeof(CIM_ElementStatisticalData), CIM_ElementStatisticalData_locals, nullptr, 2, &__meta_repository };
+    CIM_ElementStatisticalData_features, 2, sizeof(CIM_ElementStatisticalData), CIM_ElementStatisticalData_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

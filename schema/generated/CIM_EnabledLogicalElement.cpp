@@ -159,6 +159,6 @@ const bool CIM_EnabledLogicalElement_locals[] = {
 
 const Meta_Class CIM_EnabledLogicalElement::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_EnabledLogicalElement", nullptr, 0,
-    CIM_EnabledLogicalElement_features, 23, sizeof(CIM_EnabledLogicalElement), CIM_EnabledLogicalElement_locals, &CIM_LogicalElement::static_meta_class, 0, &__meta_repository };
+    CIM_EnabledLogicalElement_features, 23, sizeof(CIM_EnabledLogicalElement), CIM_EnabledLogicalElement_locals, &CIM_LogicalElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -121,6 +121,6 @@ const bool CIM_Error_locals[] = {
 
 const Meta_Class CIM_Error::static_meta_class = {
     0, FLAG_CLASS | FLAG_EXCEPTION | FLAG_INDICATION, "CIM_Error", nullptr, 0,
-    CIM_Error_features, 15, sizeof(CIM_Error), CIM_Error_locals, nullptr, 0, &__meta_repository };
+    CIM_Error_features, 15, sizeof(CIM_Error), CIM_Error_locals, nullptr, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -274,6 +274,6 @@ const bool CIM_EthernetPort_locals[] = {
 
 const Meta_Class CIM_EthernetPort::static_meta_class = {
     0, FLAG_CLASS, "CIM_EthernetPort", nullptr, 0,
-    CIM_EthernetPort_features, 72, sizeof(CIM_EthernetPort), CIM_EthernetPort_locals, &CIM_NetworkPort::static_meta_class, 4, &__meta_repository };
+    CIM_EthernetPort_features, 72, sizeof(CIM_EthernetPort), CIM_EthernetPort_locals, &CIM_NetworkPort::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

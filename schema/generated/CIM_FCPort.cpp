@@ -282,6 +282,6 @@ const bool CIM_FCPort_locals[] = {
 
 const Meta_Class CIM_FCPort::static_meta_class = {
     0, FLAG_CLASS, "CIM_FCPort", nullptr, 0,
-    CIM_FCPort_features, 73, sizeof(CIM_FCPort), CIM_FCPort_locals, &CIM_NetworkPort::static_meta_class, 4, &__meta_repository };
+    CIM_FCPort_features, 73, sizeof(CIM_FCPort), CIM_FCPort_locals, &CIM_NetworkPort::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -335,6 +335,6 @@ const bool CIM_FCPortStatistics_locals[] = {
 
 const Meta_Class CIM_FCPortStatistics::static_meta_class = {
     0, FLAG_CLASS, "CIM_FCPortStatistics", nullptr, 0,
-    CIM_FCPortStatistics_features, 57, sizeof(CIM_FCPortStatistics), CIM_FCPortStatistics_locals, &CIM_NetworkPortStatistics::static_meta_class, 1, &__meta_repository };
+    CIM_FCPortStatistics_features, 57, sizeof(CIM_FCPortStatistics), CIM_FCPortStatistics_locals, &CIM_NetworkPortStatistics::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

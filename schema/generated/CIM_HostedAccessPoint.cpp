@@ -44,6 +44,6 @@ const bool CIM_HostedAccessPoint_locals[] = {
 
 const Meta_Class CIM_HostedAccessPoint::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_HostedAccessPoint", nullptr, 0,
-    CIM_HostedAccessPoint_features, 2, sizeof(CIM_HostedAccessPoint), CIM_HostedAccessPoint_locals, &CIM_HostedDependency::static_meta_class, 2, &__meta_repository };
+    CIM_HostedAccessPoint_features, 2, sizeof(CIM_HostedAccessPoint), CIM_HostedAccessPoint_locals, &CIM_HostedDependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

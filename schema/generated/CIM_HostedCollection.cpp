@@ -44,6 +44,6 @@ const bool CIM_HostedCollection_locals[] = {
 
 const Meta_Class CIM_HostedCollection::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_HostedCollection", nullptr, 0,
-    CIM_HostedCollection_features, 2, sizeof(CIM_HostedCollection), CIM_HostedCollection_locals, &CIM_HostedDependency::static_meta_class, 2, &__meta_repository };
+    CIM_HostedCollection_features, 2, sizeof(CIM_HostedCollection), CIM_HostedCollection_locals, &CIM_HostedDependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -43,6 +43,6 @@ const bool CIM_HostedDependency_locals[] = {
 
 const Meta_Class CIM_HostedDependency::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_HostedDependency", nullptr, 0,
-    CIM_HostedDependency_features, 2, sizeof(CIM_HostedDependency), CIM_HostedDependency_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_HostedDependency_features, 2, sizeof(CIM_HostedDependency), CIM_HostedDependency_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool CIM_HostedService_locals[] = {
 
 const Meta_Class CIM_HostedService::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_HostedService", nullptr, 0,
-    CIM_HostedService_features, 2, sizeof(CIM_HostedService), CIM_HostedService_locals, &CIM_HostedDependency::static_meta_class, 2, &__meta_repository };
+    CIM_HostedService_features, 2, sizeof(CIM_HostedService), CIM_HostedService_locals, &CIM_HostedDependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

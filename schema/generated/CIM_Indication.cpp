@@ -77,6 +77,6 @@ const bool CIM_Indication_locals[] = {
 
 const Meta_Class CIM_Indication::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT | FLAG_INDICATION, "CIM_Indication", nullptr, 0,
-    CIM_Indication_features, 8, sizeof(CIM_Indication), CIM_Indication_locals, nullptr, 0, &__meta_repository };
+    CIM_Indication_features, 8, sizeof(CIM_Indication), CIM_Indication_locals, nullptr, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -55,6 +55,6 @@ const bool CIM_InitiatorTargetLogicalUnitPath_locals[] = {
 
 const Meta_Class CIM_InitiatorTargetLogicalUnitPath::static_meta_class = {
     0, FLAG_ASSOCIATION | FLAG_EXPERIMENTAL, "CIM_InitiatorTargetLogicalUnitPath", nullptr, 0,
-    CIM_InitiatorTargetLogicalUnitPath_features, 4, sizeof(CIM_InitiatorTargetLogicalUnitPath), CIM_InitiatorTargetLogicalUnitPath_locals, nullptr, 3, &__meta_repository };
+    CIM_InitiatorTargetLogicalUnitPath_features, 4, sizeof(CIM_InitiatorTargetLogicalUnitPath), CIM_InitiatorTargetLogicalUnitPath_locals, nullptr, 3, &schema_repository };
 
 }  // namespace CPTA

@@ -43,6 +43,6 @@ const bool CIM_InstalledSoftwareIdentity_locals[] = {
 
 const Meta_Class CIM_InstalledSoftwareIdentity::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_InstalledSoftwareIdentity", nullptr, 0,
-    CIM_InstalledSoftwareIdentity_features, 2, sizeof(CIM_InstalledSoftwareIdentity), CIM_InstalledSoftwareIdentity_locals, nullptr, 2, &__meta_repository };
+    CIM_InstalledSoftwareIdentity_features, 2, sizeof(CIM_InstalledSoftwareIdentity), CIM_InstalledSoftwareIdentity_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

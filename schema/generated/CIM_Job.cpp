@@ -231,6 +231,6 @@ const bool CIM_Job_locals[] = {
 
 const Meta_Class CIM_Job::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_Job", nullptr, 0,
-    CIM_Job_features, 37, sizeof(CIM_Job), CIM_Job_locals, &CIM_LogicalElement::static_meta_class, 0, &__meta_repository };
+    CIM_Job_features, 37, sizeof(CIM_Job), CIM_Job_locals, &CIM_LogicalElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

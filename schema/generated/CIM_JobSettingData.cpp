@@ -131,6 +131,6 @@ const bool CIM_JobSettingData_locals[] = {
 
 const Meta_Class CIM_JobSettingData::static_meta_class = {
     0, FLAG_CLASS, "CIM_JobSettingData", nullptr, 0,
-    CIM_JobSettingData_features, 21, sizeof(CIM_JobSettingData), CIM_JobSettingData_locals, &CIM_SettingData::static_meta_class, 1, &__meta_repository };
+    CIM_JobSettingData_features, 21, sizeof(CIM_JobSettingData), CIM_JobSettingData_locals, &CIM_SettingData::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -176,6 +176,6 @@ const bool CIM_LANEndpoint_locals[] = {
 
 const Meta_Class CIM_LANEndpoint::static_meta_class = {
     0, FLAG_CLASS, "CIM_LANEndpoint", nullptr, 0,
-    CIM_LANEndpoint_features, 39, sizeof(CIM_LANEndpoint), CIM_LANEndpoint_locals, &CIM_ProtocolEndpoint::static_meta_class, 4, &__meta_repository };
+    CIM_LANEndpoint_features, 39, sizeof(CIM_LANEndpoint), CIM_LANEndpoint_locals, &CIM_ProtocolEndpoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

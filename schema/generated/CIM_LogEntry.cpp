@@ -112,6 +112,6 @@ const bool CIM_LogEntry_locals[] = {
 
 const Meta_Class CIM_LogEntry::static_meta_class = {
     0, FLAG_CLASS, "CIM_LogEntry", nullptr, 0,
-    CIM_LogEntry_features, 17, sizeof(CIM_LogEntry), CIM_LogEntry_locals, &CIM_RecordForLog::static_meta_class, 1, &__meta_repository };
+    CIM_LogEntry_features, 17, sizeof(CIM_LogEntry), CIM_LogEntry_locals, &CIM_RecordForLog::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -357,6 +357,6 @@ const bool CIM_LogicalDevice_locals[] = {
 
 const Meta_Class CIM_LogicalDevice::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_LogicalDevice", nullptr, 0,
-    CIM_LogicalDevice_features, 48, sizeof(CIM_LogicalDevice), CIM_LogicalDevice_locals, &CIM_EnabledLogicalElement::static_meta_class, 4, &__meta_repository };
+    CIM_LogicalDevice_features, 48, sizeof(CIM_LogicalDevice), CIM_LogicalDevice_locals, &CIM_EnabledLogicalElement::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

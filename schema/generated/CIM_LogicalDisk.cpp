@@ -292,6 +292,6 @@ const bool CIM_LogicalDisk_locals[] = {
 
 const Meta_Class CIM_LogicalDisk::static_meta_class = {
     0, FLAG_CLASS, "CIM_LogicalDisk", nullptr, 0,
-    CIM_LogicalDisk_features, 80, sizeof(CIM_LogicalDisk), CIM_LogicalDisk_locals, &CIM_StorageExtent::static_meta_class, 4, &__meta_repository };
+    CIM_LogicalDisk_features, 80, sizeof(CIM_LogicalDisk), CIM_LogicalDisk_locals, &CIM_StorageExtent::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -74,6 +74,6 @@ const bool CIM_LogicalElement_locals[] = {
 
 const Meta_Class CIM_LogicalElement::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_LogicalElement", nullptr, 0,
-    CIM_LogicalElement_features, 15, sizeof(CIM_LogicalElement), CIM_LogicalElement_locals, &CIM_ManagedSystemElement::static_meta_class, 0, &__meta_repository };
+    CIM_LogicalElement_features, 15, sizeof(CIM_LogicalElement), CIM_LogicalElement_locals, &CIM_ManagedSystemElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -204,6 +204,6 @@ const bool CIM_LogicalPort_locals[] = {
 
 const Meta_Class CIM_LogicalPort::static_meta_class = {
     0, FLAG_CLASS, "CIM_LogicalPort", nullptr, 0,
-    CIM_LogicalPort_features, 54, sizeof(CIM_LogicalPort), CIM_LogicalPort_locals, &CIM_LogicalDevice::static_meta_class, 4, &__meta_repository };
+    CIM_LogicalPort_features, 54, sizeof(CIM_LogicalPort), CIM_LogicalPort_locals, &CIM_LogicalDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -65,6 +65,6 @@ const bool CIM_LogicalPortGroup_locals[] = {
 
 const Meta_Class CIM_LogicalPortGroup::static_meta_class = {
     0, FLAG_CLASS, "CIM_LogicalPortGroup", nullptr, 0,
-    CIM_LogicalPortGroup_features, 8, sizeof(CIM_LogicalPortGroup), CIM_LogicalPortGroup_locals, &CIM_SystemSpecificCollection::static_meta_class, 1, &__meta_repository };
+    CIM_LogicalPortGroup_features, 8, sizeof(CIM_LogicalPortGroup), CIM_LogicalPortGroup_locals, &CIM_SystemSpecificCollection::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

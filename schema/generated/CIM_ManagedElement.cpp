@@ -59,6 +59,6 @@ const bool CIM_ManagedElement_locals[] = {
 
 const Meta_Class CIM_ManagedElement::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_ManagedElement", nullptr, 0,
-    CIM_ManagedElement_features, 5, sizeof(CIM_ManagedElement), CIM_ManagedElement_locals, nullptr, 0, &__meta_repository };
+    CIM_ManagedElement_features, 5, sizeof(CIM_ManagedElement), CIM_ManagedElement_locals, nullptr, 0, &schema_repository };
 
 }  // namespace CPTA

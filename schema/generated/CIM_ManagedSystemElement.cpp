@@ -107,6 +107,6 @@ const bool CIM_ManagedSystemElement_locals[] = {
 
 const Meta_Class CIM_ManagedSystemElement::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_ManagedSystemElement", nullptr, 0,
-    CIM_ManagedSystemElement_features, 15, sizeof(CIM_ManagedSystemElement), CIM_ManagedSystemElement_locals, &CIM_ManagedElement::static_meta_class, 0, &__meta_repository };
+    CIM_ManagedSystemElement_features, 15, sizeof(CIM_ManagedSystemElement), CIM_ManagedSystemElement_locals, &CIM_ManagedElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

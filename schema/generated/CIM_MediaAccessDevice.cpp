@@ -330,6 +330,6 @@ const bool CIM_MediaAccessDevice_locals[] = {
 
 const Meta_Class CIM_MediaAccessDevice::static_meta_class = {
     0, FLAG_CLASS, "CIM_MediaAccessDevice", nullptr, 0,
-    CIM_MediaAccessDevice_features, 72, sizeof(CIM_MediaAccessDevice), CIM_MediaAccessDevice_locals, &CIM_LogicalDevice::static_meta_class, 4, &__meta_repository };
+    CIM_MediaAccessDevice_features, 72, sizeof(CIM_MediaAccessDevice), CIM_MediaAccessDevice_locals, &CIM_LogicalDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

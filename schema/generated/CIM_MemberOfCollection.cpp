@@ -43,6 +43,6 @@ const bool CIM_MemberOfCollection_locals[] = {
 
 const Meta_Class CIM_MemberOfCollection::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION, "CIM_MemberOfCollection", nullptr, 0,
-    CIM_MemberOfCollection_features, 2, sizeof(CIM_MemberOfCollection), CIM_MemberOfCollection_locals, nullptr, 2, &__meta_repository };
+    CIM_MemberOfCollection_features, 2, sizeof(CIM_MemberOfCollection), CIM_MemberOfCollection_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

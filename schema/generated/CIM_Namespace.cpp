@@ -113,6 +113,6 @@ const bool CIM_Namespace_locals[] = {
 
 const Meta_Class CIM_Namespace::static_meta_class = {
     0, FLAG_CLASS, "CIM_Namespace", nullptr, 0,
-    CIM_Namespace_features, 16, sizeof(CIM_Namespace), CIM_Namespace_locals, &CIM_ManagedElement::static_meta_class, 6, &__meta_repository };
+    CIM_Namespace_features, 16, sizeof(CIM_Namespace), CIM_Namespace_locals, &CIM_ManagedElement::static_meta_class, 6, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool CIM_NamespaceInManager_locals[] = {
 
 const Meta_Class CIM_NamespaceInManager::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_NamespaceInManager", nullptr, 0,
-    CIM_NamespaceInManager_features, 2, sizeof(CIM_NamespaceInManager), CIM_NamespaceInManager_locals, &CIM_HostedDependency::static_meta_class, 2, &__meta_repository };
+    CIM_NamespaceInManager_features, 2, sizeof(CIM_NamespaceInManager), CIM_NamespaceInManager_locals, &CIM_HostedDependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -251,6 +251,6 @@ const bool CIM_NetworkPort_locals[] = {
 
 const Meta_Class CIM_NetworkPort::static_meta_class = {
     0, FLAG_CLASS, "CIM_NetworkPort", nullptr, 0,
-    CIM_NetworkPort_features, 64, sizeof(CIM_NetworkPort), CIM_NetworkPort_locals, &CIM_LogicalPort::static_meta_class, 4, &__meta_repository };
+    CIM_NetworkPort_features, 64, sizeof(CIM_NetworkPort), CIM_NetworkPort_locals, &CIM_LogicalPort::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

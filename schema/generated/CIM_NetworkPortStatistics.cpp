@@ -88,6 +88,6 @@ const bool CIM_NetworkPortStatistics_locals[] = {
 
 const Meta_Class CIM_NetworkPortStatistics::static_meta_class = {
     0, FLAG_CLASS, "CIM_NetworkPortStatistics", nullptr, 0,
-    CIM_NetworkPortStatistics_features, 15, sizeof(CIM_NetworkPortStatistics), CIM_NetworkPortStatistics_locals, &CIM_StatisticalData::static_meta_class, 1, &__meta_repository };
+    CIM_NetworkPortStatistics_features, 15, sizeof(CIM_NetworkPortStatistics), CIM_NetworkPortStatistics_locals, &CIM_StatisticalData::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -152,6 +152,6 @@ const bool CIM_ObjectManager_locals[] = {
 
 const Meta_Class CIM_ObjectManager::static_meta_class = {
     0, FLAG_CLASS, "CIM_ObjectManager", nullptr, 0,
-    CIM_ObjectManager_features, 36, sizeof(CIM_ObjectManager), CIM_ObjectManager_locals, &CIM_WBEMService::static_meta_class, 4, &__meta_repository };
+    CIM_ObjectManager_features, 36, sizeof(CIM_ObjectManager), CIM_ObjectManager_locals, &CIM_WBEMService::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

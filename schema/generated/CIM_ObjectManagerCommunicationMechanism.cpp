@@ -174,6 +174,6 @@ const bool CIM_ObjectManagerCommunicationMechanism_locals[] = {
 
 const Meta_Class CIM_ObjectManagerCommunicationMechanism::static_meta_class = {
     0, FLAG_CLASS, "CIM_ObjectManagerCommunicationMechanism", nullptr, 0,
-    CIM_ObjectManagerCommunicationMechanism_features, 36, sizeof(CIM_ObjectManagerCommunicationMechanism), CIM_ObjectManagerCommunicationMechanism_locals, &CIM_ServiceAccessPoint::static_meta_class, 4, &__meta_repository };
+    CIM_ObjectManagerCommunicationMechanism_features, 36, sizeof(CIM_ObjectManagerCommunicationMechanism), CIM_ObjectManagerCommunicationMechanism_locals, &CIM_ServiceAccessPoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

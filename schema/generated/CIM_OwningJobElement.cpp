@@ -43,6 +43,6 @@ const bool CIM_OwningJobElement_locals[] = {
 
 const Meta_Class CIM_OwningJobElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_OwningJobElement", nullptr, 0,
-    CIM_OwningJobElement_features, 2, sizeof(CIM_OwningJobElement), CIM_OwningJobElement_locals, nullptr, 2, &__meta_repository };
+    CIM_OwningJobElement_features, 2, sizeof(CIM_OwningJobElement), CIM_OwningJobElement_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

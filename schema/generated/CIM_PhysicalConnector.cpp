@@ -178,6 +178,6 @@ const bool CIM_PhysicalConnector_locals[] = {
 
 const Meta_Class CIM_PhysicalConnector::static_meta_class = {
     0, FLAG_CLASS, "CIM_PhysicalConnector", nullptr, 0,
-    CIM_PhysicalConnector_features, 38, sizeof(CIM_PhysicalConnector), CIM_PhysicalConnector_locals, &CIM_PhysicalElement::static_meta_class, 2, &__meta_repository };
+    CIM_PhysicalConnector_features, 38, sizeof(CIM_PhysicalConnector), CIM_PhysicalConnector_locals, &CIM_PhysicalElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

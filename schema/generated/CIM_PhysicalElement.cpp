@@ -170,6 +170,6 @@ const bool CIM_PhysicalElement_locals[] = {
 
 const Meta_Class CIM_PhysicalElement::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_PhysicalElement", nullptr, 0,
-    CIM_PhysicalElement_features, 29, sizeof(CIM_PhysicalElement), CIM_PhysicalElement_locals, &CIM_ManagedSystemElement::static_meta_class, 2, &__meta_repository };
+    CIM_PhysicalElement_features, 29, sizeof(CIM_PhysicalElement), CIM_PhysicalElement_locals, &CIM_ManagedSystemElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

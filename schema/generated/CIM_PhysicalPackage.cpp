@@ -214,6 +214,6 @@ const bool CIM_PhysicalPackage_locals[] = {
 
 const Meta_Class CIM_PhysicalPackage::static_meta_class = {
     0, FLAG_CLASS, "CIM_PhysicalPackage", nullptr, 0,
-    CIM_PhysicalPackage_features, 41, sizeof(CIM_PhysicalPackage), CIM_PhysicalPackage_locals, &CIM_PhysicalElement::static_meta_class, 2, &__meta_repository };
+    CIM_PhysicalPackage_features, 41, sizeof(CIM_PhysicalPackage), CIM_PhysicalPackage_locals, &CIM_PhysicalElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

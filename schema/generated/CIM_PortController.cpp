@@ -199,6 +199,6 @@ const bool CIM_PortController_locals[] = {
 
 const Meta_Class CIM_PortController::static_meta_class = {
     0, FLAG_CLASS, "CIM_PortController", nullptr, 0,
-    CIM_PortController_features, 55, sizeof(CIM_PortController), CIM_PortController_locals, &CIM_Controller::static_meta_class, 4, &__meta_repository };
+    CIM_PortController_features, 55, sizeof(CIM_PortController), CIM_PortController_locals, &CIM_Controller::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

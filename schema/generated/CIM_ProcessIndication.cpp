@@ -51,6 +51,6 @@ const bool CIM_ProcessIndication_locals[] = {
 
 const Meta_Class CIM_ProcessIndication::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT | FLAG_INDICATION, "CIM_ProcessIndication", nullptr, 0,
-    CIM_ProcessIndication_features, 8, sizeof(CIM_ProcessIndication), CIM_ProcessIndication_locals, &CIM_Indication::static_meta_class, 0, &__meta_repository };
+    CIM_ProcessIndication_features, 8, sizeof(CIM_ProcessIndication), CIM_ProcessIndication_locals, &CIM_Indication::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

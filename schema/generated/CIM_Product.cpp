@@ -95,6 +95,6 @@ const bool CIM_Product_locals[] = {
 
 const Meta_Class CIM_Product::static_meta_class = {
     0, FLAG_CLASS, "CIM_Product", nullptr, 0,
-    CIM_Product_features, 13, sizeof(CIM_Product), CIM_Product_locals, &CIM_ManagedElement::static_meta_class, 4, &__meta_repository };
+    CIM_Product_features, 13, sizeof(CIM_Product), CIM_Product_locals, &CIM_ManagedElement::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool CIM_ProductElementComponent_locals[] = {
 
 const Meta_Class CIM_ProductElementComponent::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "CIM_ProductElementComponent", nullptr, 0,
-    CIM_ProductElementComponent_features, 2, sizeof(CIM_ProductElementComponent), CIM_ProductElementComponent_locals, &CIM_Component::static_meta_class, 2, &__meta_repository };
+    CIM_ProductElementComponent_features, 2, sizeof(CIM_ProductElementComponent), CIM_ProductElementComponent_locals, &CIM_Component::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -41,6 +41,6 @@ const bool CIM_ProductPhysicalComponent_locals[] = {
 
 const Meta_Class CIM_ProductPhysicalComponent::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "CIM_ProductPhysicalComponent", nullptr, 0,
-    CIM_ProductPhysicalComponent_features, 2, sizeof(CIM_ProductPhysicalComponent), CIM_ProductPhysicalComponent_locals, &CIM_ProductElementComponent::static_meta_class, 2, &__meta_repository };
+    CIM_ProductPhysicalComponent_features, 2, sizeof(CIM_ProductPhysicalComponent), CIM_ProductPhysicalComponent_locals, &CIM_ProductElementComponent::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -175,6 +175,6 @@ const bool CIM_ProtocolEndpoint_locals[] = {
 
 const Meta_Class CIM_ProtocolEndpoint::static_meta_class = {
     0, FLAG_CLASS, "CIM_ProtocolEndpoint", nullptr, 0,
-    CIM_ProtocolEndpoint_features, 32, sizeof(CIM_ProtocolEndpoint), CIM_ProtocolEndpoint_locals, &CIM_ServiceAccessPoint::static_meta_class, 4, &__meta_repository };
+    CIM_ProtocolEndpoint_features, 32, sizeof(CIM_ProtocolEndpoint), CIM_ProtocolEndpoint_locals, &CIM_ServiceAccessPoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

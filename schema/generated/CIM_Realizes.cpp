@@ -44,6 +44,6 @@ const bool CIM_Realizes_locals[] = {
 
 const Meta_Class CIM_Realizes::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_Realizes", nullptr, 0,
-    CIM_Realizes_features, 2, sizeof(CIM_Realizes), CIM_Realizes_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_Realizes_features, 2, sizeof(CIM_Realizes), CIM_Realizes_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

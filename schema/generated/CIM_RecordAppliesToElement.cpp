@@ -44,6 +44,6 @@ const bool CIM_RecordAppliesToElement_locals[] = {
 
 const Meta_Class CIM_RecordAppliesToElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_RecordAppliesToElement", nullptr, 0,
-    CIM_RecordAppliesToElement_features, 2, sizeof(CIM_RecordAppliesToElement), CIM_RecordAppliesToElement_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_RecordAppliesToElement_features, 2, sizeof(CIM_RecordAppliesToElement), CIM_RecordAppliesToElement_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -71,6 +71,6 @@ const bool CIM_RecordForLog_locals[] = {
 
 const Meta_Class CIM_RecordForLog::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_RecordForLog", nullptr, 0,
-    CIM_RecordForLog_features, 9, sizeof(CIM_RecordForLog), CIM_RecordForLog_locals, &CIM_ManagedElement::static_meta_class, 0, &__meta_repository };
+    CIM_RecordForLog_features, 9, sizeof(CIM_RecordForLog), CIM_RecordForLog_locals, &CIM_ManagedElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

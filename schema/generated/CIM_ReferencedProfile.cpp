@@ -43,6 +43,6 @@ const bool CIM_ReferencedProfile_locals[] = {
 
 const Meta_Class CIM_ReferencedProfile::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ReferencedProfile", nullptr, 0,
-    CIM_ReferencedProfile_features, 2, sizeof(CIM_ReferencedProfile), CIM_ReferencedProfile_locals, &CIM_ReferencedSpecification::static_meta_class, 2, &__meta_repository };
+    CIM_ReferencedProfile_features, 2, sizeof(CIM_ReferencedProfile), CIM_ReferencedProfile_locals, &CIM_ReferencedSpecification::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -43,6 +43,6 @@ const bool CIM_ReferencedSpecification_locals[] = {
 
 const Meta_Class CIM_ReferencedSpecification::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ReferencedSpecification", nullptr, 0,
-    CIM_ReferencedSpecification_features, 2, sizeof(CIM_ReferencedSpecification), CIM_ReferencedSpecification_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_ReferencedSpecification_features, 2, sizeof(CIM_ReferencedSpecification), CIM_ReferencedSpecification_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -208,6 +208,6 @@ const bool CIM_RegisteredProfile_locals[] = {
 
 const Meta_Class CIM_RegisteredProfile::static_meta_class = {
     0, FLAG_CLASS, "CIM_RegisteredProfile", nullptr, 0,
-    CIM_RegisteredProfile_features, 17, sizeof(CIM_RegisteredProfile), CIM_RegisteredProfile_locals, &CIM_RegisteredSpecification::static_meta_class, 1, &__meta_repository };
+    CIM_RegisteredProfile_features, 17, sizeof(CIM_RegisteredProfile), CIM_RegisteredProfile_locals, &CIM_RegisteredSpecification::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

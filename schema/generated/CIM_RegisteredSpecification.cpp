@@ -98,6 +98,6 @@ const bool CIM_RegisteredSpecification_locals[] = {
 
 const Meta_Class CIM_RegisteredSpecification::static_meta_class = {
     0, FLAG_CLASS, "CIM_RegisteredSpecification", nullptr, 0,
-    CIM_RegisteredSpecification_features, 13, sizeof(CIM_RegisteredSpecification), CIM_RegisteredSpecification_locals, &CIM_ManagedElement::static_meta_class, 1, &__meta_repository };
+    CIM_RegisteredSpecification_features, 13, sizeof(CIM_RegisteredSpecification), CIM_RegisteredSpecification_locals, &CIM_ManagedElement::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

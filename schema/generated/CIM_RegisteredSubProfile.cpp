@@ -76,6 +76,6 @@ const bool CIM_RegisteredSubProfile_locals[] = {
 
 const Meta_Class CIM_RegisteredSubProfile::static_meta_class = {
     0, FLAG_CLASS, "CIM_RegisteredSubProfile", nullptr, 0,
-    CIM_RegisteredSubProfile_features, 17, sizeof(CIM_RegisteredSubProfile), CIM_RegisteredSubProfile_locals, &CIM_RegisteredProfile::static_meta_class, 1, &__meta_repository };
+    CIM_RegisteredSubProfile_features, 17, sizeof(CIM_RegisteredSubProfile), CIM_RegisteredSubProfile_locals, &CIM_RegisteredProfile::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -144,6 +144,6 @@ const bool CIM_RemoteServiceAccessPoint_locals[] = {
 
 const Meta_Class CIM_RemoteServiceAccessPoint::static_meta_class = {
     0, FLAG_CLASS, "CIM_RemoteServiceAccessPoint", nullptr, 0,
-    CIM_RemoteServiceAccessPoint_features, 31, sizeof(CIM_RemoteServiceAccessPoint), CIM_RemoteServiceAccessPoint_locals, &CIM_ServiceAccessPoint::static_meta_class, 4, &__meta_repository };
+    CIM_RemoteServiceAccessPoint_features, 31, sizeof(CIM_RemoteServiceAccessPoint), CIM_RemoteServiceAccessPoint_locals, &CIM_ServiceAccessPoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -67,6 +67,6 @@ const bool CIM_SCSIInitiatorTargetLogicalUnitPath_locals[] = {
 
 const Meta_Class CIM_SCSIInitiatorTargetLogicalUnitPath::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_SCSIInitiatorTargetLogicalUnitPath", nullptr, 0,
-    CIM_SCSIInitiatorTargetLogicalUnitPath_features, 8, sizeof(CIM_SCSIInitiatorTargetLogicalUnitPath), CIM_SCSIInitiatorTargetLogicalUnitPath_locals, &CIM_InitiatorTargetLogicalUnitPath::static_meta_class, 3, &__meta_repository };
+    CIM_SCSIInitiatorTargetLogicalUnitPath_features, 8, sizeof(CIM_SCSIInitiatorTargetLogicalUnitPath), CIM_SCSIInitiatorTargetLogicalUnitPath_locals, &CIM_InitiatorTargetLogicalUnitPath::static_meta_class, 3, &schema_repository };
 
 }  // namespace CPTA

@@ -158,6 +158,6 @@ const bool CIM_SCSIProtocolEndpoint_locals[] = {
 
 const Meta_Class CIM_SCSIProtocolEndpoint::static_meta_class = {
     0, FLAG_CLASS, "CIM_SCSIProtocolEndpoint", nullptr, 0,
-    CIM_SCSIProtocolEndpoint_features, 36, sizeof(CIM_SCSIProtocolEndpoint), CIM_SCSIProtocolEndpoint_locals, &CIM_ProtocolEndpoint::static_meta_class, 4, &__meta_repository };
+    CIM_SCSIProtocolEndpoint_features, 36, sizeof(CIM_SCSIProtocolEndpoint), CIM_SCSIProtocolEndpoint_locals, &CIM_ProtocolEndpoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -228,6 +228,6 @@ const bool CIM_Service_locals[] = {
 
 const Meta_Class CIM_Service::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_Service", nullptr, 0,
-    CIM_Service_features, 35, sizeof(CIM_Service), CIM_Service_locals, &CIM_EnabledLogicalElement::static_meta_class, 4, &__meta_repository };
+    CIM_Service_features, 35, sizeof(CIM_Service), CIM_Service_locals, &CIM_EnabledLogicalElement::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

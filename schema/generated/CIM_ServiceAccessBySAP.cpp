@@ -44,6 +44,6 @@ const bool CIM_ServiceAccessBySAP_locals[] = {
 
 const Meta_Class CIM_ServiceAccessBySAP::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ServiceAccessBySAP", nullptr, 0,
-    CIM_ServiceAccessBySAP_features, 2, sizeof(CIM_ServiceAccessBySAP), CIM_ServiceAccessBySAP_locals, &CIM_Dependency::static_meta_class, 2, &__meta_repository };
+    CIM_ServiceAccessBySAP_features, 2, sizeof(CIM_ServiceAccessBySAP), CIM_ServiceAccessBySAP_locals, &CIM_Dependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

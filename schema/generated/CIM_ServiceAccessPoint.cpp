@@ -124,6 +124,6 @@ const bool CIM_ServiceAccessPoint_locals[] = {
 
 const Meta_Class CIM_ServiceAccessPoint::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_ServiceAccessPoint", nullptr, 0,
-    CIM_ServiceAccessPoint_features, 26, sizeof(CIM_ServiceAccessPoint), CIM_ServiceAccessPoint_locals, &CIM_EnabledLogicalElement::static_meta_class, 4, &__meta_repository };
+    CIM_ServiceAccessPoint_features, 26, sizeof(CIM_ServiceAccessPoint), CIM_ServiceAccessPoint_locals, &CIM_EnabledLogicalElement::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -43,6 +43,6 @@ const bool CIM_ServiceAvailableToElement_locals[] = {
 
 const Meta_Class CIM_ServiceAvailableToElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_ServiceAvailableToElement", nullptr, 0,
-    CIM_ServiceAvailableToElement_features, 2, sizeof(CIM_ServiceAvailableToElement), CIM_ServiceAvailableToElement_locals, nullptr, 2, &__meta_repository };
+    CIM_ServiceAvailableToElement_features, 2, sizeof(CIM_ServiceAvailableToElement), CIM_ServiceAvailableToElement_locals, nullptr, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -361,6 +361,6 @@ const bool CIM_Setting_locals[] = {
 
 const Meta_Class CIM_Setting::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_Setting", nullptr, 0,
-    CIM_Setting_features, 14, sizeof(CIM_Setting), CIM_Setting_locals, &CIM_ManagedElement::static_meta_class, 0, &__meta_repository };
+    CIM_Setting_features, 14, sizeof(CIM_Setting), CIM_Setting_locals, &CIM_ManagedElement::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

@@ -83,6 +83,6 @@ const bool CIM_SettingData_locals[] = {
 
 const Meta_Class CIM_SettingData::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_SettingData", nullptr, 0,
-    CIM_SettingData_features, 10, sizeof(CIM_SettingData), CIM_SettingData_locals, &CIM_ManagedElement::static_meta_class, 1, &__meta_repository };
+    CIM_SettingData_features, 10, sizeof(CIM_SettingData), CIM_SettingData_locals, &CIM_ManagedElement::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -237,6 +237,6 @@ const bool CIM_SoftwareIdentity_locals[] = {
 
 const Meta_Class CIM_SoftwareIdentity::static_meta_class = {
     0, FLAG_CLASS, "CIM_SoftwareIdentity", nullptr, 0,
-    CIM_SoftwareIdentity_features, 40, sizeof(CIM_SoftwareIdentity), CIM_SoftwareIdentity_locals, &CIM_LogicalElement::static_meta_class, 1, &__meta_repository };
+    CIM_SoftwareIdentity_features, 40, sizeof(CIM_SoftwareIdentity), CIM_SoftwareIdentity_locals, &CIM_LogicalElement::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -302,6 +302,6 @@ const bool CIM_SoftwareInstallationService_locals[] = {
 
 const Meta_Class CIM_SoftwareInstallationService::static_meta_class = {
     0, FLAG_CLASS, "CIM_SoftwareInstallationService", nullptr, 0,
-    CIM_SoftwareInstallationService_features, 39, sizeof(CIM_SoftwareInstallationService), CIM_SoftwareInstallationService_locals, &CIM_Service::static_meta_class, 4, &__meta_repository };
+    CIM_SoftwareInstallationService_features, 39, sizeof(CIM_SoftwareInstallationService), CIM_SoftwareInstallationService_locals, &CIM_Service::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -122,6 +122,6 @@ const bool CIM_SoftwareInstallationServiceCapabilities_locals[] = {
 
 const Meta_Class CIM_SoftwareInstallationServiceCapabilities::static_meta_class = {
     0, FLAG_CLASS, "CIM_SoftwareInstallationServiceCapabilities", nullptr, 0,
-    CIM_SoftwareInstallationServiceCapabilities_features, 18, sizeof(CIM_SoftwareInstallationServiceCapabilities), CIM_SoftwareInstallationServiceCapabilities_locals, &CIM_Capabilities::static_meta_class, 1, &__meta_repository };
+    CIM_SoftwareInstallationServiceCapabilities_features, 18, sizeof(CIM_SoftwareInstallationServiceCapabilities), CIM_SoftwareInstallationServiceCapabilities_locals, &CIM_Capabilities::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

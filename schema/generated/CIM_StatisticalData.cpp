@@ -106,6 +106,6 @@ const bool CIM_StatisticalData_locals[] = {
 
 const Meta_Class CIM_StatisticalData::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_StatisticalData", nullptr, 0,
-    CIM_StatisticalData_features, 11, sizeof(CIM_StatisticalData), CIM_StatisticalData_locals, &CIM_ManagedElement::static_meta_class, 1, &__meta_repository };
+    CIM_StatisticalData_features, 11, sizeof(CIM_StatisticalData), CIM_StatisticalData_locals, &CIM_ManagedElement::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -357,6 +357,6 @@ const bool CIM_StorageExtent_locals[] = {
 
 const Meta_Class CIM_StorageExtent::static_meta_class = {
     0, FLAG_CLASS, "CIM_StorageExtent", nullptr, 0,
-    CIM_StorageExtent_features, 78, sizeof(CIM_StorageExtent), CIM_StorageExtent_locals, &CIM_LogicalDevice::static_meta_class, 4, &__meta_repository };
+    CIM_StorageExtent_features, 78, sizeof(CIM_StorageExtent), CIM_StorageExtent_locals, &CIM_LogicalDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

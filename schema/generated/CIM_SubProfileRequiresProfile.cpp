@@ -44,6 +44,6 @@ const bool CIM_SubProfileRequiresProfile_locals[] = {
 
 const Meta_Class CIM_SubProfileRequiresProfile::static_meta_class = {
     0, FLAG_ASSOCIATION, "CIM_SubProfileRequiresProfile", nullptr, 0,
-    CIM_SubProfileRequiresProfile_features, 2, sizeof(CIM_SubProfileRequiresProfile), CIM_SubProfileRequiresProfile_locals, &CIM_ReferencedProfile::static_meta_class, 2, &__meta_repository };
+    CIM_SubProfileRequiresProfile_features, 2, sizeof(CIM_SubProfileRequiresProfile), CIM_SubProfileRequiresProfile_locals, &CIM_ReferencedProfile::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

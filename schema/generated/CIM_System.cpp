@@ -148,6 +148,6 @@ const bool CIM_System_locals[] = {
 
 const Meta_Class CIM_System::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_System", nullptr, 0,
-    CIM_System_features, 30, sizeof(CIM_System), CIM_System_locals, &CIM_EnabledLogicalElement::static_meta_class, 2, &__meta_repository };
+    CIM_System_features, 30, sizeof(CIM_System), CIM_System_locals, &CIM_EnabledLogicalElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool CIM_SystemComponent_locals[] = {
 
 const Meta_Class CIM_SystemComponent::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION, "CIM_SystemComponent", nullptr, 0,
-    CIM_SystemComponent_features, 2, sizeof(CIM_SystemComponent), CIM_SystemComponent_locals, &CIM_Component::static_meta_class, 2, &__meta_repository };
+    CIM_SystemComponent_features, 2, sizeof(CIM_SystemComponent), CIM_SystemComponent_locals, &CIM_Component::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool CIM_SystemDevice_locals[] = {
 
 const Meta_Class CIM_SystemDevice::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "CIM_SystemDevice", nullptr, 0,
-    CIM_SystemDevice_features, 2, sizeof(CIM_SystemDevice), CIM_SystemDevice_locals, &CIM_SystemComponent::static_meta_class, 2, &__meta_repository };
+    CIM_SystemDevice_features, 2, sizeof(CIM_SystemDevice), CIM_SystemDevice_locals, &CIM_SystemComponent::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

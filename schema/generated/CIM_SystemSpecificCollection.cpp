@@ -50,6 +50,6 @@ const bool CIM_SystemSpecificCollection_locals[] = {
 
 const Meta_Class CIM_SystemSpecificCollection::static_meta_class = {
     0, FLAG_CLASS, "CIM_SystemSpecificCollection", nullptr, 0,
-    CIM_SystemSpecificCollection_features, 5, sizeof(CIM_SystemSpecificCollection), CIM_SystemSpecificCollection_locals, &CIM_Collection::static_meta_class, 1, &__meta_repository };
+    CIM_SystemSpecificCollection_features, 5, sizeof(CIM_SystemSpecificCollection), CIM_SystemSpecificCollection_locals, &CIM_Collection::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

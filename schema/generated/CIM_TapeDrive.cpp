@@ -266,6 +266,6 @@ const bool CIM_TapeDrive_locals[] = {
 
 const Meta_Class CIM_TapeDrive::static_meta_class = {
     0, FLAG_CLASS, "CIM_TapeDrive", nullptr, 0,
-    CIM_TapeDrive_features, 76, sizeof(CIM_TapeDrive), CIM_TapeDrive_locals, &CIM_MediaAccessDevice::static_meta_class, 4, &__meta_repository };
+    CIM_TapeDrive_features, 76, sizeof(CIM_TapeDrive), CIM_TapeDrive_locals, &CIM_MediaAccessDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

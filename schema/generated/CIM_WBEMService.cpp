@@ -131,6 +131,6 @@ const bool CIM_WBEMService_locals[] = {
 
 const Meta_Class CIM_WBEMService::static_meta_class = {
     0, FLAG_CLASS | FLAG_ABSTRACT, "CIM_WBEMService", nullptr, 0,
-    CIM_WBEMService_features, 35, sizeof(CIM_WBEMService), CIM_WBEMService_locals, &CIM_Service::static_meta_class, 4, &__meta_repository };
+    CIM_WBEMService_features, 35, sizeof(CIM_WBEMService), CIM_WBEMService_locals, &CIM_Service::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

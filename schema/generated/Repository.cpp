@@ -367,6 +367,6 @@ const Meta_Class* const meta_classes[] = {
 
 }  // namespace
 
-const Meta_Repository __meta_repository = { meta_classes, 178 };
+const Meta_Repository schema_repository = { meta_classes, 178 };
 
 }  // namespace CPTA

@@ -54,6 +54,6 @@ const bool TAVRIN_AdapterElementSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_AdapterElementSoftwareIdentity::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_AdapterElementSoftwareIdentity", nullptr, 0,
-    TAVRIN_AdapterElementSoftwareIdentity_features, 5, sizeof(TAVRIN_AdapterElementSoftwareIdentity), TAVRIN_AdapterElementSoftwareIdentity_locals, &CIM_ElementSoftwareIdentity::static_meta_class, 2, &__meta_repository };
+    TAVRIN_AdapterElementSoftwareIdentity_features, 5, sizeof(TAVRIN_AdapterElementSoftwareIdentity), TAVRIN_AdapterElementSoftwareIdentity_locals, &CIM_ElementSoftwareIdentity::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -160,6 +160,6 @@ const bool TAVRIN_AdapterSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_AdapterSoftwareIdentity::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_AdapterSoftwareIdentity", nullptr, 0,
-    TAVRIN_AdapterSoftwareIdentity_features, 40, sizeof(TAVRIN_AdapterSoftwareIdentity), TAVRIN_AdapterSoftwareIdentity_locals, &CIM_SoftwareIdentity::static_meta_class, 1, &__meta_repository };
+    TAVRIN_AdapterSoftwareIdentity_features, 40, sizeof(TAVRIN_AdapterSoftwareIdentity), TAVRIN_AdapterSoftwareIdentity_locals, &CIM_SoftwareIdentity::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

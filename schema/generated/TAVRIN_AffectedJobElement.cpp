@@ -51,6 +51,6 @@ const bool TAVRIN_AffectedJobElement_locals[] = {
 
 const Meta_Class TAVRIN_AffectedJobElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_AffectedJobElement", nullptr, 0,
-    TAVRIN_AffectedJobElement_features, 4, sizeof(TAVRIN_AffectedJobElement), TAVRIN_AffectedJobElement_locals, &CIM_AffectedJobElement::static_meta_class, 2, &__meta_repository };
+    TAVRIN_AffectedJobElement_features, 4, sizeof(TAVRIN_AffectedJobElement), TAVRIN_AffectedJobElement_locals, &CIM_AffectedJobElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -62,6 +62,6 @@ const bool TAVRIN_AgentService_locals[] = {
 
 const Meta_Class TAVRIN_AgentService::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_AgentService", nullptr, 0,
-    TAVRIN_AgentService_features, 2, sizeof(TAVRIN_AgentService), TAVRIN_AgentService_locals, nullptr, 1, &__meta_repository };
+    TAVRIN_AgentService_features, 2, sizeof(TAVRIN_AgentService), TAVRIN_AgentService_locals, nullptr, 1, &schema_repository };
 
 }  // namespace CPTA

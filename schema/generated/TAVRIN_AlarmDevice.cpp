@@ -209,6 +209,6 @@ const bool TAVRIN_AlarmDevice_locals[] = {
 
 const Meta_Class TAVRIN_AlarmDevice::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_AlarmDevice", nullptr, 0,
-    TAVRIN_AlarmDevice_features, 59, sizeof(TAVRIN_AlarmDevice), TAVRIN_AlarmDevice_locals, &CIM_AlarmDevice::static_meta_class, 4, &__meta_repository };
+    TAVRIN_AlarmDevice_features, 59, sizeof(TAVRIN_AlarmDevice), TAVRIN_AlarmDevice_locals, &CIM_AlarmDevice::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -195,6 +195,6 @@ const bool TAVRIN_AlertIndication_locals[] = {
 
 const Meta_Class TAVRIN_AlertIndication::static_meta_class = {
     0, FLAG_CLASS | FLAG_INDICATION, "TAVRIN_AlertIndication", nullptr, 0,
-    TAVRIN_AlertIndication_features, 28, sizeof(TAVRIN_AlertIndication), TAVRIN_AlertIndication_locals, &CIM_AlertIndication::static_meta_class, 0, &__meta_repository };
+    TAVRIN_AlertIndication_features, 28, sizeof(TAVRIN_AlertIndication), TAVRIN_AlertIndication_locals, &CIM_AlertIndication::static_meta_class, 0, &schema_repository };
 
 }  // namespace CPTA

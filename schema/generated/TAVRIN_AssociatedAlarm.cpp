@@ -44,6 +44,6 @@ const bool TAVRIN_AssociatedAlarm_locals[] = {
 
 const Meta_Class TAVRIN_AssociatedAlarm::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_AssociatedAlarm", nullptr, 0,
-    TAVRIN_AssociatedAlarm_features, 2, sizeof(TAVRIN_AssociatedAlarm), TAVRIN_AssociatedAlarm_locals, &CIM_AssociatedAlarm::static_meta_class, 2, &__meta_repository };
+    TAVRIN_AssociatedAlarm_features, 2, sizeof(TAVRIN_AssociatedAlarm), TAVRIN_AssociatedAlarm_locals, &CIM_AssociatedAlarm::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

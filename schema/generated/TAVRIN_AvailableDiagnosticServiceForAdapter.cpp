@@ -54,6 +54,6 @@ const bool TAVRIN_AvailableDiagnosticServiceForAdapter_locals[] = {
 
 const Meta_Class TAVRIN_AvailableDiagnosticServiceForAdapter::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_AvailableDiagnosticServiceForAdapter", nullptr, 0,
-    TAVRIN_AvailableDiagnosticServiceForAdapter_features, 5, sizeof(TAVRIN_AvailableDiagnosticServiceForAdapter), TAVRIN_AvailableDiagnosticServiceForAdapter_locals, &CIM_AvailableDiagnosticService::static_meta_class, 2, &__meta_repository };
+    TAVRIN_AvailableDiagnosticServiceForAdapter_features, 5, sizeof(TAVRIN_AvailableDiagnosticServiceForAdapter), TAVRIN_AvailableDiagnosticServiceForAdapter_locals, &CIM_AvailableDiagnosticService::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

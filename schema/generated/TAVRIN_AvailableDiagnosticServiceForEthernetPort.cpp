@@ -54,6 +54,6 @@ const bool TAVRIN_AvailableDiagnosticServiceForEthernetPort_locals[] = {
 
 const Meta_Class TAVRIN_AvailableDiagnosticServiceForEthernetPort::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_AvailableDiagnosticServiceForEthernetPort", nullptr, 0,
-    TAVRIN_AvailableDiagnosticServiceForEthernetPort_features, 5, sizeof(TAVRIN_AvailableDiagnosticServiceForEthernetPort), TAVRIN_AvailableDiagnosticServiceForEthernetPort_locals, &CIM_AvailableDiagnosticService::static_meta_class, 2, &__meta_repository };
+    TAVRIN_AvailableDiagnosticServiceForEthernetPort_features, 5, sizeof(TAVRIN_AvailableDiagnosticServiceForEthernetPort), TAVRIN_AvailableDiagnosticServiceForEthernetPort_locals, &CIM_AvailableDiagnosticService::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

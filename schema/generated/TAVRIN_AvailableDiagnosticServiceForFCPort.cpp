@@ -54,6 +54,6 @@ const bool TAVRIN_AvailableDiagnosticServiceForFCPort_locals[] = {
 
 const Meta_Class TAVRIN_AvailableDiagnosticServiceForFCPort::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_AvailableDiagnosticServiceForFCPort", nullptr, 0,
-    TAVRIN_AvailableDiagnosticServiceForFCPort_features, 5, sizeof(TAVRIN_AvailableDiagnosticServiceForFCPort), TAVRIN_AvailableDiagnosticServiceForFCPort_locals, &CIM_AvailableDiagnosticService::static_meta_class, 2, &__meta_repository };
+    TAVRIN_AvailableDiagnosticServiceForFCPort_features, 5, sizeof(TAVRIN_AvailableDiagnosticServiceForFCPort), TAVRIN_AvailableDiagnosticServiceForFCPort_locals, &CIM_AvailableDiagnosticService::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

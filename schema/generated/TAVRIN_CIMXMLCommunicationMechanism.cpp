@@ -183,6 +183,6 @@ const bool TAVRIN_CIMXMLCommunicationMechanism_locals[] = {
 
 const Meta_Class TAVRIN_CIMXMLCommunicationMechanism::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_CIMXMLCommunicationMechanism", nullptr, 0,
-    TAVRIN_CIMXMLCommunicationMechanism_features, 43, sizeof(TAVRIN_CIMXMLCommunicationMechanism), TAVRIN_CIMXMLCommunicationMechanism_locals, &CIM_CIMXMLCommunicationMechanism::static_meta_class, 4, &__meta_repository };
+    TAVRIN_CIMXMLCommunicationMechanism_features, 43, sizeof(TAVRIN_CIMXMLCommunicationMechanism), TAVRIN_CIMXMLCommunicationMechanism_locals, &CIM_CIMXMLCommunicationMechanism::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_CommMechHostedAccessPoint_locals[] = {
 
 const Meta_Class TAVRIN_CommMechHostedAccessPoint::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_CommMechHostedAccessPoint", nullptr, 0,
-    TAVRIN_CommMechHostedAccessPoint_features, 2, sizeof(TAVRIN_CommMechHostedAccessPoint), TAVRIN_CommMechHostedAccessPoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &__meta_repository };
+    TAVRIN_CommMechHostedAccessPoint_features, 2, sizeof(TAVRIN_CommMechHostedAccessPoint), TAVRIN_CommMechHostedAccessPoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

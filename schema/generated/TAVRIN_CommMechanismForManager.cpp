@@ -44,6 +44,6 @@ const bool TAVRIN_CommMechanismForManager_locals[] = {
 
 const Meta_Class TAVRIN_CommMechanismForManager::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_CommMechanismForManager", nullptr, 0,
-    TAVRIN_CommMechanismForManager_features, 2, sizeof(TAVRIN_CommMechanismForManager), TAVRIN_CommMechanismForManager_locals, &CIM_CommMechanismForManager::static_meta_class, 2, &__meta_repository };
+    TAVRIN_CommMechanismForManager_features, 2, sizeof(TAVRIN_CommMechanismForManager), TAVRIN_CommMechanismForManager_locals, &CIM_CommMechanismForManager::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_CompletionRecordAppliesToElement_locals[] = {
 
 const Meta_Class TAVRIN_CompletionRecordAppliesToElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_CompletionRecordAppliesToElement", nullptr, 0,
-    TAVRIN_CompletionRecordAppliesToElement_features, 2, sizeof(TAVRIN_CompletionRecordAppliesToElement), TAVRIN_CompletionRecordAppliesToElement_locals, &CIM_RecordAppliesToElement::static_meta_class, 2, &__meta_repository };
+    TAVRIN_CompletionRecordAppliesToElement_features, 2, sizeof(TAVRIN_CompletionRecordAppliesToElement), TAVRIN_CompletionRecordAppliesToElement_locals, &CIM_RecordAppliesToElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

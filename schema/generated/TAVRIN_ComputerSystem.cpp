@@ -146,6 +146,6 @@ const bool TAVRIN_ComputerSystem_locals[] = {
 
 const Meta_Class TAVRIN_ComputerSystem::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_ComputerSystem", nullptr, 0,
-    TAVRIN_ComputerSystem_features, 35, sizeof(TAVRIN_ComputerSystem), TAVRIN_ComputerSystem_locals, &CIM_ComputerSystem::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ComputerSystem_features, 35, sizeof(TAVRIN_ComputerSystem), TAVRIN_ComputerSystem_locals, &CIM_ComputerSystem::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

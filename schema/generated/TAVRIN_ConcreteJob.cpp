@@ -182,6 +182,6 @@ const bool TAVRIN_ConcreteJob_locals[] = {
 
 const Meta_Class TAVRIN_ConcreteJob::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_ConcreteJob", nullptr, 0,
-    TAVRIN_ConcreteJob_features, 46, sizeof(TAVRIN_ConcreteJob), TAVRIN_ConcreteJob_locals, &CIM_ConcreteJob::static_meta_class, 1, &__meta_repository };
+    TAVRIN_ConcreteJob_features, 46, sizeof(TAVRIN_ConcreteJob), TAVRIN_ConcreteJob_locals, &CIM_ConcreteJob::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -74,6 +74,6 @@ const bool TAVRIN_ControlledBy_locals[] = {
 
 const Meta_Class TAVRIN_ControlledBy::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_ControlledBy", nullptr, 0,
-    TAVRIN_ControlledBy_features, 11, sizeof(TAVRIN_ControlledBy), TAVRIN_ControlledBy_locals, &CIM_ControlledBy::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ControlledBy_features, 11, sizeof(TAVRIN_ControlledBy), TAVRIN_ControlledBy_locals, &CIM_ControlledBy::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_DeviceSAPImplementation_locals[] = {
 
 const Meta_Class TAVRIN_DeviceSAPImplementation::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_DeviceSAPImplementation", nullptr, 0,
-    TAVRIN_DeviceSAPImplementation_features, 2, sizeof(TAVRIN_DeviceSAPImplementation), TAVRIN_DeviceSAPImplementation_locals, &CIM_DeviceSAPImplementation::static_meta_class, 2, &__meta_repository };
+    TAVRIN_DeviceSAPImplementation_features, 2, sizeof(TAVRIN_DeviceSAPImplementation), TAVRIN_DeviceSAPImplementation_locals, &CIM_DeviceSAPImplementation::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

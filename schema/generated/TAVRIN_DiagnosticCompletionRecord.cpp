@@ -103,6 +103,6 @@ const bool TAVRIN_DiagnosticCompletionRecord_locals[] = {
 
 const Meta_Class TAVRIN_DiagnosticCompletionRecord::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_DiagnosticCompletionRecord", nullptr, 0,
-    TAVRIN_DiagnosticCompletionRecord_features, 21, sizeof(TAVRIN_DiagnosticCompletionRecord), TAVRIN_DiagnosticCompletionRecord_locals, &CIM_DiagnosticCompletionRecord::static_meta_class, 1, &__meta_repository };
+    TAVRIN_DiagnosticCompletionRecord_features, 21, sizeof(TAVRIN_DiagnosticCompletionRecord), TAVRIN_DiagnosticCompletionRecord_locals, &CIM_DiagnosticCompletionRecord::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

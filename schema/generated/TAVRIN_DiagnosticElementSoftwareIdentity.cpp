@@ -54,6 +54,6 @@ const bool TAVRIN_DiagnosticElementSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_DiagnosticElementSoftwareIdentity::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_DiagnosticElementSoftwareIdentity", nullptr, 0,
-    TAVRIN_DiagnosticElementSoftwareIdentity_features, 5, sizeof(TAVRIN_DiagnosticElementSoftwareIdentity), TAVRIN_DiagnosticElementSoftwareIdentity_locals, &CIM_ElementSoftwareIdentity::static_meta_class, 2, &__meta_repository };
+    TAVRIN_DiagnosticElementSoftwareIdentity_features, 5, sizeof(TAVRIN_DiagnosticElementSoftwareIdentity), TAVRIN_DiagnosticElementSoftwareIdentity_locals, &CIM_ElementSoftwareIdentity::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -96,6 +96,6 @@ const bool TAVRIN_DiagnosticServiceRecord_locals[] = {
 
 const Meta_Class TAVRIN_DiagnosticServiceRecord::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_DiagnosticServiceRecord", nullptr, 0,
-    TAVRIN_DiagnosticServiceRecord_features, 19, sizeof(TAVRIN_DiagnosticServiceRecord), TAVRIN_DiagnosticServiceRecord_locals, &CIM_DiagnosticServiceRecord::static_meta_class, 1, &__meta_repository };
+    TAVRIN_DiagnosticServiceRecord_features, 19, sizeof(TAVRIN_DiagnosticServiceRecord), TAVRIN_DiagnosticServiceRecord_locals, &CIM_DiagnosticServiceRecord::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -160,6 +160,6 @@ const bool TAVRIN_DiagnosticSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_DiagnosticSoftwareIdentity::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_DiagnosticSoftwareIdentity", nullptr, 0,
-    TAVRIN_DiagnosticSoftwareIdentity_features, 40, sizeof(TAVRIN_DiagnosticSoftwareIdentity), TAVRIN_DiagnosticSoftwareIdentity_locals, &CIM_SoftwareIdentity::static_meta_class, 1, &__meta_repository };
+    TAVRIN_DiagnosticSoftwareIdentity_features, 40, sizeof(TAVRIN_DiagnosticSoftwareIdentity), TAVRIN_DiagnosticSoftwareIdentity_locals, &CIM_SoftwareIdentity::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -176,6 +176,6 @@ const bool TAVRIN_DiagnosticTest_locals[] = {
 
 const Meta_Class TAVRIN_DiagnosticTest::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_DiagnosticTest", nullptr, 0,
-    TAVRIN_DiagnosticTest_features, 47, sizeof(TAVRIN_DiagnosticTest), TAVRIN_DiagnosticTest_locals, &CIM_DiagnosticTest::static_meta_class, 4, &__meta_repository };
+    TAVRIN_DiagnosticTest_features, 47, sizeof(TAVRIN_DiagnosticTest), TAVRIN_DiagnosticTest_locals, &CIM_DiagnosticTest::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

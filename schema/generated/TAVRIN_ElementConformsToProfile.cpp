@@ -44,6 +44,6 @@ const bool TAVRIN_ElementConformsToProfile_locals[] = {
 
 const Meta_Class TAVRIN_ElementConformsToProfile::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_ElementConformsToProfile", nullptr, 0,
-    TAVRIN_ElementConformsToProfile_features, 2, sizeof(TAVRIN_ElementConformsToProfile), TAVRIN_ElementConformsToProfile_locals, &CIM_ElementConformsToProfile::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ElementConformsToProfile_features, 2, sizeof(TAVRIN_ElementConformsToProfile), TAVRIN_ElementConformsToProfile_locals, &CIM_ElementConformsToProfile::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_ElementStatisticalData_locals[] = {
 
 const Meta_Class TAVRIN_ElementStatisticalData::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_ElementStatisticalData", nullptr, 0,
-    TAVRIN_ElementStatisticalData_features, 2, sizeof(TAVRIN_ElementStatisticalData), TAVRIN_ElementStatisticalData_locals, &CIM_ElementStatisticalData::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ElementStatisticalData_features, 2, sizeof(TAVRIN_ElementStatisticalData), TAVRIN_ElementStatisticalData_locals, &CIM_ElementStatisticalData::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -177,6 +177,6 @@ const bool TAVRIN_EthLoopbackDiagnosticTest_locals[] = {
 
 const Meta_Class TAVRIN_EthLoopbackDiagnosticTest::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_EthLoopbackDiagnosticTest", nullptr, 0,
-    TAVRIN_EthLoopbackDiagnosticTest_features, 47, sizeof(TAVRIN_EthLoopbackDiagnosticTest), TAVRIN_EthLoopbackDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &__meta_repository };
+    TAVRIN_EthLoopbackDiagnosticTest_features, 47, sizeof(TAVRIN_EthLoopbackDiagnosticTest), TAVRIN_EthLoopbackDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

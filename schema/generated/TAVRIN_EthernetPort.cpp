@@ -257,6 +257,6 @@ const bool TAVRIN_EthernetPort_locals[] = {
 
 const Meta_Class TAVRIN_EthernetPort::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_EthernetPort", nullptr, 0,
-    TAVRIN_EthernetPort_features, 72, sizeof(TAVRIN_EthernetPort), TAVRIN_EthernetPort_locals, &CIM_EthernetPort::static_meta_class, 4, &__meta_repository };
+    TAVRIN_EthernetPort_features, 72, sizeof(TAVRIN_EthernetPort), TAVRIN_EthernetPort_locals, &CIM_EthernetPort::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -74,6 +74,6 @@ const bool TAVRIN_EthernetPortControlledBy_locals[] = {
 
 const Meta_Class TAVRIN_EthernetPortControlledBy::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_EthernetPortControlledBy", nullptr, 0,
-    TAVRIN_EthernetPortControlledBy_features, 11, sizeof(TAVRIN_EthernetPortControlledBy), TAVRIN_EthernetPortControlledBy_locals, &CIM_ControlledBy::static_meta_class, 2, &__meta_repository };
+    TAVRIN_EthernetPortControlledBy_features, 11, sizeof(TAVRIN_EthernetPortControlledBy), TAVRIN_EthernetPortControlledBy_locals, &CIM_ControlledBy::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

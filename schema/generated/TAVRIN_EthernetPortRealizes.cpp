@@ -44,6 +44,6 @@ const bool TAVRIN_EthernetPortRealizes_locals[] = {
 
 const Meta_Class TAVRIN_EthernetPortRealizes::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_EthernetPortRealizes", nullptr, 0,
-    TAVRIN_EthernetPortRealizes_features, 2, sizeof(TAVRIN_EthernetPortRealizes), TAVRIN_EthernetPortRealizes_locals, &CIM_Realizes::static_meta_class, 2, &__meta_repository };
+    TAVRIN_EthernetPortRealizes_features, 2, sizeof(TAVRIN_EthernetPortRealizes), TAVRIN_EthernetPortRealizes_locals, &CIM_Realizes::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

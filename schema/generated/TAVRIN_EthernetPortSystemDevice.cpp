@@ -44,6 +44,6 @@ const bool TAVRIN_EthernetPortSystemDevice_locals[] = {
 
 const Meta_Class TAVRIN_EthernetPortSystemDevice::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "TAVRIN_EthernetPortSystemDevice", nullptr, 0,
-    TAVRIN_EthernetPortSystemDevice_features, 2, sizeof(TAVRIN_EthernetPortSystemDevice), TAVRIN_EthernetPortSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &__meta_repository };
+    TAVRIN_EthernetPortSystemDevice_features, 2, sizeof(TAVRIN_EthernetPortSystemDevice), TAVRIN_EthernetPortSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -261,6 +261,6 @@ const bool TAVRIN_FCPort_locals[] = {
 
 const Meta_Class TAVRIN_FCPort::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_FCPort", nullptr, 0,
-    TAVRIN_FCPort_features, 73, sizeof(TAVRIN_FCPort), TAVRIN_FCPort_locals, &CIM_FCPort::static_meta_class, 4, &__meta_repository };
+    TAVRIN_FCPort_features, 73, sizeof(TAVRIN_FCPort), TAVRIN_FCPort_locals, &CIM_FCPort::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -213,6 +213,6 @@ const bool TAVRIN_FCPortStatistics_locals[] = {
 
 const Meta_Class TAVRIN_FCPortStatistics::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_FCPortStatistics", nullptr, 0,
-    TAVRIN_FCPortStatistics_features, 57, sizeof(TAVRIN_FCPortStatistics), TAVRIN_FCPortStatistics_locals, &CIM_FCPortStatistics::static_meta_class, 1, &__meta_repository };
+    TAVRIN_FCPortStatistics_features, 57, sizeof(TAVRIN_FCPortStatistics), TAVRIN_FCPortStatistics_locals, &CIM_FCPortStatistics::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_FCPortSystemDevice_locals[] = {
 
 const Meta_Class TAVRIN_FCPortSystemDevice::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "TAVRIN_FCPortSystemDevice", nullptr, 0,
-    TAVRIN_FCPortSystemDevice_features, 2, sizeof(TAVRIN_FCPortSystemDevice), TAVRIN_FCPortSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &__meta_repository };
+    TAVRIN_FCPortSystemDevice_features, 2, sizeof(TAVRIN_FCPortSystemDevice), TAVRIN_FCPortSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

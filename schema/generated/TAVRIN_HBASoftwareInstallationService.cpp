@@ -152,6 +152,6 @@ const bool TAVRIN_HBASoftwareInstallationService_locals[] = {
 
 const Meta_Class TAVRIN_HBASoftwareInstallationService::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_HBASoftwareInstallationService", nullptr, 0,
-    TAVRIN_HBASoftwareInstallationService_features, 39, sizeof(TAVRIN_HBASoftwareInstallationService), TAVRIN_HBASoftwareInstallationService_locals, &CIM_SoftwareInstallationService::static_meta_class, 4, &__meta_repository };
+    TAVRIN_HBASoftwareInstallationService_features, 39, sizeof(TAVRIN_HBASoftwareInstallationService), TAVRIN_HBASoftwareInstallationService_locals, &CIM_SoftwareInstallationService::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -90,6 +90,6 @@ const bool TAVRIN_HBASoftwareInstallationServiceCapabilities_locals[] = {
 
 const Meta_Class TAVRIN_HBASoftwareInstallationServiceCapabilities::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_HBASoftwareInstallationServiceCapabilities", nullptr, 0,
-    TAVRIN_HBASoftwareInstallationServiceCapabilities_features, 18, sizeof(TAVRIN_HBASoftwareInstallationServiceCapabilities), TAVRIN_HBASoftwareInstallationServiceCapabilities_locals, &CIM_SoftwareInstallationServiceCapabilities::static_meta_class, 1, &__meta_repository };
+    TAVRIN_HBASoftwareInstallationServiceCapabilities_features, 18, sizeof(TAVRIN_HBASoftwareInstallationServiceCapabilities), TAVRIN_HBASoftwareInstallationServiceCapabilities_locals, &CIM_SoftwareInstallationServiceCapabilities::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -48,6 +48,6 @@ const bool TAVRIN_HBASoftwareInstallationServiceElementCapabilities_locals[] = {
 
 const Meta_Class TAVRIN_HBASoftwareInstallationServiceElementCapabilities::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_HBASoftwareInstallationServiceElementCapabilities", nullptr, 0,
-    TAVRIN_HBASoftwareInstallationServiceElementCapabilities_features, 3, sizeof(TAVRIN_HBASoftwareInstallationServiceElementCapabilities), TAVRIN_HBASoftwareInstallationServiceElementCapabilities_locals, &CIM_ElementCapabilities::static_meta_class, 2, &__meta_repository };
+    TAVRIN_HBASoftwareInstallationServiceElementCapabilities_features, 3, sizeof(TAVRIN_HBASoftwareInstallationServiceElementCapabilities), TAVRIN_HBASoftwareInstallationServiceElementCapabilities_locals, &CIM_ElementCapabilities::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_HBASoftwareInstallationServiceHostedService_locals[] = {
 
 const Meta_Class TAVRIN_HBASoftwareInstallationServiceHostedService::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_HBASoftwareInstallationServiceHostedService", nullptr, 0,
-    TAVRIN_HBASoftwareInstallationServiceHostedService_features, 2, sizeof(TAVRIN_HBASoftwareInstallationServiceHostedService), TAVRIN_HBASoftwareInstallationServiceHostedService_locals, &CIM_HostedService::static_meta_class, 2, &__meta_repository };
+    TAVRIN_HBASoftwareInstallationServiceHostedService_features, 2, sizeof(TAVRIN_HBASoftwareInstallationServiceHostedService), TAVRIN_HBASoftwareInstallationServiceHostedService_locals, &CIM_HostedService::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_HostedAccessPoint_locals[] = {
 
 const Meta_Class TAVRIN_HostedAccessPoint::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_HostedAccessPoint", nullptr, 0,
-    TAVRIN_HostedAccessPoint_features, 2, sizeof(TAVRIN_HostedAccessPoint), TAVRIN_HostedAccessPoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &__meta_repository };
+    TAVRIN_HostedAccessPoint_features, 2, sizeof(TAVRIN_HostedAccessPoint), TAVRIN_HostedAccessPoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_HostedCollection_locals[] = {
 
 const Meta_Class TAVRIN_HostedCollection::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_HostedCollection", nullptr, 0,
-    TAVRIN_HostedCollection_features, 2, sizeof(TAVRIN_HostedCollection), TAVRIN_HostedCollection_locals, &CIM_HostedCollection::static_meta_class, 2, &__meta_repository };
+    TAVRIN_HostedCollection_features, 2, sizeof(TAVRIN_HostedCollection), TAVRIN_HostedCollection_locals, &CIM_HostedCollection::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

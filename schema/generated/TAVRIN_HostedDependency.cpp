@@ -43,6 +43,6 @@ const bool TAVRIN_HostedDependency_locals[] = {
 
 const Meta_Class TAVRIN_HostedDependency::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_HostedDependency", nullptr, 0,
-    TAVRIN_HostedDependency_features, 2, sizeof(TAVRIN_HostedDependency), TAVRIN_HostedDependency_locals, &CIM_HostedDependency::static_meta_class, 2, &__meta_repository };
+    TAVRIN_HostedDependency_features, 2, sizeof(TAVRIN_HostedDependency), TAVRIN_HostedDependency_locals, &CIM_HostedDependency::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

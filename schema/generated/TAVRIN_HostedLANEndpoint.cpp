@@ -44,6 +44,6 @@ const bool TAVRIN_HostedLANEndpoint_locals[] = {
 
 const Meta_Class TAVRIN_HostedLANEndpoint::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_HostedLANEndpoint", nullptr, 0,
-    TAVRIN_HostedLANEndpoint_features, 2, sizeof(TAVRIN_HostedLANEndpoint), TAVRIN_HostedLANEndpoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &__meta_repository };
+    TAVRIN_HostedLANEndpoint_features, 2, sizeof(TAVRIN_HostedLANEndpoint), TAVRIN_HostedLANEndpoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

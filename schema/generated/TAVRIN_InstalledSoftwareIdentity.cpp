@@ -44,6 +44,6 @@ const bool TAVRIN_InstalledSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_InstalledSoftwareIdentity::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_InstalledSoftwareIdentity", nullptr, 0,
-    TAVRIN_InstalledSoftwareIdentity_features, 2, sizeof(TAVRIN_InstalledSoftwareIdentity), TAVRIN_InstalledSoftwareIdentity_locals, &CIM_InstalledSoftwareIdentity::static_meta_class, 2, &__meta_repository };
+    TAVRIN_InstalledSoftwareIdentity_features, 2, sizeof(TAVRIN_InstalledSoftwareIdentity), TAVRIN_InstalledSoftwareIdentity_locals, &CIM_InstalledSoftwareIdentity::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -168,6 +168,6 @@ const bool TAVRIN_LANEndpoint_locals[] = {
 
 const Meta_Class TAVRIN_LANEndpoint::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_LANEndpoint", nullptr, 0,
-    TAVRIN_LANEndpoint_features, 39, sizeof(TAVRIN_LANEndpoint), TAVRIN_LANEndpoint_locals, &CIM_LANEndpoint::static_meta_class, 4, &__meta_repository };
+    TAVRIN_LANEndpoint_features, 39, sizeof(TAVRIN_LANEndpoint), TAVRIN_LANEndpoint_locals, &CIM_LANEndpoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_LANEndpointDeviceSAPImplementation_locals[] = {
 
 const Meta_Class TAVRIN_LANEndpointDeviceSAPImplementation::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_LANEndpointDeviceSAPImplementation", nullptr, 0,
-    TAVRIN_LANEndpointDeviceSAPImplementation_features, 2, sizeof(TAVRIN_LANEndpointDeviceSAPImplementation), TAVRIN_LANEndpointDeviceSAPImplementation_locals, &CIM_DeviceSAPImplementation::static_meta_class, 2, &__meta_repository };
+    TAVRIN_LANEndpointDeviceSAPImplementation_features, 2, sizeof(TAVRIN_LANEndpointDeviceSAPImplementation), TAVRIN_LANEndpointDeviceSAPImplementation_locals, &CIM_DeviceSAPImplementation::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

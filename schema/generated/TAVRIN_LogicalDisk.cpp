@@ -289,6 +289,6 @@ const bool TAVRIN_LogicalDisk_locals[] = {
 
 const Meta_Class TAVRIN_LogicalDisk::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_LogicalDisk", nullptr, 0,
-    TAVRIN_LogicalDisk_features, 80, sizeof(TAVRIN_LogicalDisk), TAVRIN_LogicalDisk_locals, &CIM_LogicalDisk::static_meta_class, 4, &__meta_repository };
+    TAVRIN_LogicalDisk_features, 80, sizeof(TAVRIN_LogicalDisk), TAVRIN_LogicalDisk_locals, &CIM_LogicalDisk::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

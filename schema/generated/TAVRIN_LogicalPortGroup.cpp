@@ -59,6 +59,6 @@ const bool TAVRIN_LogicalPortGroup_locals[] = {
 
 const Meta_Class TAVRIN_LogicalPortGroup::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_LogicalPortGroup", nullptr, 0,
-    TAVRIN_LogicalPortGroup_features, 8, sizeof(TAVRIN_LogicalPortGroup), TAVRIN_LogicalPortGroup_locals, &CIM_LogicalPortGroup::static_meta_class, 1, &__meta_repository };
+    TAVRIN_LogicalPortGroup_features, 8, sizeof(TAVRIN_LogicalPortGroup), TAVRIN_LogicalPortGroup_locals, &CIM_LogicalPortGroup::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

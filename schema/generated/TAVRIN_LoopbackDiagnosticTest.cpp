@@ -177,6 +177,6 @@ const bool TAVRIN_LoopbackDiagnosticTest_locals[] = {
 
 const Meta_Class TAVRIN_LoopbackDiagnosticTest::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_LoopbackDiagnosticTest", nullptr, 0,
-    TAVRIN_LoopbackDiagnosticTest_features, 47, sizeof(TAVRIN_LoopbackDiagnosticTest), TAVRIN_LoopbackDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &__meta_repository };
+    TAVRIN_LoopbackDiagnosticTest_features, 47, sizeof(TAVRIN_LoopbackDiagnosticTest), TAVRIN_LoopbackDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

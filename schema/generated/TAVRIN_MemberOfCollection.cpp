@@ -44,6 +44,6 @@ const bool TAVRIN_MemberOfCollection_locals[] = {
 
 const Meta_Class TAVRIN_MemberOfCollection::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION, "TAVRIN_MemberOfCollection", nullptr, 0,
-    TAVRIN_MemberOfCollection_features, 2, sizeof(TAVRIN_MemberOfCollection), TAVRIN_MemberOfCollection_locals, &CIM_MemberOfCollection::static_meta_class, 2, &__meta_repository };
+    TAVRIN_MemberOfCollection_features, 2, sizeof(TAVRIN_MemberOfCollection), TAVRIN_MemberOfCollection_locals, &CIM_MemberOfCollection::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

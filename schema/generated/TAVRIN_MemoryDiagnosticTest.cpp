@@ -177,6 +177,6 @@ const bool TAVRIN_MemoryDiagnosticTest_locals[] = {
 
 const Meta_Class TAVRIN_MemoryDiagnosticTest::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_MemoryDiagnosticTest", nullptr, 0,
-    TAVRIN_MemoryDiagnosticTest_features, 47, sizeof(TAVRIN_MemoryDiagnosticTest), TAVRIN_MemoryDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &__meta_repository };
+    TAVRIN_MemoryDiagnosticTest_features, 47, sizeof(TAVRIN_MemoryDiagnosticTest), TAVRIN_MemoryDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

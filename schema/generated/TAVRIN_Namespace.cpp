@@ -99,6 +99,6 @@ const bool TAVRIN_Namespace_locals[] = {
 
 const Meta_Class TAVRIN_Namespace::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_Namespace", nullptr, 0,
-    TAVRIN_Namespace_features, 16, sizeof(TAVRIN_Namespace), TAVRIN_Namespace_locals, &CIM_Namespace::static_meta_class, 6, &__meta_repository };
+    TAVRIN_Namespace_features, 16, sizeof(TAVRIN_Namespace), TAVRIN_Namespace_locals, &CIM_Namespace::static_meta_class, 6, &schema_repository };
 
 }  // namespace CPTA

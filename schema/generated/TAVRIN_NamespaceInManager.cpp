@@ -44,6 +44,6 @@ const bool TAVRIN_NamespaceInManager_locals[] = {
 
 const Meta_Class TAVRIN_NamespaceInManager::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_NamespaceInManager", nullptr, 0,
-    TAVRIN_NamespaceInManager_features, 2, sizeof(TAVRIN_NamespaceInManager), TAVRIN_NamespaceInManager_locals, &CIM_NamespaceInManager::static_meta_class, 2, &__meta_repository };
+    TAVRIN_NamespaceInManager_features, 2, sizeof(TAVRIN_NamespaceInManager), TAVRIN_NamespaceInManager_locals, &CIM_NamespaceInManager::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -151,6 +151,6 @@ const bool TAVRIN_ObjectManager_locals[] = {
 
 const Meta_Class TAVRIN_ObjectManager::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_ObjectManager", nullptr, 0,
-    TAVRIN_ObjectManager_features, 36, sizeof(TAVRIN_ObjectManager), TAVRIN_ObjectManager_locals, &CIM_ObjectManager::static_meta_class, 4, &__meta_repository };
+    TAVRIN_ObjectManager_features, 36, sizeof(TAVRIN_ObjectManager), TAVRIN_ObjectManager_locals, &CIM_ObjectManager::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

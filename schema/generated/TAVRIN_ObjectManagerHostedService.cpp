@@ -44,6 +44,6 @@ const bool TAVRIN_ObjectManagerHostedService_locals[] = {
 
 const Meta_Class TAVRIN_ObjectManagerHostedService::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_ObjectManagerHostedService", nullptr, 0,
-    TAVRIN_ObjectManagerHostedService_features, 2, sizeof(TAVRIN_ObjectManagerHostedService), TAVRIN_ObjectManagerHostedService_locals, &CIM_HostedService::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ObjectManagerHostedService_features, 2, sizeof(TAVRIN_ObjectManagerHostedService), TAVRIN_ObjectManagerHostedService_locals, &CIM_HostedService::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_OwningJobElement_locals[] = {
 
 const Meta_Class TAVRIN_OwningJobElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_OwningJobElement", nullptr, 0,
-    TAVRIN_OwningJobElement_features, 2, sizeof(TAVRIN_OwningJobElement), TAVRIN_OwningJobElement_locals, &CIM_OwningJobElement::static_meta_class, 2, &__meta_repository };
+    TAVRIN_OwningJobElement_features, 2, sizeof(TAVRIN_OwningJobElement), TAVRIN_OwningJobElement_locals, &CIM_OwningJobElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

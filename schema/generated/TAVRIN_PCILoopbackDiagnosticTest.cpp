@@ -177,6 +177,6 @@ const bool TAVRIN_PCILoopbackDiagnosticTest_locals[] = {
 
 const Meta_Class TAVRIN_PCILoopbackDiagnosticTest::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_PCILoopbackDiagnosticTest", nullptr, 0,
-    TAVRIN_PCILoopbackDiagnosticTest_features, 47, sizeof(TAVRIN_PCILoopbackDiagnosticTest), TAVRIN_PCILoopbackDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &__meta_repository };
+    TAVRIN_PCILoopbackDiagnosticTest_features, 47, sizeof(TAVRIN_PCILoopbackDiagnosticTest), TAVRIN_PCILoopbackDiagnosticTest_locals, &TAVRIN_DiagnosticTest::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

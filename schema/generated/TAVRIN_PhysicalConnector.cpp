@@ -158,6 +158,6 @@ const bool TAVRIN_PhysicalConnector_locals[] = {
 
 const Meta_Class TAVRIN_PhysicalConnector::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_PhysicalConnector", nullptr, 0,
-    TAVRIN_PhysicalConnector_features, 38, sizeof(TAVRIN_PhysicalConnector), TAVRIN_PhysicalConnector_locals, &CIM_PhysicalConnector::static_meta_class, 2, &__meta_repository };
+    TAVRIN_PhysicalConnector_features, 38, sizeof(TAVRIN_PhysicalConnector), TAVRIN_PhysicalConnector_locals, &CIM_PhysicalConnector::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

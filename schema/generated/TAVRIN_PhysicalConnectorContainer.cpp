@@ -48,6 +48,6 @@ const bool TAVRIN_PhysicalConnectorContainer_locals[] = {
 
 const Meta_Class TAVRIN_PhysicalConnectorContainer::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION, "TAVRIN_PhysicalConnectorContainer", nullptr, 0,
-    TAVRIN_PhysicalConnectorContainer_features, 3, sizeof(TAVRIN_PhysicalConnectorContainer), TAVRIN_PhysicalConnectorContainer_locals, &CIM_Container::static_meta_class, 2, &__meta_repository };
+    TAVRIN_PhysicalConnectorContainer_features, 3, sizeof(TAVRIN_PhysicalConnectorContainer), TAVRIN_PhysicalConnectorContainer_locals, &CIM_Container::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

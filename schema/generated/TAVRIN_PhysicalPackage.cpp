@@ -166,6 +166,6 @@ const bool TAVRIN_PhysicalPackage_locals[] = {
 
 const Meta_Class TAVRIN_PhysicalPackage::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_PhysicalPackage", nullptr, 0,
-    TAVRIN_PhysicalPackage_features, 41, sizeof(TAVRIN_PhysicalPackage), TAVRIN_PhysicalPackage_locals, &CIM_PhysicalPackage::static_meta_class, 2, &__meta_repository };
+    TAVRIN_PhysicalPackage_features, 41, sizeof(TAVRIN_PhysicalPackage), TAVRIN_PhysicalPackage_locals, &CIM_PhysicalPackage::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

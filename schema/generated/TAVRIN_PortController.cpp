@@ -207,6 +207,6 @@ const bool TAVRIN_PortController_locals[] = {
 
 const Meta_Class TAVRIN_PortController::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_PortController", nullptr, 0,
-    TAVRIN_PortController_features, 55, sizeof(TAVRIN_PortController), TAVRIN_PortController_locals, &CIM_PortController::static_meta_class, 4, &__meta_repository };
+    TAVRIN_PortController_features, 55, sizeof(TAVRIN_PortController), TAVRIN_PortController_locals, &CIM_PortController::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

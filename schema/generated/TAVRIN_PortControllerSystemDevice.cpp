@@ -44,6 +44,6 @@ const bool TAVRIN_PortControllerSystemDevice_locals[] = {
 
 const Meta_Class TAVRIN_PortControllerSystemDevice::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "TAVRIN_PortControllerSystemDevice", nullptr, 0,
-    TAVRIN_PortControllerSystemDevice_features, 2, sizeof(TAVRIN_PortControllerSystemDevice), TAVRIN_PortControllerSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &__meta_repository };
+    TAVRIN_PortControllerSystemDevice_features, 2, sizeof(TAVRIN_PortControllerSystemDevice), TAVRIN_PortControllerSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -84,6 +84,6 @@ const bool TAVRIN_Product_locals[] = {
 
 const Meta_Class TAVRIN_Product::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_Product", nullptr, 0,
-    TAVRIN_Product_features, 13, sizeof(TAVRIN_Product), TAVRIN_Product_locals, &CIM_Product::static_meta_class, 4, &__meta_repository };
+    TAVRIN_Product_features, 13, sizeof(TAVRIN_Product), TAVRIN_Product_locals, &CIM_Product::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

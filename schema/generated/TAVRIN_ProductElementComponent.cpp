@@ -44,6 +44,6 @@ const bool TAVRIN_ProductElementComponent_locals[] = {
 
 const Meta_Class TAVRIN_ProductElementComponent::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION | FLAG_EXPERIMENTAL, "TAVRIN_ProductElementComponent", nullptr, 0,
-    TAVRIN_ProductElementComponent_features, 2, sizeof(TAVRIN_ProductElementComponent), TAVRIN_ProductElementComponent_locals, &CIM_ProductElementComponent::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ProductElementComponent_features, 2, sizeof(TAVRIN_ProductElementComponent), TAVRIN_ProductElementComponent_locals, &CIM_ProductElementComponent::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

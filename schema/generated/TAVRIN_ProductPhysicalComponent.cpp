@@ -44,6 +44,6 @@ const bool TAVRIN_ProductPhysicalComponent_locals[] = {
 
 const Meta_Class TAVRIN_ProductPhysicalComponent::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "TAVRIN_ProductPhysicalComponent", nullptr, 0,
-    TAVRIN_ProductPhysicalComponent_features, 2, sizeof(TAVRIN_ProductPhysicalComponent), TAVRIN_ProductPhysicalComponent_locals, &CIM_ProductPhysicalComponent::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ProductPhysicalComponent_features, 2, sizeof(TAVRIN_ProductPhysicalComponent), TAVRIN_ProductPhysicalComponent_locals, &CIM_ProductPhysicalComponent::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

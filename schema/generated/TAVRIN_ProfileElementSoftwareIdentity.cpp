@@ -54,6 +54,6 @@ const bool TAVRIN_ProfileElementSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_ProfileElementSoftwareIdentity::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_ProfileElementSoftwareIdentity", nullptr, 0,
-    TAVRIN_ProfileElementSoftwareIdentity_features, 5, sizeof(TAVRIN_ProfileElementSoftwareIdentity), TAVRIN_ProfileElementSoftwareIdentity_locals, &CIM_ElementSoftwareIdentity::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ProfileElementSoftwareIdentity_features, 5, sizeof(TAVRIN_ProfileElementSoftwareIdentity), TAVRIN_ProfileElementSoftwareIdentity_locals, &CIM_ElementSoftwareIdentity::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

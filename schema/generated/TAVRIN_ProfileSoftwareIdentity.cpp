@@ -160,6 +160,6 @@ const bool TAVRIN_ProfileSoftwareIdentity_locals[] = {
 
 const Meta_Class TAVRIN_ProfileSoftwareIdentity::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_ProfileSoftwareIdentity", nullptr, 0,
-    TAVRIN_ProfileSoftwareIdentity_features, 40, sizeof(TAVRIN_ProfileSoftwareIdentity), TAVRIN_ProfileSoftwareIdentity_locals, &CIM_SoftwareIdentity::static_meta_class, 1, &__meta_repository };
+    TAVRIN_ProfileSoftwareIdentity_features, 40, sizeof(TAVRIN_ProfileSoftwareIdentity), TAVRIN_ProfileSoftwareIdentity_locals, &CIM_SoftwareIdentity::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_Realizes_locals[] = {
 
 const Meta_Class TAVRIN_Realizes::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_Realizes", nullptr, 0,
-    TAVRIN_Realizes_features, 2, sizeof(TAVRIN_Realizes), TAVRIN_Realizes_locals, &CIM_Realizes::static_meta_class, 2, &__meta_repository };
+    TAVRIN_Realizes_features, 2, sizeof(TAVRIN_Realizes), TAVRIN_Realizes_locals, &CIM_Realizes::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

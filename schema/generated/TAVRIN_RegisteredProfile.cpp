@@ -83,6 +83,6 @@ const bool TAVRIN_RegisteredProfile_locals[] = {
 
 const Meta_Class TAVRIN_RegisteredProfile::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_RegisteredProfile", nullptr, 0,
-    TAVRIN_RegisteredProfile_features, 17, sizeof(TAVRIN_RegisteredProfile), TAVRIN_RegisteredProfile_locals, &CIM_RegisteredProfile::static_meta_class, 1, &__meta_repository };
+    TAVRIN_RegisteredProfile_features, 17, sizeof(TAVRIN_RegisteredProfile), TAVRIN_RegisteredProfile_locals, &CIM_RegisteredProfile::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -84,6 +84,6 @@ const bool TAVRIN_RegisteredSubProfile_locals[] = {
 
 const Meta_Class TAVRIN_RegisteredSubProfile::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_RegisteredSubProfile", nullptr, 0,
-    TAVRIN_RegisteredSubProfile_features, 17, sizeof(TAVRIN_RegisteredSubProfile), TAVRIN_RegisteredSubProfile_locals, &CIM_RegisteredSubProfile::static_meta_class, 1, &__meta_repository };
+    TAVRIN_RegisteredSubProfile_features, 17, sizeof(TAVRIN_RegisteredSubProfile), TAVRIN_RegisteredSubProfile_locals, &CIM_RegisteredSubProfile::static_meta_class, 1, &schema_repository };
 
 }  // namespace CPTA

@@ -140,6 +140,6 @@ const bool TAVRIN_RemoteServiceAccessPoint_locals[] = {
 
 const Meta_Class TAVRIN_RemoteServiceAccessPoint::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_RemoteServiceAccessPoint", nullptr, 0,
-    TAVRIN_RemoteServiceAccessPoint_features, 31, sizeof(TAVRIN_RemoteServiceAccessPoint), TAVRIN_RemoteServiceAccessPoint_locals, &CIM_RemoteServiceAccessPoint::static_meta_class, 4, &__meta_repository };
+    TAVRIN_RemoteServiceAccessPoint_features, 31, sizeof(TAVRIN_RemoteServiceAccessPoint), TAVRIN_RemoteServiceAccessPoint_locals, &CIM_RemoteServiceAccessPoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

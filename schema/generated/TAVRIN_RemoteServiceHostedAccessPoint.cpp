@@ -44,6 +44,6 @@ const bool TAVRIN_RemoteServiceHostedAccessPoint_locals[] = {
 
 const Meta_Class TAVRIN_RemoteServiceHostedAccessPoint::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_RemoteServiceHostedAccessPoint", nullptr, 0,
-    TAVRIN_RemoteServiceHostedAccessPoint_features, 2, sizeof(TAVRIN_RemoteServiceHostedAccessPoint), TAVRIN_RemoteServiceHostedAccessPoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &__meta_repository };
+    TAVRIN_RemoteServiceHostedAccessPoint_features, 2, sizeof(TAVRIN_RemoteServiceHostedAccessPoint), TAVRIN_RemoteServiceHostedAccessPoint_locals, &CIM_HostedAccessPoint::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -67,6 +67,6 @@ const bool TAVRIN_SCSIInitiatorTargetLogicalUnitPath_locals[] = {
 
 const Meta_Class TAVRIN_SCSIInitiatorTargetLogicalUnitPath::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_SCSIInitiatorTargetLogicalUnitPath", nullptr, 0,
-    TAVRIN_SCSIInitiatorTargetLogicalUnitPath_features, 8, sizeof(TAVRIN_SCSIInitiatorTargetLogicalUnitPath), TAVRIN_SCSIInitiatorTargetLogicalUnitPath_locals, &CIM_SCSIInitiatorTargetLogicalUnitPath::static_meta_class, 3, &__meta_repository };
+    TAVRIN_SCSIInitiatorTargetLogicalUnitPath_features, 8, sizeof(TAVRIN_SCSIInitiatorTargetLogicalUnitPath), TAVRIN_SCSIInitiatorTargetLogicalUnitPath_locals, &CIM_SCSIInitiatorTargetLogicalUnitPath::static_meta_class, 3, &schema_repository };
 
 }  // namespace CPTA

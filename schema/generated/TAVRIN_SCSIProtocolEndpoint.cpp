@@ -155,6 +155,6 @@ const bool TAVRIN_SCSIProtocolEndpoint_locals[] = {
 
 const Meta_Class TAVRIN_SCSIProtocolEndpoint::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_SCSIProtocolEndpoint", nullptr, 0,
-    TAVRIN_SCSIProtocolEndpoint_features, 36, sizeof(TAVRIN_SCSIProtocolEndpoint), TAVRIN_SCSIProtocolEndpoint_locals, &CIM_SCSIProtocolEndpoint::static_meta_class, 4, &__meta_repository };
+    TAVRIN_SCSIProtocolEndpoint_features, 36, sizeof(TAVRIN_SCSIProtocolEndpoint), TAVRIN_SCSIProtocolEndpoint_locals, &CIM_SCSIProtocolEndpoint::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_ServiceRecordAppliesToElement_locals[] = {
 
 const Meta_Class TAVRIN_ServiceRecordAppliesToElement::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_ServiceRecordAppliesToElement", nullptr, 0,
-    TAVRIN_ServiceRecordAppliesToElement_features, 2, sizeof(TAVRIN_ServiceRecordAppliesToElement), TAVRIN_ServiceRecordAppliesToElement_locals, &CIM_RecordAppliesToElement::static_meta_class, 2, &__meta_repository };
+    TAVRIN_ServiceRecordAppliesToElement_features, 2, sizeof(TAVRIN_ServiceRecordAppliesToElement), TAVRIN_ServiceRecordAppliesToElement_locals, &CIM_RecordAppliesToElement::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

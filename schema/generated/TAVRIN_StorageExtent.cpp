@@ -278,6 +278,6 @@ const bool TAVRIN_StorageExtent_locals[] = {
 
 const Meta_Class TAVRIN_StorageExtent::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_StorageExtent", nullptr, 0,
-    TAVRIN_StorageExtent_features, 78, sizeof(TAVRIN_StorageExtent), TAVRIN_StorageExtent_locals, &CIM_StorageExtent::static_meta_class, 4, &__meta_repository };
+    TAVRIN_StorageExtent_features, 78, sizeof(TAVRIN_StorageExtent), TAVRIN_StorageExtent_locals, &CIM_StorageExtent::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

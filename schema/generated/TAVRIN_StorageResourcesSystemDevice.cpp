@@ -44,6 +44,6 @@ const bool TAVRIN_StorageResourcesSystemDevice_locals[] = {
 
 const Meta_Class TAVRIN_StorageResourcesSystemDevice::static_meta_class = {
     0, FLAG_AGGREGATION | FLAG_ASSOCIATION | FLAG_COMPOSITION, "TAVRIN_StorageResourcesSystemDevice", nullptr, 0,
-    TAVRIN_StorageResourcesSystemDevice_features, 2, sizeof(TAVRIN_StorageResourcesSystemDevice), TAVRIN_StorageResourcesSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &__meta_repository };
+    TAVRIN_StorageResourcesSystemDevice_features, 2, sizeof(TAVRIN_StorageResourcesSystemDevice), TAVRIN_StorageResourcesSystemDevice_locals, &CIM_SystemDevice::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -44,6 +44,6 @@ const bool TAVRIN_SubProfileRequiresProfile_locals[] = {
 
 const Meta_Class TAVRIN_SubProfileRequiresProfile::static_meta_class = {
     0, FLAG_ASSOCIATION, "TAVRIN_SubProfileRequiresProfile", nullptr, 0,
-    TAVRIN_SubProfileRequiresProfile_features, 2, sizeof(TAVRIN_SubProfileRequiresProfile), TAVRIN_SubProfileRequiresProfile_locals, &CIM_SubProfileRequiresProfile::static_meta_class, 2, &__meta_repository };
+    TAVRIN_SubProfileRequiresProfile_features, 2, sizeof(TAVRIN_SubProfileRequiresProfile), TAVRIN_SubProfileRequiresProfile_locals, &CIM_SubProfileRequiresProfile::static_meta_class, 2, &schema_repository };
 
 }  // namespace CPTA

@@ -267,6 +267,6 @@ const bool TAVRIN_TapeDrive_locals[] = {
 
 const Meta_Class TAVRIN_TapeDrive::static_meta_class = {
     0, FLAG_CLASS, "TAVRIN_TapeDrive", nullptr, 0,
-    TAVRIN_TapeDrive_features, 76, sizeof(TAVRIN_TapeDrive), TAVRIN_TapeDrive_locals, &CIM_TapeDrive::static_meta_class, 4, &__meta_repository };
+    TAVRIN_TapeDrive_features, 76, sizeof(TAVRIN_TapeDrive), TAVRIN_TapeDrive_locals, &CIM_TapeDrive::static_meta_class, 4, &schema_repository };
 
 }  // namespace CPTA

@@ -83,7 +83,7 @@ std::vector<std::string> pairs(const Pairing& rule, Sets& sets, End first, End s
         &delivered);
     auto end = [](const Instance* a, End e) {
         const Meta_Reference* mr = find_reference(a->meta_class, e.role);
-        return text(__ref_slot(__slot(a, mr->offset)), e.property);
+        return text(reference_in(slot_of(a, mr->offset)), e.property);
     };
     std::vector<std::string> out;
     for (Instance* a : delivered) {

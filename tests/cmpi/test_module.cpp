@@ -98,10 +98,10 @@ void note_model(const Instance* model) {
     const Meta_Class* mc = model->meta_class;
     for (size_t i = 0; i < mc->num_meta_features; i++) {
         const Meta_Feature* mf = mc->meta_features[i];
-        if (!__is_property(mf))
+        if (!is_property(mf))
             continue;
-        const Meta_Property* mp = __as_property(mf);
-        if (__null_flag(__slot(model, mp->offset), mp))
+        const Meta_Property* mp = as_property(mf);
+        if (null_flag(slot_of(model, mp->offset), mp))
             continue;
         if (!names.empty())
             names += ",";
@@ -196,10 +196,10 @@ public:
             const Meta_Class* mc = model->meta_class;
             for (size_t i = 0; i < mc->num_meta_features; i++) {
                 const Meta_Feature* mf = mc->meta_features[i];
-                if (!__is_property(mf) || __is_key(mf))
+                if (!is_property(mf) || is_key(mf))
                     continue;
-                const Meta_Property* mp = __as_property(mf);
-                if (__null_flag(__slot(model, mp->offset), mp))
+                const Meta_Property* mp = as_property(mf);
+                if (null_flag(slot_of(model, mp->offset), mp))
                     continue;
                 Value v;
                 if (v.set(instance, mf) == 0)

@@ -119,7 +119,7 @@ TEST(Instance, CloneIsDeep) {
     EXPECT_NE(a->Members.value[0], c->Members.value[0]);
     EXPECT_EQ(nullptr, c->Members.value[1]);
     EXPECT_TRUE(c->Note.null);
-    EXPECT_EQ(2u, a->Note.value.__refs());  // strings are shared, not copied
+    EXPECT_EQ(2u, a->Note.value.ref_count());  // strings are shared, not copied
 
     c->Antecedent->Codes.value.append(10);
     c->Members.value[0]->Name.value.append("x");
@@ -482,7 +482,7 @@ TEST(Value, StoringIntoSlots) {
     EXPECT_EQ(Value::UINT16, r.type());
     EXPECT_TRUE(r.null());
     EXPECT_EQ(0, r.set(b.ptr(), caption));
-    EXPECT_EQ(2u, b->Caption.value.__refs());  // the slot and r share it
+    EXPECT_EQ(2u, b->Caption.value.ref_count());  // the slot and r share it
     EXPECT_EQ(-1, r.get(nullptr, caption));
 }
 

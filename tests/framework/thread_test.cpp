@@ -220,8 +220,8 @@ TEST(Sharing, StringsAndDatetimesAcrossThreads) {
                 ADD_FAILURE();
         }
     });
-    EXPECT_EQ(1u, shared.__refs());
-    EXPECT_EQ(1u, when.__refs());
+    EXPECT_EQ(1u, shared.ref_count());
+    EXPECT_EQ(1u, when.ref_count());
     EXPECT_EQ("shared text that is long enough", shared);
     EXPECT_EQ(60, when.offset());
 }

@@ -24,12 +24,12 @@ std::string repeat(char c, size_t n) {
 TEST(String, EmptyStringsShareTheStaticRepresentation) {
     String a, b(""), c("abc", size_t(0)), d(nullptr);
     for (const String* s : {&a, &b, &c, &d}) {
-        EXPECT_TRUE(s->__is_static_empty());
+        EXPECT_TRUE(s->is_static_empty());
         EXPECT_STREQ("", s->c_str());
     }
     a.append('x');
     EXPECT_EQ("x", a);
-    EXPECT_TRUE(b.__is_static_empty());
+    EXPECT_TRUE(b.is_static_empty());
 }
 
 TEST(String, FillingToTheCapacityAndOneMore) {
@@ -57,10 +57,10 @@ TEST(String, ModifyingASharedStringLeavesItsCopiesAlone) {
     EXPECT_EQ("abcdef", b);
     EXPECT_EQ("Xbc", c);
     EXPECT_EQ("a", d);
-    EXPECT_TRUE(e.__is_static_empty());
+    EXPECT_TRUE(e.is_static_empty());
     EXPECT_EQ("zz", f);
     EXPECT_EQ("abc", a);
-    EXPECT_EQ(1u, a.__refs());
+    EXPECT_EQ(1u, a.ref_count());
 }
 
 TEST(String, AppendingFromItselfSurvivesReallocation) {
@@ -276,7 +276,7 @@ TEST(Datetime, CopiesShareUntilModified) {
     b.usec(7);
     EXPECT_EQ(5 * Datetime::MIN, a.usec());
     EXPECT_EQ(0, a.offset());
-    EXPECT_EQ(1u, a.__refs());
+    EXPECT_EQ(1u, a.ref_count());
 
     // Equality looks at microseconds, offset and kind.
     EXPECT_NE(Datetime(100), Datetime(100, 0));

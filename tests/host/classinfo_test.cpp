@@ -15,7 +15,7 @@ using namespace tvrnhost;
 namespace {
 
 TEST(RepositoryClasses, AnAssociationWithItsQualifiers) {
-    const Meta_Class* mc = find_meta_class(&__meta_repository, "CIM_Component");
+    const Meta_Class* mc = find_meta_class(&schema_repository, "CIM_Component");
     ASSERT_NE(mc, nullptr);
     EXPECT_EQ(classinfo::classMof(*mc),
               "[Abstract, Aggregation, Association]\n"

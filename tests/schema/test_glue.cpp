@@ -72,7 +72,7 @@ struct Install_Provider : TAVRIN_HBASoftwareInstallationService_Methods {
 TEST(ProviderList, RowsAgreeWithTheirClasses) {
     for (const Row& r : rows) {
         std::string name = std::string("TAVRIN_") + r.name;
-        const Meta_Class* mc = find_meta_class(&__meta_repository, name.c_str());
+        const Meta_Class* mc = find_meta_class(&schema_repository, name.c_str());
         ASSERT_NE(mc, nullptr) << name;
         EXPECT_EQ(r.indication, (mc->flags & FLAG_INDICATION) ? 1 : 0) << name;
         EXPECT_NE(r.instance, r.indication) << name;

@@ -318,8 +318,8 @@ TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
         if (checked(c.name))
             declared.insert(c.name);
     }
-    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
-        const Meta_Class* mc = __meta_repository.meta_classes[i];
+    for (size_t i = 0; i < schema_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = schema_repository.meta_classes[i];
         inputs.repository[mc->name] = mc;
         if (checked(mc->name))
             held.insert(mc->name);

@@ -30,7 +30,7 @@ using namespace CPTA;
 namespace {
 
 const Meta_Class* meta(const char* name) {
-    return find_meta_class(&__meta_repository, name);
+    return find_meta_class(&schema_repository, name);
 }
 
 bool is_tavrin(const char* name) {
@@ -91,14 +91,14 @@ struct Made {
 }  // namespace
 
 TEST(Repository, HoldsTheModuleClassesAndTheirCimAncestors) {
-    ASSERT_EQ(__meta_repository.num_meta_classes, 178u);
+    ASSERT_EQ(schema_repository.num_meta_classes, 178u);
     size_t tavrin = 0;
     std::set<std::string> names;
-    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
-        const Meta_Class* mc = __meta_repository.meta_classes[i];
+    for (size_t i = 0; i < schema_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = schema_repository.meta_classes[i];
         tavrin += is_tavrin(mc->name);
         EXPECT_TRUE(is_tavrin(mc->name) || std::strncmp(mc->name, "CIM_", 4) == 0) << mc->name;
-        EXPECT_EQ(mc->meta_repository, &__meta_repository) << mc->name;
+        EXPECT_EQ(mc->meta_repository, &schema_repository) << mc->name;
         EXPECT_TRUE(names.insert(mc->name).second) << mc->name;
     }
     EXPECT_EQ(tavrin, 77u);
@@ -111,8 +111,8 @@ TEST(Repository, HoldsTheModuleClassesAndTheirCimAncestors) {
 // with the superclass, references that point into this repository and only
 // narrow, method records, and the slots in order inside the structure.
 TEST(Repository, EveryClassIsConsistentWithItsSuperclass) {
-    for (size_t i = 0; i < __meta_repository.num_meta_classes; i++) {
-        const Meta_Class* mc = __meta_repository.meta_classes[i];
+    for (size_t i = 0; i < schema_repository.num_meta_classes; i++) {
+        const Meta_Class* mc = schema_repository.meta_classes[i];
         SCOPED_TRACE(mc->name);
         const Meta_Class* sup = mc->super_meta_class;
         bool assoc = mc->flags & FLAG_ASSOCIATION;

@@ -264,7 +264,7 @@ def source(cls):
     sup = "&%s::static_meta_class" % cls.superclass.name if cls.superclass else "nullptr"
     feats = (cls.name + "_features", cls.name + "_locals") if cls.features else ("nullptr", "nullptr")
     out.append("const Meta_Class %s::static_meta_class = {\n    0, %s, %s, nullptr, 0,\n"
-               "    %s, %d, sizeof(%s), %s, %s, %d, &__meta_repository };"
+               "    %s, %d, sizeof(%s), %s, %s, %d, &schema_repository };"
                % (cls.name, flags_expr(cls.flags), _c_string(cls.name), feats[0],
                   len(cls.features), cls.name, feats[1], sup, cls.num_keys))
     out += ["", "}  // namespace CPTA", ""]
@@ -280,7 +280,7 @@ def repository(schema):
     for cls in schema.classes:
         out.append("    &%s::static_meta_class," % cls.name)
     out += ["};", "", "}  // namespace", "",
-            "const Meta_Repository __meta_repository = { meta_classes, %d };" % len(schema.classes),
+            "const Meta_Repository schema_repository = { meta_classes, %d };" % len(schema.classes),
             "", "}  // namespace CPTA", ""]
     return "\n".join(out)
 
