@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
+#include <cstdlib>
 #include <fstream>
 #include <map>
 #include <set>
@@ -25,6 +26,13 @@ using namespace tvrnhost;
 namespace {
 
 const char* const NS = "root/tavrin";
+
+// The program runs on the simulator's host without adapters, however it is
+// started (the module opens the simulator by the loader's search path, which
+// ctest sets; without it there is no adapter library and no adapter either).
+struct Empty_Host {
+    Empty_Host() { setenv("TVRN_SIM_FIXTURE", "empty", 1); }
+} empty_host;
 
 // One row of the provider table.
 struct Row {
@@ -157,10 +165,10 @@ TEST(Module, RegistersEveryProviderOnceInTableOrder) {
     }
 }
 
-// This program runs on the simulator's "empty" host: nothing to enumerate but
-// the host itself, the server profile and the firmware update service (with
-// the associations between them), nothing to change, no method but
-// SetAlarmState and InstallFromURI.
+// On the host without adapters: nothing to enumerate but the host itself,
+// the server profile and the firmware update service (with the associations
+// between them), nothing to change, no method but SetAlarmState and
+// InstallFromURI.
 const std::set<std::string> kOnePerHost = {
     "TAVRIN_ComputerSystem", "TAVRIN_HBASoftwareInstallationService",
     "TAVRIN_HBASoftwareInstallationServiceCapabilities",
