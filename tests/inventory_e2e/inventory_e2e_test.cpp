@@ -60,13 +60,6 @@ const Instance* find(const std::vector<Instance>& items, const char* property,
     return nullptr;
 }
 
-std::vector<std::string> texts(const std::vector<Instance>& items, const char* property) {
-    std::vector<std::string> out;
-    for (const Instance& i : items)
-        out.push_back(text(i, property));
-    return out;
-}
-
 std::vector<Instance> all(Module_Session& s, const char* className) {
     Result<Instance> r = s.enumerate(className);
     EXPECT_TRUE(r.ok()) << className << ": " << r.toString();
@@ -142,114 +135,15 @@ TEST(FCPort, GetByItsFourKeysAsksForEveryPortAndFindsTheOne) {
         EXPECT_EQ(s.get(s.path(path)).rc, CMPI_RC_ERR_NOT_FOUND) << path;
 }
 
-TEST(FCPort, ALinkDownPortReportingSpeed99999HasNoSpeedButKeepsItsMaximum) {
+// What each LUN becomes is in tests/golden/storage.golden; what is not said there:
+TEST(StorageExtent, ALunWithoutProductIdIsLeftOutAndSaidSo) {
     Module_Session& s = Module_Session::open();
-    std::vector<Instance> ports = all(s, "TAVRIN_FCPort");
-    const Instance* down = find(ports, "DeviceID", "100000051e0a0b0d");
-    const Instance* up = find(ports, "DeviceID", "100000051e0a0b0c");
-    ASSERT_TRUE(down && up);
-    EXPECT_EQ(number(*down, "Speed"), 0);
-    EXPECT_EQ(number(*down, "MaxSpeed"), 16000000000LL);
-    EXPECT_EQ(number(*down, "EnabledState"), 6);
-    EXPECT_EQ(number(*up, "Speed"), 8000000000LL);
-}
-
-TEST(FCPortStatistics, FCAndFCoEPortsEachFillTheirOwnCounters) {
-    Module_Session& s = Module_Session::open();
-    std::vector<Instance> stats = all(s, "TAVRIN_FCPortStatistics");
-    const Instance* fc = find(stats, "InstanceID", "100000051e0a0b0c");
-    const Instance* fcoe = find(stats, "InstanceID", "100000051e8a4b01");
-    ASSERT_TRUE(fc && fcoe);
-    struct Counter {
-        const char* property;
-        long long fc, fcoe;
-    } counters[] = {
-        {"BytesTransmitted", 9876543LL * 4, 0},
-        {"BytesReceived", 8765432LL * 4, 0},  // words
-        {"PacketsTransmitted", 123456, 0},
-        {"PacketsReceived", 234567, 0},
-        {"LIPCount", 3, 0},
-        {"NOSCount", 1, 0},
-        {"ErrorFrames", 2, 1 + 5 + 4 + 6 + 7},  // the FCoE errors and the later CRC count
-        {"DumpedFrames", 5, 3},
-        {"LinkFailures", 1, 0},
-        {"LossOfSyncCounter", 4, 0},
-        {"LossOfSignalCounter", 2, 0},
-        {"PrimitiveSeqProtocolErrCount", 0, 0},
-        {"CRCErrors", 7, 5},
-        {"InvalidTransmissionWords", 11, 0},
-    };
-    for (const Counter& c : counters) {
-        EXPECT_EQ(number(*fc, c.property), c.fc) << c.property;
-        EXPECT_EQ(number(*fcoe, c.property), c.fcoe) << c.property;
-    }
-}
-
-TEST(StorageExtent, TheNameFollowsTheKindOfLunIdentifier) {
-    Module_Session& s = Module_Session::open();
-    ASSERT_TRUE(s.loaded());
-    std::vector<Instance> extents = all(s, "TAVRIN_StorageExtent");
-    const std::string disk1 = "100000051e0a0b0c_500507680110f00d_ACME_DISK-X_LUN_";
-    const std::string disk2 = "100000051e5c6d70_500601603ba01234_STORCO_ARRAY-9000_LUN_";
-    struct Lun {
-        std::string deviceId;
-        const char* name;
-        long long nameFormat, nameNamespace;
-    } luns[] = {
-        // description: NAA (type 3), EUI-64 (2); neither description nor serial; serial only
-        {disk1 + "0", "600507680180870c2000000000000000", 9, 2},
-        {disk1 + "1", "0050768010f00d01", 10, 3},
-        {disk1 + "2", "Unable To Fetch", 0, 0},
-        {disk1 + "3", "ACME+DISK-X+0001", 7, 7},
-        // vendor specific (8), T10 (1), and a type the inventory does not know
-        {disk2 + "1", "STORCO  ARRAY-9000 SN0B", 1, 1},
-        {disk2 + "4", "STORCO-ARRAY-9000-T10-0004", 11, 4},
-        {disk2 + "5", "", -1, -1},
-    };
-    for (const Lun& l : luns) {
-        SCOPED_TRACE(l.deviceId);
-        const Instance* e = find(extents, "DeviceID", l.deviceId);
-        ASSERT_TRUE(e);
-        EXPECT_EQ(text(*e, "Name"), l.name);
-        EXPECT_EQ(number(*e, "NameFormat"), l.nameFormat);
-        EXPECT_EQ(number(*e, "NameNamespace"), l.nameNamespace);
-        EXPECT_EQ(text(*e, "ElementName"), l.deviceId.substr(l.deviceId.rfind("LUN_")));
-    }
-    // LUN 3 behind the HP adapter has no product id: left out, and said so.
-    EXPECT_FALSE(find(extents, "DeviceID", disk2 + "3"));
+    const std::string target = "100000051e5c6d70_500601603ba01234_";  // LUNs 0 to 5, 3 without
+    size_t behind = 0;
+    for (const Instance& e : all(s, "TAVRIN_StorageExtent"))
+        behind += text(e, "DeviceID").compare(0, target.size(), target) == 0;
+    EXPECT_EQ(behind, 5u);
     EXPECT_EQ(s.logCount("LUN info is NOT available"), 1u);
-
-    // A logical disk always names itself by the description.
-    std::vector<Instance> disks = all(s, "TAVRIN_LogicalDisk");
-    EXPECT_EQ(texts(disks, "DeviceID"), texts(extents, "DeviceID"));
-    for (const Instance& d : disks) {
-        EXPECT_EQ(number(d, "NameFormat"), 1) << text(d, "DeviceID");
-        EXPECT_EQ(number(d, "NameNamespace"), 1) << text(d, "DeviceID");
-    }
-}
-
-TEST(TapeDrive, TapeAndMediaChangerTargetsAreEndpointsAndTapeDrivesOnly) {
-    Module_Session& s = Module_Session::open();
-    // Through port 1: the disk, the tape and the media changer; not the initiator 21000024ff314253.
-    std::vector<std::string> throughPort1;
-    for (const Instance& e : all(s, "TAVRIN_SCSIProtocolEndpoint"))
-        if (text(e, "Name").compare(0, 16, "100000051e0a0b0c") == 0)
-            throughPort1.push_back(text(e, "Name") + " role " + std::to_string(number(e, "Role")));
-    EXPECT_EQ(throughPort1, (std::vector<std::string>{
-                                "100000051e0a0b0c role 2",
-                                "100000051e0a0b0c_500507680110f00d role 3",
-                                "100000051e0a0b0c_500110a0002b3c01 role 3",
-                                "100000051e0a0b0c_500110a0002b3c02 role 3",
-                            }));
-    EXPECT_EQ(texts(all(s, "TAVRIN_TapeDrive"), "DeviceID"),
-              (std::vector<std::string>{
-                  "100000051e0a0b0c_500110a0002b3c01_TAPECO_LTO-8_LUN_0",
-                  "100000051e0a0b0c_500110a0002b3c02_TAPECO_TL2000 CHANGER_LUN_0",
-                  "100000051e0a0b0c_500110a0002b3c02_TAPECO_TL2000 CHANGER_LUN_1",
-              }));
-    for (const char* className : {"TAVRIN_StorageExtent", "TAVRIN_LogicalDisk"})
-        for (const std::string& id : texts(all(s, className), "DeviceID"))
-            EXPECT_EQ(id.find("500110a0002b3c0"), std::string::npos) << className << " " << id;
 }
 
 MethodResult setAlarmState(Module_Session& s, const std::string& deviceId, unsigned state) {
