@@ -15,6 +15,23 @@ const size_t kMacLength = 17;  // colon format
 
 std::atomic<ProviderUtil::EthPortDetailsFn> gEthPortDetails{nullptr};
 
+// A boolean member of the adapter's "hbaData"; false when the details fail or
+// the member is missing (logged with `missing`), else logged with `found`.
+bool adapterFlag(const String& key, const char* member, const char* missing, const char* found) {
+    String index = ProviderUtil::getIndexInColonFormat(key);
+    Json::Value details;
+    if (ProviderUtil::getAdapterDetails(index, details) != 0)
+        return false;
+    const Json::Value& hba = jsonObject(details, "hbaData");
+    if (!jsonHas(hba, member, Json::booleanValue)) {
+        TVRN_LOG(LL_ERR, missing, index.c_str());
+        return false;
+    }
+    bool flag = jsonBool(hba, member);
+    TVRN_LOG(LL_INFO, found, int(flag));
+    return flag;
+}
+
 }  // namespace
 
 int ProviderUtil::getNumberOfAdapters(Json::Value& adapters) {
@@ -109,33 +126,11 @@ bool ProviderUtil::checkIfThisAdapterModelPresent(const char* model) {
 }
 
 bool ProviderUtil::isCNA(const String& key) {
-    String index = getIndexInColonFormat(key);
-    Json::Value details;
-    if (getAdapterDetails(index, details) != 0)
-        return false;
-    const Json::Value& hba = jsonObject(details, "hbaData");
-    if (!jsonHas(hba, "isCNA", Json::booleanValue)) {
-        TVRN_LOG(LL_ERR, "Unable to get CNA info for %s", index.c_str());
-        return false;
-    }
-    bool cna = jsonBool(hba, "isCNA");
-    TVRN_LOG(LL_INFO, "isCNA = %d", int(cna));
-    return cna;
+    return adapterFlag(key, "isCNA", "Unable to get CNA info for %s", "isCNA = %d");
 }
 
 bool ProviderUtil::hasEthernetPort(const String& key) {
-    String index = getIndexInColonFormat(key);
-    Json::Value details;
-    if (getAdapterDetails(index, details) != 0)
-        return false;
-    const Json::Value& hba = jsonObject(details, "hbaData");
-    if (!jsonHas(hba, "hasEthPort", Json::booleanValue)) {
-        TVRN_LOG(LL_ERR, "Unable to get Ethernet info %s", index.c_str());
-        return false;
-    }
-    bool eth = jsonBool(hba, "hasEthPort");
-    TVRN_LOG(LL_INFO, "ethFlag = %d", int(eth));
-    return eth;
+    return adapterFlag(key, "hasEthPort", "Unable to get Ethernet info %s", "ethFlag = %d");
 }
 
 String ProviderUtil::getDriverVersion() {
