@@ -17,7 +17,7 @@ bool _selected(const Meta_Feature* mf, uint32 flags) {
 // since a server that fills new instances with the class defaults would
 // otherwise show the default instead.
 bool _null_over_default(const Meta_Feature* mf) {
-    return __is_property(mf) && __as_property(mf)->value != nullptr;
+    return is_property(mf) && as_property(mf)->value != nullptr;
 }
 
 // Whether the slot of the feature holds nothing to convert.

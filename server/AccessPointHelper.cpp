@@ -1,6 +1,7 @@
 #include "server/AccessPointHelper.h"
 
 #include <cstring>
+#include <string>
 
 #include "framework/Log.h"
 #include "gateway/ProviderUtil.h"
@@ -52,7 +53,7 @@ Instance* AccessPointHelper::getRemoteServiceAccessPointInstance(_adapterData ad
     sap->Name.set(String("MDC Service"));
     sap->ElementName.set(String("Meridel Console Service Access Point"));
     String url("https://", adapter.hostName.c_str(), ":");
-    url.append(decimal(port));
+    url.append(std::to_string(port).c_str());
     url.append("/index.html");
     sap->AccessInfo.set(url);
     sap->InfoFormat.set(kInfoFormatUrl);
