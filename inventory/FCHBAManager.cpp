@@ -10,7 +10,6 @@
 #include "inventory/InventoryCommon.h"
 #include "inventory/PhysicalAssetHelper.h"
 #include "inventory/PortHelper.h"
-#include "update/SoftwareUpdateHelper.h"
 
 namespace CPTA {
 
@@ -31,16 +30,11 @@ Array<Instance*> ethernetPorts(classId_t id) {
 Array<Instance*> connectors(classId_t id) {
     return PhysicalAssetHelper::getPhysicalAssetHelperObject()->getInstancesByClass(id);
 }
-Array<Instance*> softwareUpdate(classId_t id) {
-    _adapterData host;
-    host.hostName = HostIdentityScope::hostText();
-    return SoftwareUpdateHelper::getSoftwareUpdateHelperInstance()->getInstancesByClass(host, id);
-}
 
 // The routes without a builder belong to helpers still to come: the
 // diagnostics (21 to 28, 31 to 33). The server profile (10 to 15, 17, 37)
-// lives above the inventory and fills its routes when the module loads
-// (fillRoute).
+// and the firmware update (18, 19) live above the inventory and fill their
+// routes when the module loads (fillRoute).
 InventoryRoute kFCHBARoutes[] = {
     {CID_COMPUTER_SYSTEM, CID_COMPUTER_SYSTEM, false, computerSystem},
     {CID_PORT_CONTROLLER, CID_PORT_CONTROLLER, true, adapters},
@@ -49,7 +43,7 @@ InventoryRoute kFCHBARoutes[] = {
     {CID_REGISTERED_PROFILE, CID_PROFILE_SOFTWARE_IDENTITY, false, nullptr},
     {CID_REMOTE_SERVICE_ACCESS_POINT, CID_REMOTE_SERVICE_ACCESS_POINT, false, nullptr},
     {CID_HBA_SOFTWARE_INSTALLATION_SERVICE, CID_HBA_SOFTWARE_INSTALLATION_SERVICE_CAPABILITIES,
-     true, softwareUpdate},
+     true, nullptr},
     {CID_ETHERNET_PORT, CID_ETHERNET_PORT, true, ethernetPorts},
     {CID_MEMORY_DIAGNOSTIC_TEST, CID_DIAGNOSTIC_COMPLETION_RECORD, true, nullptr},
     {CID_LOGICAL_PORT_GROUP, CID_LOGICAL_PORT_GROUP, true, ports},

@@ -16,6 +16,8 @@
 #include "gateway/GuardedCall.h"
 #include "gateway/JsonAccess.h"
 #include "gateway/ProviderUtil.h"
+#include "inventory/FCHBAManager.h"
+#include "inventory/HostIdentityScope.h"
 #include "schema/generated/TAVRIN_HBASoftwareInstallationService.h"
 #include "schema/generated/TAVRIN_HBASoftwareInstallationServiceCapabilities.h"
 
@@ -207,6 +209,20 @@ void checkArguments(const Property<String>& uri, const Instance* target,
         throw Install_Error("invalid option type");
     }
 }
+
+// FCHBAManager answers for the service and its capabilities (behind the
+// driver gate), so association providers find them where they find the host.
+Array<Instance*> softwareUpdateRoute(classId_t id) {
+    _adapterData host;
+    host.hostName = HostIdentityScope::hostText();
+    return SoftwareUpdateHelper::getSoftwareUpdateHelperInstance()->getInstancesByClass(host, id);
+}
+
+struct RouteFilledAtLoad {
+    RouteFilledAtLoad() {
+        FCHBAManager::fillRoute(CID_HBA_SOFTWARE_INSTALLATION_SERVICE, softwareUpdateRoute);
+    }
+} routeFilledAtLoad;
 
 }  // namespace
 
