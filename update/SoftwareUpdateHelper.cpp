@@ -285,8 +285,7 @@ int SoftwareUpdateHelper::UpdatePortControllerSoftware(const TAVRIN_PortControll
     TVRN_LOG(LL_INFO, "UpdatePortControllerSoftware portType=%d deviceid=%s file=%s\n",
              pc->ControllerType.null ? 0 : int(pc->ControllerType.value), deviceId.c_str(), file);
 
-    Json::Value request(Json::objectValue);
-    request["indexStr"] = text(ProviderUtil::getIndexInColonFormat(deviceId));
+    Json::Value request = keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(deviceId));
     request["file"] = file;
     Json::Value answer;
     int status = -1;
