@@ -192,7 +192,7 @@ constexpr Pairing hostsOf(int hosts) {
         .with_every(1, "PartComponent");
 }
 
-TEST(Pairing, TheHostMustBeExactlyOneAndEachRoleAReference) {
+TEST(Pairing, CountChecksAndUnknownRolesFailTheRequest) {
     Sets sets;
     sets.add(CID_COMPUTER_SYSTEM, &TAVRIN_ComputerSystem::static_meta_class, "Name", {"h"});
     sets.add(CID_FC_PORT, &TAVRIN_FCPort::static_meta_class, "DeviceID", {"p1", "p2", "p3"});
@@ -209,6 +209,15 @@ TEST(Pairing, TheHostMustBeExactlyOneAndEachRoleAReference) {
     EXPECT_EQ(run(kThreeHosts), failed);
     EXPECT_EQ(run(kNoHost), failed);
     EXPECT_EQ(run(kNoSuchRole), failed);
+    // A set of two classes, the second without instances.
+    constexpr Pairing kPortsAndEndpoints =
+        TVRN_PAIRING.fetch(CID_COMPUTER_SYSTEM)
+            .fetch(CID_FC_PORT, CID_SCSI_PROTOCOL_ENDPOINT)
+            .when_any_empty(LL_ERR, "Invalid number of instances returned.")
+            .for_each(0)
+            .as("GroupComponent")
+            .with_every(1, "PartComponent");
+    EXPECT_EQ(run(kPortsAndEndpoints), failed);
 }
 
 // ---- the providers' rules ----------------------------------------------------------
