@@ -1,10 +1,14 @@
 #include "alerts/EventTables.h"
 
+#include <initializer_list>
 #include <iterator>
 
 namespace CPTA {
 
 namespace {
+
+// The tables are constexpr: the compiler refuses anything that would fill them
+// at run time, so they are complete before any event can be read.
 
 constexpr uint32 ids(std::initializer_list<int> list) {
     uint32 bits = 0;
@@ -22,10 +26,10 @@ constexpr uint32 idRange(int first, int last) {
 
 const char kNotSupported[] = "Not supported event is triggered.";
 const char kNotForRegularProvider[] = "Non supported event by regular provider is triggered.";
-const Event_Arguments kNoArguments = {nullptr, {nullptr, nullptr}};
-const Event_Arguments kPortIndex = {nullptr, {"portIndexString", nullptr}};
+constexpr Event_Arguments kNoArguments = {nullptr, {nullptr, nullptr}};
+constexpr Event_Arguments kPortIndex = {nullptr, {"portIndexString", nullptr}};
 
-const Event_Category kCategories[] = {
+constexpr Event_Category kCategories[] = {
     {2, "Port", ELEMENT_FC_PORT, false, ids({1, 2, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15}), true,
      FORMS_BOTH, 0, nullptr, "Unsupported event-port is triggered.", kPortIndex},
     {3, "Lport", ELEMENT_BASE_FC_PORT, false, ids({1, 2}), true, FORMS_BOTH, 2, nullptr,
@@ -43,15 +47,15 @@ const Event_Category kCategories[] = {
 };
 
 // Categories 1 to 12 that are not listed above.
-const Event_Category kSilentCategory = {0, nullptr, ELEMENT_NONE, false,       0, false, FORMS_NONE,
-                                        0, nullptr, nullptr,      kNoArguments};
+constexpr Event_Category kSilentCategory = {
+    0, nullptr, ELEMENT_NONE, false, 0, false, FORMS_NONE, 0, nullptr, nullptr, kNoArguments};
 
 // Category 0, negative categories and those above 12.
-const Event_Category kUnknownCategory = {
+constexpr Event_Category kUnknownCategory = {
     0, nullptr, ELEMENT_NONE, true, 0, false, FORMS_BOTH, 0, nullptr, nullptr, kNoArguments};
 
-const Standard_Wording kInterfaceEnabled = {"The network port %s has been enabled", 2};
-const Standard_Wording kInterfaceDisabled = {"The network port %s has been disabled", 3};
+constexpr Standard_Wording kInterfaceEnabled = {"The network port %s has been enabled", 2};
+constexpr Standard_Wording kInterfaceDisabled = {"The network port %s has been disabled", 3};
 
 const char kNoAction[] = "No action required.";
 const char kAskAdministrator[] = "Please contact the Administrator.";
@@ -60,7 +64,7 @@ const char kCheckFabric[] = "Check fabric/fport configuration.";
 
 // Columns: code, cause, action, message identifier (null: TVRN<code>),
 // severity (0: as the category says), message arguments, standard wording.
-const Event_Details kEvents[] = {
+constexpr Event_Details kEvents[] = {
     {0x20001, "Base port logged into Fabric.", kNoAction, nullptr, 0, {}, nullptr},
     {0x20002, "Base port logged out of Fabric.", kNoAction, nullptr, 0, {}, nullptr},
     {0x20003, "", "No action required. Not supported", nullptr, 0, {}, nullptr},
@@ -251,7 +255,7 @@ struct Severity_Row {
     uint16 exact;
 };
 
-const Severity_Row kSeverities[] = {
+constexpr Severity_Row kSeverities[] = {
     {1, 6, 6},  // critical
     {2, 6, 5},  // critical; exactly: major
     {3, 3, 3},  // degraded/warning
