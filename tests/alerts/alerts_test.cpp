@@ -180,6 +180,14 @@ TEST_F(Alerts, MalformedTextsAreDroppedWithALogLine) {
     helper->queue().discard();
 }
 
+// Both forms read the event's severity; one outside 1 to 4 is unknown (0).
+TEST_F(Alerts, ASeverityOutOfRangeIsWarnedAbout) {
+    IndicationHelper* helper = IndicationHelper::getIndicationHelperInstance();
+    EXPECT_EQ(helper->processEvent(R"({"eventCategory": 2, "eventId": 1, "eventSeverity": 7})"), 1);
+    EXPECT_EQ(logged("WARN", "Received a un-expected severity value: 7"), 2);
+    EXPECT_EQ(helper->queue().discard(), 2u);
+}
+
 TEST_F(Alerts, DeliveredInOrderWithConsecutiveSequenceNumbers) {
     Receiver receiver;
     ASSERT_EQ(delivery.enable(receiver.handler()), ENABLE_INDICATIONS_OK);
