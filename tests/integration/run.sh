@@ -25,7 +25,8 @@ scratch=$(mktemp -d)
 failures=0
 unset TVRN_SIM_FIXTURE # the built-in host, for the server and tvrncli alike
 
-say() { printf '\n== %s: %s\n' "$server" "$*"; }
+started=$SECONDS
+say() { printf '\n== %s [%d s]: %s\n' "$server" $((SECONDS - started)) "$*"; }
 fail() {
   echo "FAILED: $*" >&2
   failures=$((failures + 1))
@@ -42,7 +43,12 @@ readme() {
 }
 
 # check.py with tvrncli on the loader path the server was given.
-check() { LD_LIBRARY_PATH=${loader_path:-} python3 "$here/check.py" "$@"; }
+# The module names its object manager after the server's own, which tvrncli
+# is given as a seed.
+check() {
+  LD_LIBRARY_PATH=${loader_path:-} python3 "$here/check.py" \
+    --seed-from root/PG_InterOp:CIM_ObjectManager "$@"
+}
 
 stop_server() {
   case $server in
@@ -76,7 +82,27 @@ compare_all() {
   say "associations, methods, bad requests (provider pid $pid)"
   check requests "$here/requests" || fail "requests differ"
   [ "$(module_pid)" = "$pid" ] || fail "the provider process did not survive (pid $pid)"
-  check classes <(echo TAVRIN_AlarmDevice) || fail "a method left a change behind"
+  check classes <(printf 'TAVRIN_AlarmDevice\nTAVRIN_AdapterSoftwareIdentity\n') ||
+    fail "a method left a change behind"
+  indication_registered
+}
+
+# Alert indications: the class is known and the module registered as its
+# indication provider (no subscription through the server here).
+indication_registered() {
+  say "alert indications registered"
+  wbemcli gc "$url:TAVRIN_AlertIndication" >/dev/null || fail "no class TAVRIN_AlertIndication"
+  local registration
+  case $server in
+    sfcb)
+      registration=$(awk '/^\[/ { on = ($0 == "[TAVRIN_AlertIndication]") } on' \
+        /opt/sfcb/var/lib/sfcb/registration/providerRegister) ;;
+    pegasus)
+      registration=$(wbemcli gi -nl 'http://localhost:5988/root/PG_InterOp:PG_ProviderCapabilities.ProviderModuleName="tvrnprovider_Module",ProviderName="TAVRIN_AlertIndication_Provider",CapabilityID="TAVRIN_AlertIndication"' 2>&1 |
+        sed -n 's/^-ProviderType=/type: /p' | tr , ' ') ;;
+  esac
+  grep -qE '^ *type:.* (indication|4)( |$)' <<<"$registration" ||
+    fail "TAVRIN_AlertIndication has no indication provider: $registration"
 }
 
 # Without libdtfaj.so the providers answer: the computer system, and every
@@ -152,7 +178,6 @@ run_pegasus() {
   compare_without_library
 }
 
-started=$SECONDS
 run_"$server"
 say "done in $((SECONDS - started)) s, $failures failure(s)"
 [ "$failures" -eq 0 ]
