@@ -23,9 +23,11 @@ loader path.
 Answers are compared in a normal form: each instance as its sorted list of
 non-null properties (names without regard to case, numbers by value,
 booleans in lower case, references as class and sorted keys); a property
-that is null on one side must be null or absent on the other, so a class
-default that shows through where the module leaves a property null is a
-difference. Enumerations compare as sorted lists of such instances.
+that is null on one side must be null or absent on the other. tvrncli runs
+with --no-class-defaults: its instances hold only what the module sends, so
+a class default that shows through on the server where the module leaves a
+property unset is a difference. Enumerations compare as sorted lists of
+such instances.
 
 Request lines (FILE of `requests`) are tvrncli command lines: ei, ein, gi,
 ai, ain, ri, rin (with --assoc, --result-class, --role, --result-role) and
@@ -305,7 +307,7 @@ class Clients:
 
     def cli(self, lines):
         """tvrncli commands (word lists) in one process."""
-        base = [self.tvrncli, "--module", self.module]
+        base = [self.tvrncli, "--module", self.module, "--no-class-defaults"]
         if self.seed_from:
             base += ["--seed", self.seed()]
         if len(lines) == 1:
