@@ -105,8 +105,8 @@ indication_registered() {
     fail "TAVRIN_AlertIndication has no indication provider: $registration"
 }
 
-# Without libdtfaj.so the providers answer: the computer system, and every
-# other class with nothing.
+# Without libdtfaj.so the providers answer: the computer system and the
+# profile registration as with it, every adapter class with nothing.
 compare_without_library() {
   say "without libdtfaj.so on the loader path"
   check classes "$here/classes" || fail "classes differ without the library"
