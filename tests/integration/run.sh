@@ -20,7 +20,11 @@ case $server in sfcb | pegasus) ;; *) echo "usage: $0 sfcb|pegasus" >&2; exit 2 
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd)
 cd "$root"
 here=tests/integration
-url=http://localhost:5988/root/tavrin
+server_url=http://localhost:5988
+url=$server_url/root/tavrin
+# OpenPegasus's interop namespace, where the module asks for the server's
+# object manager (SFCB answers there too) and OpenPegasus keeps registrations.
+interop=root/PG_InterOp
 scratch=$(mktemp -d)
 failures=0
 unset TVRN_SIM_FIXTURE # the built-in host, for the server and tvrncli alike
@@ -47,7 +51,7 @@ readme() {
 # is given as a seed.
 check() {
   LD_LIBRARY_PATH=${loader_path:-} python3 "$here/check.py" \
-    --seed-from root/PG_InterOp:CIM_ObjectManager "$@"
+    --seed-from "$interop:CIM_ObjectManager" "$@"
 }
 
 stop_server() {
@@ -98,7 +102,7 @@ indication_registered() {
       registration=$(awk '/^\[/ { on = ($0 == "[TAVRIN_AlertIndication]") } on' \
         /opt/sfcb/var/lib/sfcb/registration/providerRegister) ;;
     pegasus)
-      registration=$(wbemcli gi -nl 'http://localhost:5988/root/PG_InterOp:PG_ProviderCapabilities.ProviderModuleName="tvrnprovider_Module",ProviderName="TAVRIN_AlertIndication_Provider",CapabilityID="TAVRIN_AlertIndication"' 2>&1 |
+      registration=$(wbemcli gi -nl "$server_url/$interop:"'PG_ProviderCapabilities.ProviderModuleName="tvrnprovider_Module",ProviderName="TAVRIN_AlertIndication_Provider",CapabilityID="TAVRIN_AlertIndication"' 2>&1 |
         sed -n 's/^-ProviderType=/type: /p' | tr , ' ') ;;
   esac
   grep -qE '^ *type:.* (indication|4)( |$)' <<<"$registration" ||
