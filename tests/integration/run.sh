@@ -140,17 +140,20 @@ run_sfcb() {
   compare_all
   readme '/opt/sfcb/bin/sfcb-stop'
 
-  # Idle providers are unloaded after providerTimeoutInterval; shortened here.
+  # Idle providers are unloaded after providerTimeoutInterval; shortened here,
+  # though not below what a busy machine needs between a request and finding
+  # the process that answered it.
   sed '/^providerTimeoutInterval:/d; /^providerSampleInterval:/d' /opt/sfcb/etc/sfcb/sfcb.cfg \
     >"$scratch/sfcb.cfg"
-  printf 'providerTimeoutInterval: 4\nproviderSampleInterval: 2\n' >>"$scratch/sfcb.cfg"
+  printf 'providerTimeoutInterval: 10\nproviderSampleInterval: 2\n' >>"$scratch/sfcb.cfg"
   loader_path=
   SFCB_CONFIG=$scratch/sfcb.cfg /opt/sfcb/bin/sfcb-start
   compare_without_library
   local pid
+  wbemcli ein "$url:TAVRIN_ComputerSystem" >/dev/null # idle from now on
   pid=$(module_pid) || { fail "no process has the module loaded"; return; }
   say "idle unload (pid $pid) and load again"
-  module_pid gone 30 || fail "the module stayed loaded while idle (pid $pid)"
+  module_pid gone 40 || fail "the module stayed loaded while idle (pid $pid)"
   reloaded_from_new_process "$pid"
 }
 
