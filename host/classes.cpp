@@ -99,7 +99,8 @@ std::optional<Value> as(const Value& v, Type t, bool array) {
 
 Instance HostImpl::newInstance(const ObjectPath& path) const {
     Instance inst(path);
-    if (const ClassInfo* ci = opts.classes ? opts.classes->find(path.className()) : nullptr)
+    const bool defaults = opts.classes && opts.classDefaults;
+    if (const ClassInfo* ci = defaults ? opts.classes->find(path.className()) : nullptr)
         for (const auto& p : ci->properties)
             inst.set(p.name, p.value);
     return inst;

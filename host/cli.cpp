@@ -374,9 +374,10 @@ int cmdScript(Env& e, const CommandArgs& a) {
             if (!inv.props)
                 inv.props = e.inv.props;
             if (inv.module != d.module || inv.reg != d.reg || !inv.seeds.empty() ||
-                inv.principal != "root")
+                inv.principal != "root" || !inv.classDefaults)
                 throw ParseError(
-                    "--module, --reg, --seed and --principal are options of the whole script");
+                    "--module, --reg, --seed, --principal and --no-class-defaults are "
+                    "options of the whole script");
             if (inv.command == "script")
                 throw ParseError("a script cannot run a script");
             rc = execute(e.host, inv, e.out, e.err);
@@ -558,6 +559,9 @@ std::string usage() {
         "  -n NAMESPACE       namespace of requests and of paths without one\n"
         "  --props P1,P2,...  properties to return\n"
         "  --principal NAME   user the requests run as (default: root)\n"
+        "  --no-class-defaults\n"
+        "                     new instances start empty, not with the class defaults\n"
+        "                     (a property the module leaves unset shows as missing)\n"
         "  --seed FILE        instances for classes that no provider serves, typed:\n"
         "                       instance ns:Class.Key=\"v\" {\n"
         "                           string Key = \"v\";\n"
@@ -631,6 +635,8 @@ Invocation parseInvocation(const std::vector<std::string>& args, const Defaults&
             inv.props = splitList(value(a));
         else if (a == "--principal")
             inv.principal = value(a);
+        else if (a == "--no-class-defaults")
+            inv.classDefaults = false;
         else if (a == "-h" || a == "--help") {
             inv.command = "help";
             return inv;
@@ -690,6 +696,7 @@ int run(const std::vector<std::string>& args, std::ostream& out, std::ostream& e
     HostOptions options;
     options.principal = inv.principal;
     options.classes = inv.catalog ? inv.catalog->classes() : nullptr;
+    options.classDefaults = inv.classDefaults;
     Host host(options);
     if (!usesModule(inv.command))
         return execute(host, inv, out, err);

@@ -50,6 +50,7 @@ struct Invocation {
     std::string module, reg, nameSpace;
     std::string principal = "root";
     const ClassCatalog* catalog = nullptr;
+    bool classDefaults = true;       // --no-class-defaults
     std::vector<std::string> seeds;  // instance files for the stores
     PropertyList props;              // --props A,B
     std::string command;

@@ -131,6 +131,10 @@ struct HostOptions {
     // classes the registrations name and those declared by addSubclass.
     // Not owned; it must outlive the host.
     const ClassRepository* classes = nullptr;
+    // With classes: whether new instances start with the class defaults (as
+    // in a server) or empty, so that a property the provider leaves unset
+    // shows as missing rather than as its default.
+    bool classDefaults = true;
 };
 
 namespace detail {

@@ -73,6 +73,20 @@ TEST_F(WithClasses, NewInstancesStartWithTheClassDefaults) {
     EXPECT_EQ(valueOf(w2.instance.get("Label")), Value::null(Type::String));
 }
 
+// Without the defaults, what the provider leaves unset is missing.
+TEST_F(WithClasses, NewInstancesCanStartEmpty) {
+    HostOptions o;
+    o.classes = &classes;
+    o.classDefaults = false;
+    Host bare(o);
+    ASSERT_TRUE(bare.load(TVRN_TESTPROV_LIB, TVRN_TESTPROV_REG).ok());
+    auto r = bare.getInstance(w1);
+    ASSERT_TRUE(r.ok()) << r.toString();
+    EXPECT_EQ(r.instance.get("Colour"), nullptr);
+    EXPECT_EQ(valueOf(r.instance.get("Label")), Value::string("first"));
+    EXPECT_TRUE(bare.unload().ok());
+}
+
 TEST_F(WithClasses, SuperclassesOfServedClassesAreKnown) {
     auto refs = host->references(w1, "Test_Link");
     ASSERT_TRUE(refs.ok()) << refs.toString();

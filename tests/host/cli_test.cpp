@@ -235,7 +235,8 @@ TEST(Cli, AScriptRunsItsLinesInOneProcess) {
     const std::string file = name;
     EXPECT_NE(o.err.find("tvrncli: CMPI_RC_ERR_NOT_FOUND (6)"), std::string::npos) << o.err;
     EXPECT_NE(o.err.find(file + ":6: unclosed '"), std::string::npos) << o.err;
-    EXPECT_NE(o.err.find(file + ":7: --module, --reg, --seed and --principal"), std::string::npos)
+    EXPECT_NE(o.err.find(file + ":7: --module, --reg, --seed, --principal and --no-class-defaults"),
+              std::string::npos)
         << o.err;
     std::remove(name);
 }

@@ -13,16 +13,21 @@ answers.
 
 Options before the command: --url (default http://localhost:5988/root/tavrin),
 --tvrncli (default build/bin/tvrncli), --module (tvrncli's module; default
-/usr/local/lib/cmpi/libtvrnprovider.so, the installed one). tvrncli runs with
-the environment it is given, so LD_LIBRARY_PATH must name the same
-libdtfaj.so as the server's loader path.
+/usr/local/lib/cmpi/libtvrnprovider.so, the installed one), --seed-from
+NAMESPACE:CLASS (repeatable: the server's own instances of a class the module
+asks the server for, such as its object manager, handed to tvrncli as --seed
+so that both sides see the same server). tvrncli runs with the environment it
+is given, so LD_LIBRARY_PATH must name the same libdtfaj.so as the server's
+loader path.
 
 Answers are compared in a normal form: each instance as its sorted list of
 non-null properties (names without regard to case, numbers by value,
 booleans in lower case, references as class and sorted keys); a property
-that is null on one side must be null or absent on the other, so a class
-default that shows through where the module leaves a property null is a
-difference. Enumerations compare as sorted lists of such instances.
+that is null on one side must be null or absent on the other. tvrncli runs
+with --no-class-defaults: its instances hold only what the module sends, so
+a class default that shows through on the server where the module leaves a
+property unset is a difference. Enumerations compare as sorted lists of
+such instances.
 
 Request lines (FILE of `requests`) are tvrncli command lines: ei, ein, gi,
 ai, ain, ri, rin (with --assoc, --result-class, --role, --result-role) and
@@ -31,18 +36,23 @@ commands joined by " ; " run in one tvrncli process and one after the other
 on the server, and their answers are compared together (what a method
 changes, the next command sees). A line starting with "!" must fail on both
 sides with the same CIM status code. `let NAME = TEXT` defines $NAME for the
-lines below it; "<host>" stands for the Name of TAVRIN_ComputerSystem. A
+lines below it; "<host>" stands for the Name of TAVRIN_ComputerSystem, "<here>"
+for the directory of FILE (where the files a request reads live). Method
+arguments are written as tvrncli takes them (a reference as a quoted path,
+an array as TYPE[]:{A,B}) and passed to wbemcli in its own form. A
 line that changes the server's state must put it back, since the next line
 starts afresh on the tvrncli side.
 """
 
 import argparse
+import concurrent.futures
 import difflib
 import os
 import re
 import shlex
 import subprocess
 import sys
+import tempfile
 
 NAMESPACE = "root/tavrin"
 MODULE_FILE = "libtvrnprovider.so"
@@ -181,6 +191,27 @@ def wbemcli_instances(text):
     return instances
 
 
+def seed_instances(text):
+    """Instances printed by wbemcli with -nl as tvrncli --seed instances,
+    with their string properties."""
+    out = []
+    for line in text.splitlines():
+        if not line.strip():
+            continue
+        if not line.startswith("-"):
+            if out:
+                out.append("}")
+            out.append("instance %s {" % line[line.index("/") + 1:])
+            continue
+        name, _, value = line[1:].partition("=")
+        if value.startswith('"'):
+            text_value, end = _quoted(value, 0)
+            if end == len(value):
+                escaped = text_value.replace("\\", "\\\\").replace('"', '\\"')
+                out.append('    string %s = "%s";' % (name, escaped))
+    return out + ["}"] if out else out
+
+
 def wbemcli_paths(text):
     return ["path " + canon_path(line) for line in text.splitlines() if line.strip()]
 
@@ -246,6 +277,8 @@ class Clients:
         self.url = args.url
         self.tvrncli = args.tvrncli
         self.module = args.module
+        self.seed_from = args.seed_from
+        self.seed_dir = None
         self.host = None
 
     def _run(self, argv, input_text=None):
@@ -256,9 +289,27 @@ class Clients:
         argv = ["wbemcli", op] + list(options) + ["%s:%s" % (self.url, target)] + list(tail)
         return self._run(argv)
 
+    def seed(self):
+        """A --seed file with the server's instances of the --seed-from
+        classes (their string properties, all the module reads of them)."""
+        if self.seed_dir is None:
+            self.seed_dir = tempfile.TemporaryDirectory(prefix="check-seed-")
+            server = self.url[: self.url.rindex("/" + NAMESPACE)]
+            mof = []
+            for target in self.seed_from:
+                rc, out, err = self._run(["wbemcli", "ei", "-nl", "%s/%s" % (server, target)])
+                if rc != 0:
+                    raise Failure("the server gives no %s: %s" % (target, err.strip()))
+                mof += seed_instances(out)
+            with open(os.path.join(self.seed_dir.name, "seed.mof"), "w") as f:
+                f.write("\n".join(mof))
+        return os.path.join(self.seed_dir.name, "seed.mof")
+
     def cli(self, lines):
         """tvrncli commands (word lists) in one process."""
-        base = [self.tvrncli, "--module", self.module]
+        base = [self.tvrncli, "--module", self.module, "--no-class-defaults"]
+        if self.seed_from:
+            base += ["--seed", self.seed()]
         if len(lines) == 1:
             return self._run(base + lines[0])
         script = "\n".join(" ".join(shlex.quote(w) for w in words) for words in lines) + "\n"
@@ -298,6 +349,28 @@ def _split_options(words):
     return positional, options
 
 
+_TYPED = re.compile(r"^[a-z]+[0-9]*(\[\])?:(.*)$")
+_PATH = re.compile(r"^[A-Za-z_]\w*\.[A-Za-z_]\w*=")
+
+
+def wbemcli_argument(arg):
+    """A method argument as tvrncli takes it (NAME=VALUE, VALUE typed as
+    TYPE:V or TYPE[]:{A,B}, a reference as a quoted path) as wbemcli takes
+    it: arrays as A,B, references as a bare path (wbemcli types the
+    arguments from the class)."""
+    name, _, value = arg.partition("=")
+    m = _TYPED.match(value)
+    if m:
+        value = m.group(2)
+        if m.group(1) and value.startswith("{") and value.endswith("}"):
+            value = value[1:-1]
+    elif value.startswith('"'):
+        text, end = _quoted(value, 0)
+        if end == len(value):
+            value = text if _PATH.match(text) else '"%s"' % text
+    return "%s=%s" % (name, value)
+
+
 def ask_server(clients, words):
     """(status code, answer) of one command asked through wbemcli: code 0
     and the answer in normal form, or the CIM status code and the message."""
@@ -310,7 +383,12 @@ def ask_server(clients, words):
         rc, out, err = clients.wbemcli(op, positional[0], options)
         read = wbemcli_paths
     elif op == "cm":
-        method, args = positional[1], positional[2:]
+        method, args = positional[1], [wbemcli_argument(a) for a in positional[2:]]
+        # wbemcli reads a reference's keys up to the end of the text.
+        paths = [a for a in args if _PATH.match(a.partition("=")[2])]
+        if len(paths) > 1:
+            raise Failure("wbemcli takes one reference argument, last: %s" % " ".join(words))
+        args = [a for a in args if a not in paths] + paths
         call = method + ("." + ",".join(args) if args else "")
         rc, out, err = clients.wbemcli("cm", positional[0], ["-nl"], [call])
         read = lambda text: wbemcli_method(text, method)  # noqa: E731
@@ -360,25 +438,38 @@ def read_list(path):
 
 
 def check_classes(clients, path, get_each):
-    ok, count = True, 0
-    for _, cls in read_list(path):
-        code, server = ask_server(clients, ["ei", cls])
-        ecode, embedded = ask_embedded(clients, [["ei", cls]])
-        if code or ecode:
-            ok = compare("ei %s" % cls, (code, server), (ecode, embedded)) and ok
-            continue
-        ok = compare("ei %s" % cls, sorted(server), sorted(embedded)) and ok
-        count += len(server)
-        if not get_each:
-            continue
-        rc, out, err = clients.wbemcli("ein", cls)
-        names = [line for line in out.splitlines() if line.strip()]
-        if rc != 0 or len(names) != len(server):
-            print("DIFFERS: ein %s gives %d paths for %d instances: %s"
-                  % (cls, len(names), len(server), err.strip()))
-            ok = False
-        for name in names:
-            rc, out, err = clients._run(["wbemcli", "gi", "-nl", "http://" + name])
+    classes = [cls for _, cls in read_list(path)]
+    if clients.seed_from:
+        clients.seed()  # once, before the threads
+
+    def ask(cls):
+        server = ask_server(clients, ["ei", cls])
+        embedded = ask_embedded(clients, [["ei", cls]])
+        return server, embedded, clients.wbemcli("ein", cls) if get_each else None
+
+    def get(name):
+        return clients._run(["wbemcli", "gi", "-nl", "http://" + name])
+
+    # One client process a question: several at a time, which the server
+    # answers side by side; the answers are compared in the list's order.
+    ok, count, gets = True, 0, []
+    with concurrent.futures.ThreadPoolExecutor(max_workers=4) as pool:
+        for cls, ((code, server), (ecode, embedded), names) in zip(classes, pool.map(ask, classes)):
+            if code or ecode:
+                ok = compare("ei %s" % cls, (code, server), (ecode, embedded)) and ok
+                continue
+            ok = compare("ei %s" % cls, sorted(server), sorted(embedded)) and ok
+            count += len(server)
+            if not get_each:
+                continue
+            rc, out, err = names
+            paths = [line for line in out.splitlines() if line.strip()]
+            if rc != 0 or len(paths) != len(server):
+                print("DIFFERS: ein %s gives %d paths for %d instances: %s"
+                      % (cls, len(paths), len(server), err.strip()))
+                ok = False
+            gets += [(name, server) for name in paths]
+        for (name, server), (rc, out, err) in zip(gets, pool.map(get, [g[0] for g in gets])):
             got = wbemcli_instances(out) if rc == 0 else []
             if len(got) != 1 or got[0] not in server:
                 print("DIFFERS: gi %s: %s" % (name, err.strip() or "\n".join(got)))
@@ -396,6 +487,7 @@ def check_requests(clients, path):
             continue
         text = re.sub(r"\$(\w+)", lambda v: variables[v.group(1)], line)
         text = text.replace("<host>", clients.host_name())
+        text = text.replace("<here>", os.path.dirname(os.path.abspath(path)))
         must_fail = text.startswith("!")
         commands = [shlex.split(part) for part in text.lstrip("!").split(" ; ")]
         what = "%s:%d: %s" % (os.path.basename(path), number, line)
@@ -440,6 +532,7 @@ def main(argv):
     ap.add_argument("--url", default="http://localhost:5988/" + NAMESPACE)
     ap.add_argument("--tvrncli", default="build/bin/tvrncli")
     ap.add_argument("--module", default="/usr/local/lib/cmpi/" + MODULE_FILE)
+    ap.add_argument("--seed-from", action="append", default=[], metavar="NAMESPACE:CLASS")
     sub = ap.add_subparsers(dest="command", required=True)
     c = sub.add_parser("classes")
     c.add_argument("file")
