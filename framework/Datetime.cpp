@@ -158,6 +158,11 @@ bool Datetime::set(const char* text) {
     if (!_str_to_uint32(text + 8, 2, hours) || !_str_to_uint32(text + 10, 2, minutes) ||
         !_str_to_uint32(text + 12, 2, seconds) || !_str_to_uint32(text + 15, 6, microseconds))
         return false;
+    // A field out of its range would be carried into the next (a month 00
+    // into the year before), and the text written back would not be a
+    // date-time a server takes.
+    if (hours > 23 || minutes > 59 || seconds > 59)
+        return false;
 
     char kind = text[21];
     if (kind == ':') {
@@ -173,6 +178,8 @@ bool Datetime::set(const char* text) {
     uint32 year, month, day, utc;
     if (!_str_to_uint32(text, 4, year) || !_str_to_uint32(text + 4, 2, month) ||
         !_str_to_uint32(text + 6, 2, day) || !_str_to_uint32(text + 22, 3, utc))
+        return false;
+    if (month < 1 || month > 12 || day < 1 || day > 31)
         return false;
     time_t t;
     if (!_to_seconds(year, month, day, hours, minutes, seconds, t))

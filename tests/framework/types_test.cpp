@@ -257,6 +257,13 @@ TEST(Datetime, MalformedTextIsRejectedAndLeavesTheValue) {
         "00000001020304.000005:001",   // interval not ending in 000
         "0000000102030X.000005:000",   // letter in an interval
         "20240131235959.123456*060",   // neither ':', '+' nor '-'
+        "00000000000000.000000+000",   // month and day 00
+        "20241301000000.000000+000",   // month 13
+        "20240132000000.000000+000",   // day 32
+        "20240131240000.000000+000",   // hour 24
+        "99999999990000.000000:000",   // interval of 99 hours
+        "00000000006000.000000:000",   // 60 minutes
+        "00000000000060.000000:000",   // 60 seconds
     };
     Datetime d("20240131235959.123456+060");
     Datetime before(d);
