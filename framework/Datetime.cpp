@@ -59,7 +59,10 @@ bool _to_seconds(uint32 year, uint32 month, uint32 day, uint32 hours, uint32 min
     tm.tm_isdst = -1;
     errno = 0;
     t = mktime(&tm);
-    return !(t == time_t(-1) && errno == EOVERFLOW);
+    // A day the month does not have (February 30) is carried into the next
+    // month; such a date is refused.
+    return !(t == time_t(-1) && errno == EOVERFLOW) && tm.tm_mday == int(day) &&
+           tm.tm_mon == int(month) - 1;
 }
 
 uint64 _to_usec(time_t t, uint32 microseconds) {
