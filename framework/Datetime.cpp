@@ -59,7 +59,10 @@ bool _to_seconds(uint32 year, uint32 month, uint32 day, uint32 hours, uint32 min
     tm.tm_isdst = -1;
     errno = 0;
     t = mktime(&tm);
-    return !(t == time_t(-1) && errno == EOVERFLOW);
+    // A day the month does not have (February 30) is carried into the next
+    // month; such a date is refused.
+    return !(t == time_t(-1) && errno == EOVERFLOW) && tm.tm_mday == int(day) &&
+           tm.tm_mon == int(month) - 1;
 }
 
 uint64 _to_usec(time_t t, uint32 microseconds) {
@@ -158,6 +161,11 @@ bool Datetime::set(const char* text) {
     if (!_str_to_uint32(text + 8, 2, hours) || !_str_to_uint32(text + 10, 2, minutes) ||
         !_str_to_uint32(text + 12, 2, seconds) || !_str_to_uint32(text + 15, 6, microseconds))
         return false;
+    // A field out of its range would be carried into the next (a month 00
+    // into the year before), and the text written back would not be a
+    // date-time a server takes.
+    if (hours > 23 || minutes > 59 || seconds > 59)
+        return false;
 
     char kind = text[21];
     if (kind == ':') {
@@ -173,6 +181,8 @@ bool Datetime::set(const char* text) {
     uint32 year, month, day, utc;
     if (!_str_to_uint32(text, 4, year) || !_str_to_uint32(text + 4, 2, month) ||
         !_str_to_uint32(text + 6, 2, day) || !_str_to_uint32(text + 22, 3, utc))
+        return false;
+    if (month < 1 || month > 12 || day < 1 || day > 31)
         return false;
     time_t t;
     if (!_to_seconds(year, month, day, hours, minutes, seconds, t))

@@ -161,7 +161,7 @@ const Meta_Reference* find_reference(const Meta_Method* meta_method, const char*
         _find(meta_method->meta_features, meta_method->num_meta_features, name, FIND_REFERENCE));
 }
 
-bool __has_feature(const Meta_Class* meta_class, uint32 flags) {
+bool has_feature(const Meta_Class* meta_class, uint32 flags) {
     if (!meta_class)
         return false;
     for (size_t i = 0; i < meta_class->num_meta_features; i++) {

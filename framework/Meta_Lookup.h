@@ -43,7 +43,7 @@ const Meta_Feature* find_parameter(const Meta_Method* meta_method, const char* n
 const Meta_Reference* find_reference(const Meta_Method* meta_method, const char* name);
 
 // Whether any feature of the class has one of the flag bits.
-bool __has_feature(const Meta_Class* meta_class, uint32 flags);
+bool has_feature(const Meta_Class* meta_class, uint32 flags);
 
 // The superclass, or null for a root class and for a method record (whose
 // meta-data ends after the fields it shares with a class).

@@ -96,6 +96,12 @@ bool digitsAt(std::string_view s, size_t pos, size_t n, std::uint64_t& out) {
 
 constexpr std::uint64_t kUsecPerSec = 1000000;
 
+std::uint64_t daysInMonth(std::uint64_t year, std::uint64_t month) {
+    static const std::uint64_t days[] = {31, 28, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    const bool leap = (year % 4 == 0 && year % 100 != 0) || year % 400 == 0;
+    return month == 2 && leap ? 29 : days[month - 1];
+}
+
 }  // namespace
 
 DateTime::DateTime() : text_("00000000000000.000000:000") {}
@@ -121,7 +127,8 @@ std::optional<DateTime> DateTime::parse(std::string_view s) {
         std::uint64_t month, day;
         digitsAt(s, 4, 2, month);
         digitsAt(s, 6, 2, day);
-        if (month < 1 || month > 12 || day < 1 || day > 31)
+        digitsAt(s, 0, 4, f[6]);
+        if (month < 1 || month > 12 || day < 1 || day > daysInMonth(f[6], month))
             return std::nullopt;
     }
     return DateTime(std::string(s));

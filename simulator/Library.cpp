@@ -89,9 +89,9 @@ std::vector<Fault> parseFaults(const Json::Value& list) {
                 kind = k.kind;
         if ((f.isMember("key") && !f["key"].isString()) ||
             (f.isMember("text") && !f["text"].isString()) ||
-            (f.isMember("code") && !f["code"].isIntegral()) ||
-            (f.isMember("times") && !f["times"].isIntegral()) ||
-            (f.isMember("skip") && !f["skip"].isIntegral()))
+            (f.isMember("code") && !f["code"].isInt()) ||
+            (f.isMember("times") && !f["times"].isInt()) ||
+            (f.isMember("skip") && !f["skip"].isInt()))
             throw FixtureError(
                 where +
                 ": \"key\" and \"text\" are texts, \"code\", \"times\" and \"skip\" integers");

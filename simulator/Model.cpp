@@ -282,8 +282,8 @@ void Model::load(const Json::Value& fixture) {
         if (r.isMember(name))
             objectMember(r, name, "fixture");
     if (r.isMember("diagnosticDurationMs") &&
-        (!r["diagnosticDurationMs"].isIntegral() || r["diagnosticDurationMs"].asLargestInt() < 0 ||
-         r["diagnosticDurationMs"].asLargestInt() > 3600000))
+        (!r["diagnosticDurationMs"].isInt() || r["diagnosticDurationMs"].asInt() < 0 ||
+         r["diagnosticDurationMs"].asInt() > 3600000))
         fail("fixture.diagnosticDurationMs", "must be a number of milliseconds");
     Json::Value& events = arrayMember(r, "events", "fixture");
     for (Json::ArrayIndex i = 0; i < events.size(); ++i)
@@ -406,11 +406,13 @@ bool Model::wwnInUse(const std::string& key) const {
 
 namespace {
 
+const unsigned long long kMaxGenerated = 250000;
+
 unsigned param(const Json::Value& g, const char* name, unsigned dflt, unsigned max) {
     if (!g.isMember(name))
         return dflt;
     const Json::Value& v = g[name];
-    if (!v.isIntegral() || v.asLargestInt() < 0 || v.asLargestUInt() > max)
+    if (!v.isUInt() || v.asUInt() > max)
         fail(at("generate", name), "must be an integer from 0 to " + std::to_string(max));
     return v.asUInt();
 }
@@ -454,6 +456,12 @@ Json::Value generateAdapters(const Json::Value& g) {
         fail("generate.tapeTargetsPerPort", "cannot exceed targetsPerPort");
     if (fcHbas + cnas > 4096)
         fail("generate", "at most 4096 adapters");
+    // Ten times the large SAN of the fixtures; beyond, a host would take
+    // gigabytes to describe.
+    const unsigned long long perPort = 1ull + targets * (1ull + luns) + initiators;
+    if ((fcHbas + cnas) * ports * perPort > kMaxGenerated)
+        fail("generate",
+             "at most " + std::to_string(kMaxGenerated) + " ports, remote ports and LUNs in all");
 
     Json::Value out(Json::arrayValue);
     for (unsigned a = 0; a < fcHbas + cnas; ++a) {

@@ -4,6 +4,10 @@
 #   tools/dev.sh run    install missing packages, build, and run the main job
 #   tools/dev.sh test   install missing packages, build, and run the whole test suite
 #   tools/dev.sh build  install missing packages and build only
+#   tools/dev.sh fuzz [SECONDS] [TARGET...]
+#                       install clang and libFuzzer, build the fuzz targets in
+#                       build-fuzz/ and run each (or the ones named) for
+#                       SECONDS (default 45) with the sanitizers on
 #   tools/dev.sh server sfcb|pegasus
 #                       install the prebuilt CIM server of the shared directory
 #                       beside the repository (../shared, else /work/shared)
@@ -11,7 +15,8 @@
 #                       client wbemcli (for the integration tests, as root)
 #
 # Environment:
-#   TVRN_BUILD_DIR    build directory (default: build at the repository root)
+#   TVRN_BUILD_DIR    build directory (default: build at the repository root;
+#                     build-fuzz for the fuzz mode)
 #   TVRN_CMAKE_ARGS   extra arguments for the CMake configure step
 #                     (for example -DTVRN_SANITIZE=ON)
 #   TVRN_JOBS         parallel build jobs (default: 2)
@@ -94,6 +99,19 @@ install_server() {
   echo "Installed ${tarballs[0]##*/} under $dir"
 }
 
+# The fuzz build: clang with libFuzzer, AddressSanitizer and UBSan.
+fuzz_packages=(clang-14 libfuzzer-14-dev)
+
+fuzz() {
+  local dir=${TVRN_BUILD_DIR:-$root/build-fuzz}
+  install_missing "${packages[@]}" "${fuzz_packages[@]}"
+  # shellcheck disable=SC2086
+  cmake -S "$root" -B "$dir" -DTVRN_FUZZ=ON -DCMAKE_C_COMPILER=clang-14 \
+        -DCMAKE_CXX_COMPILER=clang++-14 ${TVRN_CMAKE_ARGS:-} >/dev/null
+  cmake --build "$dir" -j "$jobs" --target fuzzers
+  TVRN_FUZZ_BUILD_DIR=$dir "$root/tools/fuzz.sh" "$@"
+}
+
 main_job() {
   "$root/tools/main-job.sh" "$build"
 }
@@ -103,6 +121,7 @@ case "$mode" in
   test)  install_missing "${packages[@]}"; configure_and_build
          ctest --test-dir "$build" --output-on-failure -j "$jobs" ;;
   build) install_missing "${packages[@]}"; configure_and_build ;;
+  fuzz)  shift; fuzz "$@" ;;
   server) install_server "${2:-}" ;;
-  *) echo "usage: $0 run|test|build|server sfcb|pegasus" >&2; exit 2 ;;
+  *) echo "usage: $0 run|test|build|fuzz [SECONDS] [TARGET...]|server sfcb|pegasus" >&2; exit 2 ;;
 esac

@@ -57,7 +57,7 @@ TEST(Meta, LookUpsIgnoreCaseAndFollowAncestry) {
     EXPECT_EQ(nullptr, find_reference(ASSOC, "Note"));
     // A redeclared feature resolves to the subclass's record.
     EXPECT_NE(find_property(BASE, "Caption"), find_property(SUB, "caption"));
-    EXPECT_TRUE(__has_feature(BASE, FLAG_METHOD | FLAG_REFERENCE));
+    EXPECT_TRUE(has_feature(BASE, FLAG_METHOD | FLAG_REFERENCE));
 }
 
 TEST(Instance, CreateWithAndWithoutDefaults) {

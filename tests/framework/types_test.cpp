@@ -212,7 +212,7 @@ TEST(Datetime, TextRoundTrips) {
         "20240131235959.123456+060",  // winter
         "20240715120000.000001+120",  // summer
         "19600101000000.000000+000",  // before the epoch
-        "20000229060708.999999-300",
+        "20000229060708.999999-300",  // leap day
         "00000001020304.000005:000",  // interval
     };
     for (const char* text : texts) {
@@ -257,6 +257,15 @@ TEST(Datetime, MalformedTextIsRejectedAndLeavesTheValue) {
         "00000001020304.000005:001",   // interval not ending in 000
         "0000000102030X.000005:000",   // letter in an interval
         "20240131235959.123456*060",   // neither ':', '+' nor '-'
+        "00000000000000.000000+000",   // month and day 00
+        "20241301000000.000000+000",   // month 13
+        "20240132000000.000000+000",   // day 32
+        "20260229000000.000000+000",   // February 29 of a common year
+        "20240431000000.000000+000",   // April 31
+        "20240131240000.000000+000",   // hour 24
+        "99999999990000.000000:000",   // interval of 99 hours
+        "00000000006000.000000:000",   // 60 minutes
+        "00000000000060.000000:000",   // 60 seconds
     };
     Datetime d("20240131235959.123456+060");
     Datetime before(d);

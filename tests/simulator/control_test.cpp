@@ -267,7 +267,14 @@ TEST_F(Control, BadFixturesGiveClearErrors) {
         {R"({"adapters": [{"hbaData": {"model": "X", "wwn": "10:00:00:05:1e:0a:0b:0c"}, "ethPorts": [{"ethData": {"mac": "00:05:1e:00:00:01"}}]}]})",
          "CNA"},
         {R"({"generate": {"fcHbas": -1}})", "generate.fcHbas"},
+        {R"({"generate": {"cnas": 18446744073709551615}})", "generate.cnas"},
+        {R"({"generate": {"fcHbas": 4096, "targetsPerPort": 65535, "lunsPerTarget": 16384}})",
+         "ports, remote ports and LUNs in all"},
+        {R"({"diagnosticDurationMs": 9223372036854775808})", "diagnosticDurationMs"},
         {R"({"faults": [{"entryPoint": "getHost", "kind": "explode"}]})", "faults[0]"},
+        {R"({"faults": [{"entryPoint": "getHost", "kind": "null", "code": 10000000000}]})",
+         "faults[0]"},
+        {R"({"faults": [{"entryPoint": "getHost", "kind": "null", "times": 1e12}]})", "faults[0]"},
         {R"({"version": 3})", "version"},
     };
     for (const Case& c : cases) {
