@@ -36,9 +36,8 @@ Array<Instance*> softwareUpdate(classId_t id) {
     return SoftwareUpdateHelper::getSoftwareUpdateHelperInstance()->getInstancesByClass(host, id);
 }
 
-// The routes without a builder belong to helpers still to come: the
-// diagnostics (21 to 28, 31 to 33). The server profile (10 to 15, 17, 37)
-// lives above the inventory and fills its routes when the module loads
+// The server profile (10 to 15, 17, 37) and the diagnostics (21 to 28, 31
+// to 33) live above the inventory and fill their routes when the module loads
 // (fillRoute).
 InventoryRoute kFCHBARoutes[] = {
     {CID_COMPUTER_SYSTEM, CID_COMPUTER_SYSTEM, false, computerSystem},

@@ -13,6 +13,7 @@
 
 #include <json/json.h>
 
+#include "diagnostics/DiagnosticHelper.h"
 #include "framework/Meta_Lookup.h"
 #include "framework/Slot.h"
 #include "gateway/HbaAgentError.h"
@@ -24,6 +25,10 @@
 #include "schema/generated/TAVRIN_AlarmDevice.h"
 #include "schema/generated/TAVRIN_CIMXMLCommunicationMechanism.h"
 #include "schema/generated/TAVRIN_ComputerSystem.h"
+#include "schema/generated/TAVRIN_ConcreteJob.h"
+#include "schema/generated/TAVRIN_DiagnosticSoftwareIdentity.h"
+#include "schema/generated/TAVRIN_DiagnosticTest.h"
+#include "schema/generated/TAVRIN_EthLoopbackDiagnosticTest.h"
 #include "schema/generated/TAVRIN_EthernetPort.h"
 #include "schema/generated/TAVRIN_FCPort.h"
 #include "schema/generated/TAVRIN_FCPortStatistics.h"
@@ -31,8 +36,11 @@
 #include "schema/generated/TAVRIN_HBASoftwareInstallationServiceCapabilities.h"
 #include "schema/generated/TAVRIN_LANEndpoint.h"
 #include "schema/generated/TAVRIN_LogicalPortGroup.h"
+#include "schema/generated/TAVRIN_LoopbackDiagnosticTest.h"
+#include "schema/generated/TAVRIN_MemoryDiagnosticTest.h"
 #include "schema/generated/TAVRIN_Namespace.h"
 #include "schema/generated/TAVRIN_ObjectManager.h"
+#include "schema/generated/TAVRIN_PCILoopbackDiagnosticTest.h"
 #include "schema/generated/TAVRIN_PhysicalConnector.h"
 #include "schema/generated/TAVRIN_PhysicalPackage.h"
 #include "schema/generated/TAVRIN_PortController.h"
@@ -82,6 +90,15 @@ const Meta_Class* class_of(classId_t id) {
         case CID_LAN_ENDPOINT: return &TAVRIN_LANEndpoint::static_meta_class;
         case CID_PHYSICAL_CONNECTOR: return &TAVRIN_PhysicalConnector::static_meta_class;
         case CID_ALARM_DEVICE: return &TAVRIN_AlarmDevice::static_meta_class;
+        case CID_MEMORY_DIAGNOSTIC_TEST: return &TAVRIN_MemoryDiagnosticTest::static_meta_class;
+        case CID_LOOPBACK_DIAGNOSTIC_TEST: return &TAVRIN_LoopbackDiagnosticTest::static_meta_class;
+        case CID_PCI_LOOPBACK_DIAGNOSTIC_TEST:
+            return &TAVRIN_PCILoopbackDiagnosticTest::static_meta_class;
+        case CID_ETH_LOOPBACK_DIAGNOSTIC_TEST:
+            return &TAVRIN_EthLoopbackDiagnosticTest::static_meta_class;
+        case CID_DIAGNOSTIC_SOFTWARE_IDENTITY:
+            return &TAVRIN_DiagnosticSoftwareIdentity::static_meta_class;
+        case CID_CONCRETE_JOB: return &TAVRIN_ConcreteJob::static_meta_class;
         default: return nullptr;
     }
 }
@@ -196,6 +213,7 @@ private:
     Fetched _nothing;
 
     uint32 _offsets[Pairing::MAX_ENDS];
+    const Instance* _picked_walked = nullptr;
     const Instance* _picked[Pairing::MAX_ENDS];
     size_t _positions[Pairing::MAX_ENDS];
 
@@ -224,6 +242,11 @@ bool Pairing_Run::find_roles() {
 void Pairing_Run::fetch_request_set(uint8 set) {
     const Endpoint_Set& s = _rule.sets[set];
     std::unique_ptr<Fetched> fetched(new Fetched());
+    if (s.source == Source::DIAGNOSTIC_TESTS) {
+        Array<Instance*> tests =
+            DiagnosticHelper::getDiagnosticHelperObject()->getDiagnosticServices();
+        fetched->take(tests, 0, &TAVRIN_DiagnosticTest::static_meta_class);
+    }
     for (uint8 part = 0; part < 2; part++) {
         classId_t id = s.ids[part];
         if (id == CID_NONE)
@@ -333,6 +356,7 @@ Enum_Instances_Status Pairing_Run::run() {
             continue;
         if (!select_element_sets(instance))
             continue;
+        _picked_walked = instance;
         const Association_End& first = _rule.ends[0];
         if (first.set == Pairing::ITERATED) {
             _picked[0] = instance;
@@ -360,7 +384,10 @@ void Pairing_Run::pair_from(size_t end) {
     const Fetched* set = _current[_rule.ends[end].set];
     std::vector<uint32> found;
     candidates(end, found);
+    const Walk_Filter keep = _rule.ends[end].walk_filter;
     for (uint32 j : found) {
+        if (keep != nullptr && !keep(_picked_walked, set->at(j)))
+            continue;
         _picked[end] = set->at(j);
         _positions[end] = j;
         pair_from(end + 1);

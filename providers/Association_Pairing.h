@@ -34,7 +34,9 @@
 //   with_all           every such instance, in set order;
 //   at_same_position   the instance at the same position in its set as the end
 //                      before, when their keys are equal; no other is tried.
-// Keys are compared without regard to case unless exact() is given. Key
+// only() keeps the partners a filter accepts, only_for_walked() those a filter
+// accepts for the walked instance. Keys are compared without regard to case
+// unless exact() is given. Key
 // matches are looked up in an index of the set built once, so a request costs
 // time in proportion to the instances it reads and delivers.
 //
@@ -103,6 +105,8 @@ private:
 
 typedef void (*Key_Function)(Key_Sink& keys, const Instance* instance);
 typedef bool (*Instance_Filter)(const Instance* instance);
+// A filter that also sees the instance being walked.
+typedef bool (*Walk_Filter)(const Instance* walked, const Instance* instance);
 
 // The key of an instance: the value of one of its properties (a text, or an
 // integer in decimal; a null value gives no key), or what a function derives.
@@ -121,8 +125,9 @@ constexpr Key key(Key_Function derive) {
 // Where a set comes from.
 enum class Source : uint8 {
     NONE,
-    INVENTORY,        // FCHBAManager::getInstances of its class ids
-    HOST_DISCOVERED,  // HDRManager::getInstances of its class ids
+    INVENTORY,         // FCHBAManager::getInstances of its class ids
+    HOST_DISCOVERED,   // HDRManager::getInstances of its class ids
+    DIAGNOSTIC_TESTS,  // DiagnosticHelper::getDiagnosticServices: every test offered
     // Per element, selected by a key of the walked instance:
     FC_PORTS_OF_ADAPTER,              // FCHBAManager::getFCPortInstancesByAdapter(key)
     ETHERNET_PORTS_OF_ADAPTER,        // FCHBAManager::getEthernetPortInstancesByAdapter(key)
@@ -161,6 +166,7 @@ struct Association_End {
     Key outer;               // key of the end before it
     Key inner;               // key of this end
     bool exact;
+    Walk_Filter walk_filter;  // null: every partner
 };
 
 // A read-only view of the request-wide sets, for a rule's report().
@@ -220,6 +226,10 @@ struct Pairing {
     constexpr Pairing fetch_discovered(classId_t id, classId_t then = CID_NONE) const {
         return with_set(Endpoint_Set{Source::HOST_DISCOVERED, {id, then}, Key{nullptr, nullptr}});
     }
+    constexpr Pairing fetch_diagnostic_tests() const {
+        return with_set(
+            Endpoint_Set{Source::DIAGNOSTIC_TESTS, {CID_NONE, CID_NONE}, Key{nullptr, nullptr}});
+    }
     constexpr Pairing fetch_for_each(Source source, Key selector) const {
         return with_set(Endpoint_Set{source, {CID_NONE, CID_NONE}, selector});
     }
@@ -267,20 +277,23 @@ struct Pairing {
     constexpr Pairing as(const char* role) const { return pair(ITERATED, role); }
     constexpr Pairing pair(uint8 set, const char* role) const {
         return with_end(Association_End{role, set, nullptr, Match::EVERY, Key{nullptr, nullptr},
-                                        Key{nullptr, nullptr}, false});
+                                        Key{nullptr, nullptr}, false, nullptr});
     }
     constexpr Pairing with_every(uint8 set, const char* role) const {
         return with_end(Association_End{role, set, nullptr, Match::EVERY, Key{nullptr, nullptr},
-                                        Key{nullptr, nullptr}, false});
+                                        Key{nullptr, nullptr}, false, nullptr});
     }
     constexpr Pairing with_first(uint8 set, const char* role, Key outer, Key inner) const {
-        return with_end(Association_End{role, set, nullptr, Match::FIRST, outer, inner, false});
+        return with_end(
+            Association_End{role, set, nullptr, Match::FIRST, outer, inner, false, nullptr});
     }
     constexpr Pairing with_all(uint8 set, const char* role, Key outer, Key inner) const {
-        return with_end(Association_End{role, set, nullptr, Match::ALL, outer, inner, false});
+        return with_end(
+            Association_End{role, set, nullptr, Match::ALL, outer, inner, false, nullptr});
     }
     constexpr Pairing at_same_position(uint8 set, const char* role, Key outer, Key inner) const {
-        return with_end(Association_End{role, set, nullptr, Match::POSITION, outer, inner, false});
+        return with_end(
+            Association_End{role, set, nullptr, Match::POSITION, outer, inner, false, nullptr});
     }
     // The last end: keys compared exactly / only instances the filter keeps.
     constexpr Pairing exact() const {
@@ -291,6 +304,12 @@ struct Pairing {
     constexpr Pairing only(Instance_Filter filter) const {
         Pairing p = *this;
         p.ends[p.num_ends - 1].filter = filter;
+        return p;
+    }
+    // The last end: only partners that keep(walked instance, partner) accepts.
+    constexpr Pairing only_for_walked(Walk_Filter keep) const {
+        Pairing p = *this;
+        p.ends[p.num_ends - 1].walk_filter = keep;
         return p;
     }
 
