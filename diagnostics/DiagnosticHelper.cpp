@@ -102,17 +102,9 @@ String fullTestName(diag_test_id_t testId) {
     return String(kVendor, ":", kTestNames[testId]);
 }
 
-// The DeviceID of an element instance, or "".
-String deviceIdOf(const Instance* instance) {
-    const Meta_Property* mp = find_property(instance->meta_class, "DeviceID");
-    if (mp == nullptr || mp->type != STRING || mp->subscript != 0)
-        return String();
-    const auto* p = reinterpret_cast<const Property<String>*>(__slot(instance, mp->offset));
-    return p->null ? String() : p->value;
-}
-
-String elementNameOf(const Instance* instance) {
-    const Meta_Property* mp = find_property(instance->meta_class, "ElementName");
+// A text property of an element (DeviceID, ElementName), or "".
+String textOf(const Instance* instance, const char* name) {
+    const Meta_Property* mp = find_property(instance->meta_class, name);
     if (mp == nullptr || mp->type != STRING || mp->subscript != 0)
         return String();
     const auto* p = reinterpret_cast<const Property<String>*>(__slot(instance, mp->offset));
@@ -153,7 +145,7 @@ public:
         }
         const Array<Instance*>& all = instancesOf(elementClass);
         for (size_t i = 0; i < all.size(); i++)
-            if (all[i] != nullptr && deviceIdOf(all[i]).equali(*key))
+            if (all[i] != nullptr && textOf(all[i], "DeviceID").equali(*key))
                 return all[i];
         return nullptr;
     }
@@ -508,7 +500,8 @@ Array<Instance*> DiagnosticHelper::recordInstances(bool service) {
     for (const DiagnosticRecord& record : copyRecords(service)) {
         const Instance* element = elements.find(record.elementClass, record.adapterAddress,
                                                 record.portWwn, record.portMac);
-        out.add(getDiagnosticRecordInstance(record, element ? elementNameOf(element) : String()));
+        out.add(getDiagnosticRecordInstance(record,
+                                            element ? textOf(element, "ElementName") : String()));
     }
     return out.release();
 }
@@ -576,8 +569,8 @@ Array<Instance*> DiagnosticHelper::recordAssociations(bool service) {
             continue;
         }
         out.add(associate(meta, "Antecedent",
-                          getDiagnosticRecordInstance(record, elementNameOf(element)), "Dependent",
-                          element));
+                          getDiagnosticRecordInstance(record, textOf(element, "ElementName")),
+                          "Dependent", element));
     }
     return out.release();
 }

@@ -36,9 +36,9 @@
 //                      before, when their keys are equal; no other is tried.
 // only() keeps the partners a filter accepts, only_for_walked() those a filter
 // accepts for the walked instance. Keys are compared without regard to case
-// unless exact() is given. Key
-// matches are looked up in an index of the set built once, so a request costs
-// time in proportion to the instances it reads and delivers.
+// unless exact() is given. Key matches are looked up in an index of the set
+// built once, so a request costs time in proportion to the instances it reads
+// and delivers.
 //
 // Instances of a set that are null or of a class the source does not make are
 // skipped, but keep their place (positions and counts are those of the
