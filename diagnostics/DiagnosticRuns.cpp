@@ -319,54 +319,43 @@ private:
             completion(REC_UNKNOWN_FAILURE, COMPLETION_FAILED, LL_ERR);
     }
 
-    void loopbackTest() {
-        service(REC_CHECK_PORT_DISABLED);
-        if (!portOffline(true))
+    // The FC and the Ethernet loopback test differ only in their texts, their
+    // library entry and the FC test's settling pauses.
+    struct Loopback_Kind {
+        diag_record_msg_t check, running, checking, passed, failed;
+        const char* pointer;
+        JsonReqFP* entry;
+        bool fc;  // sends the speed and pauses
+        const char* status;
+    };
+    static const Loopback_Kind kFcLoopback, kEthLoopback;
+
+    void loopbackTest() { loopback(kFcLoopback); }
+    void ethLoopbackTest() { loopback(kEthLoopback); }
+
+    void loopback(const Loopback_Kind& kind) {
+        service(kind.check);
+        if (!portOffline(kind.fc))
             return;
-        service(REC_RUNNING_LOOPBACK);
+        service(kind.running);
         Json::Value request(Json::objectValue);
         request["portWwn"] = jsonText(colonForm(port()));
         request["mode"] = _in.mode;
-        request["speed"] = _in.speed;
+        if (kind.fc)
+            request["speed"] = _in.speed;
         request["dataPattern"] = _in.dataPattern;
         request["frameCount"] = _in.frameCount;
         Json::Value answer;
-        const Test_Outcome outcome =
-            callTest("libDiagLoopbackTest", libDiagLoopbackTest, request, answer);
-        _helper.pause(_in.pauseUsec);
-        elementOnline(true);
-        service(REC_CHECKING_LOOPBACK);
-        report(outcome, answer, REC_LOOPBACK_PASSED, REC_LOOPBACK_FAILED,
-               "Loopback test run status : %s");
-    }
-
-    void ethLoopbackTest() {
-        service(REC_CHECK_PORT_DISABLED_ETH);
-        if (!portOffline(false))
-            return;
-        service(REC_RUNNING_ETH_LOOPBACK);
-        Json::Value request(Json::objectValue);
-        request["portWwn"] = jsonText(colonForm(_in.portMac));
-        request["mode"] = _in.mode;
-        request["frameCount"] = _in.frameCount;
-        request["dataPattern"] = _in.dataPattern;
-        Json::Value answer;
-        const Test_Outcome outcome =
-            callTest("libDiagEthLoopbackTest", libDiagEthLoopbackTest, request, answer);
-        elementOnline(false);
-        service(REC_CHECKING_ETH_LOOPBACK);
-        report(outcome, answer, REC_ETH_LOOPBACK_PASSED, REC_ETH_LOOPBACK_FAILED,
-               "EthLoopback test run status : %s");
-    }
-
-    // The outcome of an FC or Ethernet loopback test.
-    void report(Test_Outcome outcome, const Json::Value& answer, diag_record_msg_t passed,
-                diag_record_msg_t failed, const char* statusLine) {
+        const Test_Outcome outcome = callTest(kind.pointer, *kind.entry, request, answer);
+        if (kind.fc)
+            _helper.pause(_in.pauseUsec);
+        elementOnline(kind.fc);
+        service(kind.checking);
         if (outcome == TEST_PASSED) {
-            completion(passed, COMPLETION_PASSED);
+            completion(kind.passed, COMPLETION_PASSED);
             return;
         }
-        completion(failed, COMPLETION_FAILED, LL_ERR);
+        completion(kind.failed, COMPLETION_FAILED, LL_ERR);
         if (outcome == TEST_UNKNOWN) {
             completion(REC_UNKNOWN_FAILURE, COMPLETION_FAILED, LL_ERR);
             return;
@@ -381,8 +370,8 @@ private:
             completion(recordLine("Mis-match frame number = %u; Mis-match frame info = %u",
                                   badNumber, badInfo),
                        COMPLETION_FAILED);
-        completion(recordLine(statusLine, jsonString(answer, "output").c_str()), COMPLETION_FAILED,
-                   LL_ERR);
+        completion(recordLine("%s : %s", kind.status, jsonString(answer, "output").c_str()),
+                   COMPLETION_FAILED, LL_ERR);
     }
 
     void pciLoopbackTest() {
@@ -414,6 +403,17 @@ private:
     DiagnosticHelper& _helper;
     Offline _offline = NOTHING_OFFLINE;
 };
+
+const Diagnostic_Run::Loopback_Kind Diagnostic_Run::kFcLoopback = {
+    REC_CHECK_PORT_DISABLED,   REC_RUNNING_LOOPBACK,  REC_CHECKING_LOOPBACK, REC_LOOPBACK_PASSED,
+    REC_LOOPBACK_FAILED,       "libDiagLoopbackTest", &libDiagLoopbackTest,  true,
+    "Loopback test run status"};
+const Diagnostic_Run::Loopback_Kind Diagnostic_Run::kEthLoopback = {
+    REC_CHECK_PORT_DISABLED_ETH,  REC_RUNNING_ETH_LOOPBACK,
+    REC_CHECKING_ETH_LOOPBACK,    REC_ETH_LOOPBACK_PASSED,
+    REC_ETH_LOOPBACK_FAILED,      "libDiagEthLoopbackTest",
+    &libDiagEthLoopbackTest,      false,
+    "EthLoopback test run status"};
 
 // ---- the start operations -------------------------------------------------------------
 
@@ -451,26 +451,32 @@ bool selectMode(const Loopback_Mode (&modes)[N], const String& testName, Diagnos
     return false;
 }
 
-// The element of a port identifier: a WWN (16 characters) is an FC port, a
-// MAC (12) an Ethernet port. False for any other length.
+// The two forms of a port identifier: a WWN (16 characters) names an FC
+// port, a MAC (12) an Ethernet port; the loopback test runs at 4 or 10 Gb/s.
+struct Port_Form {
+    size_t length;
+    classId_t elementClass;
+    String DiagnosticTestInput::*id;
+    const char* name;
+    uint32 speed;
+};
+
+const Port_Form kPortForms[] = {
+    {16, CID_FC_PORT, &DiagnosticTestInput::portWwn, "WWN", 4},
+    {12, CID_ETHERNET_PORT, &DiagnosticTestInput::portMac, "MAC", 10},
+};
+
+// The element of a port identifier; false for any other length.
 bool setPortElement(const String& portId, bool withSpeed, DiagnosticTestInput& in) {
-    if (portId.size() == 16) {
-        in.elementClass = CID_FC_PORT;
-        in.portWwn = portId;
-        TVRN_LOG(LL_INFO, "Given Port WWN : %s", portId.c_str());
+    for (const Port_Form& form : kPortForms) {
+        if (portId.size() != form.length)
+            continue;
+        in.elementClass = form.elementClass;
+        in.*form.id = portId;
+        TVRN_LOG(LL_INFO, "Given Port %s : %s", form.name, portId.c_str());
         if (withSpeed) {
-            in.speed = 4;
-            TVRN_LOG(LL_INFO, "Speed chosen : 4 GBS");
-        }
-        return true;
-    }
-    if (portId.size() == 12) {
-        in.elementClass = CID_ETHERNET_PORT;
-        in.portMac = portId;
-        TVRN_LOG(LL_INFO, "Given Port MAC : %s", portId.c_str());
-        if (withSpeed) {
-            in.speed = 10;
-            TVRN_LOG(LL_INFO, "Speed chosen : 10 GBS");
+            in.speed = form.speed;
+            TVRN_LOG(LL_INFO, "Speed chosen : %u GBS", unsigned(form.speed));
         }
         return true;
     }

@@ -4,7 +4,7 @@
 // element classes its test accepts and which start operation runs it:
 //
 //   const Diagnostic_Start TAVRIN_MemoryDiagnosticTest_Start = {
-//       {{"TAVRIN_PortController", nullptr}}, startMemoryTest};
+//       {{"TAVRIN_PortController", nullptr}}, start_on<&DiagnosticHelper::runMemoryTest>};
 //
 // While a test it started runs, the provider may not be unloaded; unloading
 // it at the server's end waits (bounded) for that test to finish.
@@ -38,6 +38,18 @@ struct Diagnostic_Start {
     RunDiagResult (*start)(DiagnosticHelper& helper, const String& deviceId,
                            const String& testName);
 };
+
+// The start operations in the form of Diagnostic_Start::start: those of a
+// test kind (memory, PCI loopback) and those of the test the Name selects.
+template <RunDiagResult (DiagnosticHelper::*RUN)(const String& deviceId)>
+RunDiagResult start_on(DiagnosticHelper& helper, const String& deviceId, const String&) {
+    return (helper.*RUN)(deviceId);
+}
+template <RunDiagResult (DiagnosticHelper::*RUN)(const String& deviceId, const String& testName)>
+RunDiagResult start_named(DiagnosticHelper& helper, const String& deviceId,
+                          const String& testName) {
+    return (helper.*RUN)(deviceId, testName);
+}
 
 template <class C, const Inventory_Source& SOURCE, const Diagnostic_Start& START>
 class Diagnostic_Test_Provider : public Inventory_Provider<C, SOURCE> {

@@ -14,13 +14,8 @@ const Inventory_Source TAVRIN_EthLoopbackDiagnosticTest_Source = {
     TVRN_SOURCE_FILE,
     __LINE__};
 
-RunDiagResult startEthLoopbackDiagnosticTest(DiagnosticHelper& helper, const String& deviceId,
-                                             const String& testName) {
-    return helper.runEthLoopbackTest(deviceId, testName);
-}
-
-const Diagnostic_Start TAVRIN_EthLoopbackDiagnosticTest_Start = {{{"TAVRIN_EthernetPort", nullptr}},
-                                                                 startEthLoopbackDiagnosticTest};
+const Diagnostic_Start TAVRIN_EthLoopbackDiagnosticTest_Start = {
+    {{"TAVRIN_EthernetPort", nullptr}}, start_named<&DiagnosticHelper::runEthLoopbackTest>};
 
 class TAVRIN_EthLoopbackDiagnosticTest_Provider
     : public Diagnostic_Test_Provider<TAVRIN_EthLoopbackDiagnosticTest,

@@ -14,13 +14,8 @@ const Inventory_Source TAVRIN_LoopbackDiagnosticTest_Source = {
     TVRN_SOURCE_FILE,
     __LINE__};
 
-RunDiagResult startLoopbackDiagnosticTest(DiagnosticHelper& helper, const String& deviceId,
-                                          const String& testName) {
-    return helper.runLoopbackTest(deviceId, testName);
-}
-
-const Diagnostic_Start TAVRIN_LoopbackDiagnosticTest_Start = {{{"TAVRIN_FCPort", nullptr}},
-                                                              startLoopbackDiagnosticTest};
+const Diagnostic_Start TAVRIN_LoopbackDiagnosticTest_Start = {
+    {{"TAVRIN_FCPort", nullptr}}, start_named<&DiagnosticHelper::runLoopbackTest>};
 
 class TAVRIN_LoopbackDiagnosticTest_Provider
     : public Diagnostic_Test_Provider<TAVRIN_LoopbackDiagnosticTest,

@@ -13,13 +13,8 @@ const Inventory_Source TAVRIN_MemoryDiagnosticTest_Source = {
     TVRN_SOURCE_FILE,
     __LINE__};
 
-RunDiagResult startMemoryDiagnosticTest(DiagnosticHelper& helper, const String& deviceId,
-                                        const String&) {
-    return helper.runMemoryTest(deviceId);
-}
-
-const Diagnostic_Start TAVRIN_MemoryDiagnosticTest_Start = {{{"TAVRIN_PortController", nullptr}},
-                                                            startMemoryDiagnosticTest};
+const Diagnostic_Start TAVRIN_MemoryDiagnosticTest_Start = {
+    {{"TAVRIN_PortController", nullptr}}, start_on<&DiagnosticHelper::runMemoryTest>};
 
 class TAVRIN_MemoryDiagnosticTest_Provider
     : public Diagnostic_Test_Provider<TAVRIN_MemoryDiagnosticTest,

@@ -14,15 +14,10 @@ const Inventory_Source TAVRIN_PCILoopbackDiagnosticTest_Source = {
     TVRN_SOURCE_FILE,
     __LINE__};
 
-RunDiagResult startPCILoopbackDiagnosticTest(DiagnosticHelper& helper, const String& deviceId,
-                                             const String&) {
-    return helper.runPCILoopbackTest(deviceId);
-}
-
 const Diagnostic_Start TAVRIN_PCILoopbackDiagnosticTest_Start = {
     {{"TAVRIN_FCPort", "PCI Loopback Test is requested for FC Port"},
      {"TAVRIN_EthernetPort", "PCI Loopback Test is requested for Ethernet Port"}},
-    startPCILoopbackDiagnosticTest};
+    start_on<&DiagnosticHelper::runPCILoopbackTest>};
 
 class TAVRIN_PCILoopbackDiagnosticTest_Provider
     : public Diagnostic_Test_Provider<TAVRIN_PCILoopbackDiagnosticTest,
