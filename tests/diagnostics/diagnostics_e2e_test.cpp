@@ -184,6 +184,11 @@ TEST_F(Diagnostics, MemoryTestRunsOfflineAndRefusesASecondStartMeanwhile) {
     // The real duration: at least the 150 ms the test took.
     const std::string elapsed = jobs[0].get("ElapsedTime")->asDateTime().text();
     EXPECT_GE(std::stod(elapsed.substr(12, 9)), 0.15) << elapsed;
+    // The job completed after its last record was written.
+    const Instance outcome = session->enumerate("TAVRIN_DiagnosticCompletionRecord").items.back();
+    EXPECT_LE(outcome.get("CreationTimeStamp")->asDateTime().toBinary(),
+              jobs[0].get("StartTime")->asDateTime().toBinary() +
+                  jobs[0].get("ElapsedTime")->asDateTime().toBinary());
 
     EXPECT_EQ(records(job, true),
               services({"Checking whether the adapter is disabled for running memory test",
