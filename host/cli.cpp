@@ -10,6 +10,7 @@
 #include <iostream>
 #include <map>
 #include <sstream>
+#include <thread>
 
 #include "host/mof.h"
 
@@ -280,6 +281,37 @@ int cmdIndications(Env& e, const CommandArgs& a) {
     return rc;
 }
 
+// Waits until an instance of CLASS has PROP=VALUE (compared as MOF text, so
+// JobState=7 matches a uint16 7), enumerating the class every 100 ms, for at
+// most SECONDS (default 60). Prints nothing; running out of time fails.
+int cmdWait(Env& e, const CommandArgs& a) {
+    const std::string& cls = a.positional[0];
+    const PropertyVector wanted = parseAssignments({a.positional[1]});
+    const std::string value = mofValue(wanted[0].value);
+    const std::string limit = a.positional.size() == 3 ? a.positional[2] : "60";
+    char* end = nullptr;
+    const double seconds = std::strtod(limit.c_str(), &end);
+    if (!end || *end || seconds < 0)
+        throw ParseError("SECONDS must be a non-negative number");
+    const auto deadline = std::chrono::steady_clock::now() +
+                          std::chrono::milliseconds(static_cast<long long>(seconds * 1000));
+    for (;;) {
+        const auto r = e.host.enumerateInstances(e.inv.nameSpace, cls);
+        if (!r.ok())
+            return failed(e.err, r);
+        for (const auto& inst : r.items) {
+            const Value* v = inst.get(wanted[0].name);
+            if (v != nullptr && mofValue(*v) == value)
+                return 0;
+        }
+        if (std::chrono::steady_clock::now() >= deadline)
+            return failed(
+                e.err, Status{CMPI_RC_ERR_FAILED,
+                              "no " + cls + " with " + a.positional[1] + " after " + limit + " s"});
+        std::this_thread::sleep_for(std::chrono::milliseconds(100));
+    }
+}
+
 const ClassCatalog& catalog(const Env& e) {
     static const struct None : ClassCatalog {
         std::vector<std::string> classNames() const override { return {}; }
@@ -447,6 +479,15 @@ const Command kCommands[] = {
      true,
      false,
      cmdIndications},
+    {"wait",
+     "CLASS PROP=VALUE [SECONDS]",
+     "wait until an instance of CLASS has PROP=VALUE (default 60 s)",
+     {},
+     2,
+     3,
+     true,
+     false,
+     cmdWait},
     {"gc",
      "CLASS",
      "print a class of the module's class schema as MOF",

@@ -31,9 +31,8 @@ Array<Instance*> connectors(classId_t id) {
     return PhysicalAssetHelper::getPhysicalAssetHelperObject()->getInstancesByClass(id);
 }
 
-// The routes without a builder belong to helpers still to come: the
-// diagnostics (21 to 28, 31 to 33). The server profile (10 to 15, 17, 37)
-// and the firmware update (18, 19) live above the inventory and fill their
+// The server profile (10 to 15, 17, 37), the firmware update (18, 19) and
+// the diagnostics (21 to 28, 31 to 33) live above the inventory and fill their
 // routes when the module loads (fillRoute).
 InventoryRoute kFCHBARoutes[] = {
     {CID_COMPUTER_SYSTEM, CID_COMPUTER_SYSTEM, false, computerSystem},

@@ -9,6 +9,7 @@
 
 #include <json/json.h>
 
+#include "diagnostics/DiagnosticHelper.h"
 #include "gateway/HbaAgentError.h"
 #include "gateway/JsonAccess.h"
 #include "gateway/ProviderUtil.h"
@@ -20,6 +21,10 @@
 #include "schema/generated/TAVRIN_AlarmDevice.h"
 #include "schema/generated/TAVRIN_CIMXMLCommunicationMechanism.h"
 #include "schema/generated/TAVRIN_ComputerSystem.h"
+#include "schema/generated/TAVRIN_ConcreteJob.h"
+#include "schema/generated/TAVRIN_DiagnosticSoftwareIdentity.h"
+#include "schema/generated/TAVRIN_DiagnosticTest.h"
+#include "schema/generated/TAVRIN_EthLoopbackDiagnosticTest.h"
 #include "schema/generated/TAVRIN_EthernetPort.h"
 #include "schema/generated/TAVRIN_FCPort.h"
 #include "schema/generated/TAVRIN_FCPortStatistics.h"
@@ -27,8 +32,11 @@
 #include "schema/generated/TAVRIN_HBASoftwareInstallationServiceCapabilities.h"
 #include "schema/generated/TAVRIN_LANEndpoint.h"
 #include "schema/generated/TAVRIN_LogicalPortGroup.h"
+#include "schema/generated/TAVRIN_LoopbackDiagnosticTest.h"
+#include "schema/generated/TAVRIN_MemoryDiagnosticTest.h"
 #include "schema/generated/TAVRIN_Namespace.h"
 #include "schema/generated/TAVRIN_ObjectManager.h"
+#include "schema/generated/TAVRIN_PCILoopbackDiagnosticTest.h"
 #include "schema/generated/TAVRIN_PhysicalConnector.h"
 #include "schema/generated/TAVRIN_PhysicalPackage.h"
 #include "schema/generated/TAVRIN_PortController.h"
@@ -78,6 +86,15 @@ const Meta_Class* class_of(classId_t id) {
         case CID_LAN_ENDPOINT: return &TAVRIN_LANEndpoint::static_meta_class;
         case CID_PHYSICAL_CONNECTOR: return &TAVRIN_PhysicalConnector::static_meta_class;
         case CID_ALARM_DEVICE: return &TAVRIN_AlarmDevice::static_meta_class;
+        case CID_MEMORY_DIAGNOSTIC_TEST: return &TAVRIN_MemoryDiagnosticTest::static_meta_class;
+        case CID_LOOPBACK_DIAGNOSTIC_TEST: return &TAVRIN_LoopbackDiagnosticTest::static_meta_class;
+        case CID_PCI_LOOPBACK_DIAGNOSTIC_TEST:
+            return &TAVRIN_PCILoopbackDiagnosticTest::static_meta_class;
+        case CID_ETH_LOOPBACK_DIAGNOSTIC_TEST:
+            return &TAVRIN_EthLoopbackDiagnosticTest::static_meta_class;
+        case CID_DIAGNOSTIC_SOFTWARE_IDENTITY:
+            return &TAVRIN_DiagnosticSoftwareIdentity::static_meta_class;
+        case CID_CONCRETE_JOB: return &TAVRIN_ConcreteJob::static_meta_class;
         default: return nullptr;
     }
 }
@@ -88,6 +105,10 @@ const Meta_Class* class_of(classId_t id) {
 class Inventory_Sources : public Pairing_Sources {
 public:
     Array<Instance*> fetch(Source source, int id, const Meta_Class*& expected) override {
+        if (source == Source::DIAGNOSTIC_TESTS) {
+            expected = &TAVRIN_DiagnosticTest::static_meta_class;
+            return DiagnosticHelper::getDiagnosticHelperObject()->getDiagnosticServices();
+        }
         expected = class_of(classId_t(id));
         return source == Source::HOST_DISCOVERED
                    ? HDRManager::getHDRManager()->getInstances(classId_t(id))

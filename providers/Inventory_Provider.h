@@ -122,8 +122,10 @@ Enum_Instances_Status enumerate_inventory(const Inventory_Source& source,
     return ENUM_INSTANCES_OK;
 }
 
-template <class C, const Inventory_Source& SOURCE>
-class Inventory_Provider : public Instance_Provider<C> {
+// An association class whose instances a dispatcher builds names its base:
+// Inventory_Provider<C, SOURCE, Association_Provider<C>>.
+template <class C, const Inventory_Source& SOURCE, class Base = Instance_Provider<C>>
+class Inventory_Provider : public Base {
 public:
     // The model (the properties asked for) is not looked at, nor whether the
     // handler wants more: every instance is delivered whole.

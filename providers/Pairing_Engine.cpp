@@ -121,6 +121,7 @@ private:
     Fetched _nothing;
 
     uint32 _offsets[Pairing::MAX_ENDS];
+    const Instance* _picked_walked = nullptr;
     const Instance* _picked[Pairing::MAX_ENDS];
     size_t _positions[Pairing::MAX_ENDS];
 
@@ -150,7 +151,7 @@ void Pairing_Run::fetch_request_set(uint8 set) {
     const Endpoint_Set& s = _rule.sets[set];
     std::unique_ptr<Fetched> fetched(new Fetched());
     for (uint8 part = 0; part < 2; part++) {
-        if (s.ids[part] == 0)
+        if (s.ids[part] == 0 && !(part == 0 && is_whole_source(s.source)))
             continue;
         const Meta_Class* expected = nullptr;
         Array<Instance*> items = _sources.fetch(s.source, s.ids[part], expected);
@@ -241,6 +242,7 @@ Enum_Instances_Status Pairing_Run::run() {
             continue;
         if (!select_element_sets(instance))
             continue;
+        _picked_walked = instance;
         const Association_End& first = _rule.ends[0];
         if (first.set == Pairing::ITERATED) {
             _picked[0] = instance;
@@ -268,7 +270,10 @@ void Pairing_Run::pair_from(size_t end) {
     const Fetched* set = _current[_rule.ends[end].set];
     std::vector<uint32> found;
     candidates(end, found);
+    const Walk_Filter keep = _rule.ends[end].walk_filter;
     for (uint32 j : found) {
+        if (keep != nullptr && !keep(_picked_walked, set->at(j)))
+            continue;
         _picked[end] = set->at(j);
         _positions[end] = j;
         pair_from(end + 1);

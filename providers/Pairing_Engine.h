@@ -88,6 +88,8 @@ private:
 
 typedef void (*Key_Function)(Key_Sink& keys, const Instance* instance);
 typedef bool (*Instance_Filter)(const Instance* instance);
+// A filter that also sees the instance being walked.
+typedef bool (*Walk_Filter)(const Instance* walked, const Instance* instance);
 
 // The key of an instance: the value of one of its properties (a text, or an
 // integer in decimal; a null value gives no key), or what a function derives.
@@ -108,11 +110,17 @@ enum class Source : uint8 {
     NONE,
     INVENTORY,        // FCHBAManager::getInstances of its class ids
     HOST_DISCOVERED,  // HDRManager::getInstances of its class ids
+    // Request-wide, without class ids:
+    DIAGNOSTIC_TESTS,  // every diagnostic test offered
     // Per element, selected by a key of the walked instance:
     FC_PORTS_OF_ADAPTER,              // FCHBAManager::getFCPortInstancesByAdapter(key)
     ETHERNET_PORTS_OF_ADAPTER,        // FCHBAManager::getEthernetPortInstancesByAdapter(key)
     ETHERNET_PORTS_OF_ADAPTER_NUMBER  // EthernetPortHelper::getInstancesByAdapterId(key, 20)
 };
+
+constexpr bool is_whole_source(Source s) {
+    return s == Source::DIAGNOSTIC_TESTS;
+}
 
 constexpr bool is_per_element(Source s) {
     return s == Source::FC_PORTS_OF_ADAPTER || s == Source::ETHERNET_PORTS_OF_ADAPTER ||
@@ -147,6 +155,7 @@ struct Association_End {
     Key outer;               // key of the end before it
     Key inner;               // key of this end
     bool exact;
+    Walk_Filter walk_filter;  // null: every partner
 };
 
 // A read-only view of the request-wide sets, for a rule's report().
@@ -206,6 +215,9 @@ struct Pairing {
     constexpr Pairing fetch_discovered(int id, int then = 0) const {
         return with_set(Endpoint_Set{Source::HOST_DISCOVERED, {id, then}, Key{nullptr, nullptr}});
     }
+    constexpr Pairing fetch_diagnostic_tests() const {
+        return with_set(Endpoint_Set{Source::DIAGNOSTIC_TESTS, {0, 0}, Key{nullptr, nullptr}});
+    }
     constexpr Pairing fetch_for_each(Source source, Key selector) const {
         return with_set(Endpoint_Set{source, {0, 0}, selector});
     }
@@ -253,20 +265,23 @@ struct Pairing {
     constexpr Pairing as(const char* role) const { return pair(ITERATED, role); }
     constexpr Pairing pair(uint8 set, const char* role) const {
         return with_end(Association_End{role, set, nullptr, Match::EVERY, Key{nullptr, nullptr},
-                                        Key{nullptr, nullptr}, false});
+                                        Key{nullptr, nullptr}, false, nullptr});
     }
     constexpr Pairing with_every(uint8 set, const char* role) const {
         return with_end(Association_End{role, set, nullptr, Match::EVERY, Key{nullptr, nullptr},
-                                        Key{nullptr, nullptr}, false});
+                                        Key{nullptr, nullptr}, false, nullptr});
     }
     constexpr Pairing with_first(uint8 set, const char* role, Key outer, Key inner) const {
-        return with_end(Association_End{role, set, nullptr, Match::FIRST, outer, inner, false});
+        return with_end(
+            Association_End{role, set, nullptr, Match::FIRST, outer, inner, false, nullptr});
     }
     constexpr Pairing with_all(uint8 set, const char* role, Key outer, Key inner) const {
-        return with_end(Association_End{role, set, nullptr, Match::ALL, outer, inner, false});
+        return with_end(
+            Association_End{role, set, nullptr, Match::ALL, outer, inner, false, nullptr});
     }
     constexpr Pairing at_same_position(uint8 set, const char* role, Key outer, Key inner) const {
-        return with_end(Association_End{role, set, nullptr, Match::POSITION, outer, inner, false});
+        return with_end(
+            Association_End{role, set, nullptr, Match::POSITION, outer, inner, false, nullptr});
     }
     // The last end: keys compared exactly / only instances the filter keeps.
     constexpr Pairing exact() const {
@@ -277,6 +292,12 @@ struct Pairing {
     constexpr Pairing only(Instance_Filter filter) const {
         Pairing p = *this;
         p.ends[p.num_ends - 1].filter = filter;
+        return p;
+    }
+    // The last end: only partners that keep(walked instance, partner) accepts.
+    constexpr Pairing only_for_walked(Walk_Filter keep) const {
+        Pairing p = *this;
+        p.ends[p.num_ends - 1].walk_filter = keep;
         return p;
     }
 
