@@ -107,7 +107,7 @@ String textOf(const Instance* instance, const char* name) {
     const Meta_Property* mp = find_property(instance->meta_class, name);
     if (mp == nullptr || mp->type != STRING || mp->subscript != 0)
         return String();
-    const auto* p = reinterpret_cast<const Property<String>*>(__slot(instance, mp->offset));
+    const auto* p = reinterpret_cast<const Property<String>*>(slot_of(instance, mp->offset));
     return p->null ? String() : p->value;
 }
 
@@ -118,7 +118,7 @@ void setReference(Instance* association, const char* role, Instance* target) {
         destroy(target);
         return;
     }
-    __ref_slot(__slot(association, mr->offset)) = target;
+    reference_in(slot_of(association, mr->offset)) = target;
 }
 
 // The elements records and jobs name, found by class and DeviceID. Each class

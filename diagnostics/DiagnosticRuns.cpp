@@ -117,7 +117,7 @@ int setState(const char* pointer, JsonReqFP fp, const Json::Value& request, cons
 
 bool getAdapterStatus(const String& adapterAddress, bool& known) {
     known = false;
-    const String colon = colonForm(adapterAddress);
+    const String colon = ProviderUtil::getIndexInColonFormat(adapterAddress);
     Json::Value answer;
     if (!guardedCall(LibCall("libGetHbaByWwn"), libGetHbaByWwn,
                      keyRequest(colon.size() == 17 ? "mac" : "wwn", colon), answer) ||
@@ -133,7 +133,7 @@ bool getAdapterStatus(const String& adapterAddress, bool& known) {
 }
 
 int setAdapterStatus(const String& adapterAddress, bool enable) {
-    const String colon = colonForm(adapterAddress);
+    const String colon = ProviderUtil::getIndexInColonFormat(adapterAddress);
     Json::Value request(Json::objectValue);
     request["indexStr"] = jsonText(colon);
     request["enableState"] = enable;
@@ -233,7 +233,7 @@ private:
         }
         service(REC_PORT_NOT_DISABLED);
         service(REC_DISABLING_PORT);
-        if (setPortState(colonForm(port()), false) != 0) {
+        if (setPortState(ProviderUtil::getIndexInColonFormat(port()), false) != 0) {
             completion(REC_PORT_DISABLE_FAILED, COMPLETION_FAILED, LL_ERR);
             return false;
         }
@@ -268,7 +268,7 @@ private:
         if (_offline == PORT_OFFLINE) {
             _offline = NOTHING_OFFLINE;
             service(REC_ENABLING_PORT);
-            if (setPortState(colonForm(port()), true) != 0)
+            if (setPortState(ProviderUtil::getIndexInColonFormat(port()), true) != 0)
                 completion(String("Failed to enable the port"), COMPLETION_FAILED, LL_ERR);
             if (settle)
                 _helper.pause(_in.pauseUsec);
@@ -289,9 +289,9 @@ private:
         service(REC_RUNNING_MEMORY_TEST);
         service(REC_MEMORY_TEST_TAKES_TIME);
         Json::Value answer;
-        const Test_Outcome outcome =
-            callTest("libDiagMemoryTest", libDiagMemoryTest,
-                     keyRequest("hbaWwn", colonForm(_in.adapterAddress)), answer);
+        const Test_Outcome outcome = callTest(
+            "libDiagMemoryTest", libDiagMemoryTest,
+            keyRequest("hbaWwn", ProviderUtil::getIndexInColonFormat(_in.adapterAddress)), answer);
         elementOnline(false);
         service(REC_CHECKING_MEMORY_TEST);
         if (outcome == TEST_PASSED) {
@@ -339,7 +339,7 @@ private:
             return;
         service(kind.running);
         Json::Value request(Json::objectValue);
-        request["portWwn"] = jsonText(colonForm(port()));
+        request["portWwn"] = jsonText(ProviderUtil::getIndexInColonFormat(port()));
         request["mode"] = _in.mode;
         if (kind.fc)
             request["speed"] = _in.speed;
@@ -377,7 +377,7 @@ private:
     void pciLoopbackTest() {
         service(REC_RUNNING_PCI_LOOPBACK);
         Json::Value request(Json::objectValue);
-        request["portWwn"] = jsonText(colonForm(port()));
+        request["portWwn"] = jsonText(ProviderUtil::getIndexInColonFormat(port()));
         request["dataPattern"] = _in.dataPattern;
         request["frameCount"] = _in.frameCount;
         Json::Value answer;
