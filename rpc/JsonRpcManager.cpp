@@ -94,8 +94,8 @@ JsonRpcManager* JsonRpcManager::instance() {
     return &built.rpc;
 }
 
-void JsonRpcManager::_registerMethod(const std::string& name, Handler handler, bool secretParams) {
-    _methods[name] = Method{std::move(handler), secretParams};
+void JsonRpcManager::_registerMethod(const std::string& name, Handler handler, bool secret) {
+    _methods[name] = Method{std::move(handler), secret};
 }
 
 std::vector<std::string> JsonRpcManager::getMethods() const {
@@ -171,16 +171,24 @@ void JsonRpcManager::process(const std::string& text, response& out) const noexc
     }
 }
 
-std::string JsonRpcManager::loggable(const std::string& text) const {
+bool JsonRpcManager::isSecret(const std::string& request) const {
+    Json::Value value;
+    std::string errors;
+    if (!parse(request, value, errors))
+        return false;
+    const Method* method = find(jsonMember(value, "method"));
+    return method != nullptr && method->secret;
+}
+
+std::string JsonRpcManager::loggable(const std::string& text, bool secret) const {
     Json::Value value;
     std::string errors;
     if (!parse(text, value, errors))
         return "(" + std::to_string(text.size()) + " bytes that are not JSON)";
-    if (value.isObject() && value.isMember("params")) {
-        const Method* method = find(jsonMember(value, "method"));
-        if (method != nullptr && method->secretParams)
-            value["params"] = kMask;
-    }
+    if (secret && value.isObject())
+        for (const char* whole : {"params", "result"})
+            if (value.isMember(whole))
+                value[whole] = kMask;
     maskSecrets(value);
     Json::StreamWriterBuilder writer;
     writer["indentation"] = "";
@@ -195,14 +203,15 @@ String JsonRpcManager::executeMethod(const Property<String>& request) noexcept {
         const std::string text =
             request.null ? std::string() : std::string(request.value.c_str(), request.value.size());
         const JsonRpcManager* rpc = instance();
+        const bool secret = debug && rpc->isSecret(text);
         if (debug)
-            TVRN_LOG(LL_DBG, "rpcRequest : %s", rpc->loggable(text).c_str());
+            TVRN_LOG(LL_DBG, "rpcRequest : %s", rpc->loggable(text, secret).c_str());
         response answer;
         rpc->process(text, answer);
         if (debug) {
             // A parse failure is our own text; a response may carry secrets.
             const std::string shown =
-                answer.status == 200 ? rpc->loggable(answer.body) : answer.body;
+                answer.status == 200 ? rpc->loggable(answer.body, secret) : answer.body;
             TVRN_LOG(LL_DBG, "rpcResponse : %s", shown.c_str());
             TVRN_LOG(LL_DBG, "Returning: %s", "executeMethod");
         }

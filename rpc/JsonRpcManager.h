@@ -55,9 +55,9 @@ public:
     static JsonRpcManager* instance();
 
     // Stores `handler` under `name`, replacing one stored before. Only for
-    // filling a dispatcher before it is published. With `secretParams` the
-    // request's params are never logged.
-    void _registerMethod(const std::string& name, Handler handler, bool secretParams = false);
+    // filling a dispatcher before it is published. With `secret` the params
+    // of its requests and the results of its responses are never logged.
+    void _registerMethod(const std::string& name, Handler handler, bool secret = false);
 
     // The registered names in byte order.
     std::vector<std::string> getMethods() const;
@@ -69,16 +69,19 @@ public:
     // with secrets masked.
     static String executeMethod(const Property<String>& request) noexcept;
 
+    // Whether the request text names a method registered as secret.
+    bool isSecret(const std::string& request) const;
+
     // The text of a request or response as it may be logged: compact, with
-    // the values of secret-looking members (and the params of methods
-    // registered with secret params) masked; text that is not JSON is
-    // described, not quoted.
-    std::string loggable(const std::string& text) const;
+    // the values of secret-looking members masked, and with `secret` (a
+    // request or response of a secret method) its "params" and "result"
+    // masked whole; text that is not JSON is described, not quoted.
+    std::string loggable(const std::string& text, bool secret) const;
 
 private:
     struct Method {
         Handler handler;
-        bool secretParams;
+        bool secret;
     };
 
     JsonRpcManager() = default;

@@ -75,7 +75,7 @@ struct MethodRow {
     const char* zeroed = nullptr;    // a member always sent as 0 ("vfId" or "vfID")
     const char* function = nullptr;  // the "function" of a postDiagnostics test
     const char* handler = nullptr;   // the handler's name in logs; null: the name after the prefix
-    bool secretParams = false;       // params carry secrets: never logged
+    bool secret = false;             // params or answers carry secrets: never logged
 
     constexpr MethodRow(const char* name_, Runner run_, JsonReqFP* entry_,
                         std::initializer_list<Param> params_)
@@ -89,7 +89,7 @@ struct MethodRow {
     constexpr MethodRow handledBy(const char* name_) const {
         return with(&MethodRow::handler, name_);
     }
-    constexpr MethodRow secret() const { return with(&MethodRow::secretParams, true); }
+    constexpr MethodRow secretive() const { return with(&MethodRow::secret, true); }
 
 private:
     template <typename T>
@@ -145,7 +145,7 @@ constexpr MethodRow kMethods[] = {
     Plain("discovery.getFcByFcWwn", &libGetFcByFcWwn, {S("wwn")}),
     Plain("discovery.getAllFcByPort", &libGetFcByFcWwn, {S("wwn")}),
     Plain("discovery.getPortStatistics", &libGetPortStatistics, {S("indexStr")}),
-    Plain("discovery.getPortAuthentication", &libGetPortAuthentication, {S("wwn")}),
+    Plain("discovery.getPortAuthentication", &libGetPortAuthentication, {S("wwn")}).secretive(),
     Plain("discovery.getAllRemotePorts", &libGetAllRemotePorts, {S("pPortWwn"), S("lPortWwn")}),
     Plain("discovery.getCompleteRemotePort", &libGetCompleteRemotePort, {P3}),
     Plain("discovery.getAllLunsByRemotePort", &libGetAllLunsByRemotePort, {P3}),
@@ -225,7 +225,7 @@ constexpr MethodRow kMethods[] = {
           {S("indexStr"), O("port"), A("propArray")}),
     Plain("configuration.setPortAuthentication", &libSetPortAuthentication,
           {S("pPortWwn"), O("portAuth")})
-        .secret(),
+        .secretive(),
     Plain("configuration.setFcByFcWwn", &libSetFcByFcWwn,
           {S("portWwn"), O("fcPortData"), A("paramsConfigured")}),
     Plain("configuration.setHbaStatus", &libSetAdapterState, {S("indexStr"), B("enableState")}),
@@ -718,7 +718,7 @@ void ProviderDiscoveryMethods::registerMethods(JsonRpcManager& rpc) {
         rpc._registerMethod(
             row.name,
             [r](const Json::Value& params, Json::Value& result) { r->run(*r, params, result); },
-            row.secretParams);
+            row.secret);
     }
 }
 

@@ -78,12 +78,12 @@ TEST(ExecuteMethod, LogsRequestsAsDataWithoutSecrets) {
     Module_Session& s = Module_Session::open();
     const std::string set =
         R"({"id": 1, "method": "configuration.setPortAuthentication",
-            "params": ["10:00:00:05:1e:0a:0b:0c", {"authEnabled": true, "secret": "hunter2"}]})";
+            "params": ["10:00:00:05:1e:0a:0b:0c", {"authEnabled": true, "chapKey": "hunter2"}]})";
     EXPECT_TRUE(responseJson(s, set).isMember("result"));
     const Json::Value got = responseJson(
         s,
         R"({"id": 2, "method": "discovery.getPortAuthentication", "params": ["10:00:00:05:1e:0a:0b:0c"]})");
-    EXPECT_EQ("hunter2", got["result"]["secret"].asString());  // the client gets it
+    EXPECT_EQ("hunter2", got["result"]["chapKey"].asString());  // the client gets it
     responseJson(s, R"({"id": 3, "method": "%s%s%s%n", "params": []})");
 
     EXPECT_EQ(0u, s.logCount("hunter2"));

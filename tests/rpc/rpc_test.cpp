@@ -223,9 +223,16 @@ TEST_F(Rpc, DispatcherAnswersEveryRequestShape) {
     }
 }
 
+// A request whose params nest `depth` arrays deep.
+std::string nested(size_t depth) {
+    return R"({"id": 1, "method": "discovery.getGlobalInfo", "params": )" +
+           std::string(depth, '[') + std::string(depth, ']') + "}";
+}
+
 TEST_F(Rpc, TextThatIsNotJsonGetsTheParseFailureText) {
+    EXPECT_EQ(200, process(nested(JsonRpcManager::kMaxNesting - 1)).status);
     for (const std::string& text : {std::string("{\"method\": "), std::string(),
-                                    std::string(JsonRpcManager::kMaxNesting + 1, '[')}) {
+                                    nested(JsonRpcManager::kMaxNesting), nested(1000000)}) {
         JsonRpcManager::response r = process(text);
         EXPECT_EQ(500, r.status);
         EXPECT_EQ(0u, r.body.find(JsonRpcManager::kParseFailure)) << r.body;
@@ -659,13 +666,19 @@ TEST_F(Rpc, NoRequestIdIsAnError) {
 
 TEST_F(Rpc, SecretsAreMaskedInLogText) {
     const JsonRpcManager* m = JsonRpcManager::instance();
-    const std::string logged = m->loggable(withKeys(
-        R"({"method": "configuration.setPortAuthentication", "params": ["$P1", {"chap": "s3"}]})"));
+    const std::string set = withKeys(
+        R"({"method": "configuration.setPortAuthentication", "params": ["$P1", {"chap": "s3"}]})");
+    ASSERT_TRUE(m->isSecret(set));
+    EXPECT_FALSE(m->isSecret(R"({"method": "discovery.getServerTime"})"));
+    const std::string logged = m->loggable(set, true);
     EXPECT_EQ(std::string::npos, logged.find("s3")) << logged;
-    const std::string answer = m->loggable(R"({"result": {"authSecret": "s3", "on": true}})");
+    EXPECT_EQ(std::string::npos, m->loggable(R"({"result": {"chap": "s3"}})", true).find("s3"));
+    // Secret-looking members of any method, and nothing else.
+    const std::string answer =
+        m->loggable(R"({"result": {"authSecret": "s3", "on": true}})", false);
     EXPECT_EQ(std::string::npos, answer.find("s3")) << answer;
     EXPECT_NE(std::string::npos, answer.find("\"on\":true")) << answer;
-    EXPECT_EQ(std::string::npos, m->loggable("{\"password\": \"s3\"").find("s3"));
+    EXPECT_EQ(std::string::npos, m->loggable("{\"password\": \"s3\"", false).find("s3"));
 }
 
 }  // namespace
