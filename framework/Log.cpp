@@ -244,6 +244,15 @@ void Log_Call_Frame::invoke(const char* format, ...) {
     va_end(ap);
 }
 
+bool log_enabled(Log_Level level) {
+    try {
+        Log_Guard guard;
+        return (_initialized || _start()) && int(level) <= _level;
+    } catch (...) {
+        return false;
+    }
+}
+
 int log_set_level(const String& name) {
     int level = _level_of(name.c_str());
     if (level < 0)

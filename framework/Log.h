@@ -32,6 +32,10 @@ void log(Log_Level level, const char* file, int line, const char* format, ...)
 void vlog(Log_Level level, const char* file, int line, const char* format, va_list ap)
     __attribute__((format(printf, 4, 0)));
 
+// Whether a message at `level` would be written (reads the configuration
+// as a message would). For callers that must prepare what they log.
+bool log_enabled(Log_Level level);
+
 // Sets the level by name (case-insensitive): 0, or -1 for an unknown name.
 int log_set_level(const String& name);
 

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <climits>
+#include <cstdio>
 #include <cstdlib>
 #include <fstream>
 #include <iostream>
@@ -244,6 +245,51 @@ size_t countArg(const std::string& text) {
     return size_t(n);
 }
 
+// A JSON string holding `text`.
+std::string jsonQuoted(const std::string& text) {
+    std::string q = "\"";
+    for (const char c : text) {
+        if (c == '"' || c == '\\') {
+            q += '\\';
+            q += c;
+        } else if (static_cast<unsigned char>(c) < 0x20) {
+            char escaped[8];
+            std::snprintf(escaped, sizeof escaped, "\\u%04x", unsigned(c));
+            q += escaped;
+        } else {
+            q += c;
+        }
+    }
+    return q + '"';
+}
+
+// The management tunnel: a JSON-RPC request for METHOD with PARAMS (JSON
+// text, [] when left out) to executeMethod of the module's agent service;
+// prints the response.
+int cmdRpc(Env& e, const CommandArgs& a) {
+    const Result<ObjectPath> agents =
+        e.host.enumerateInstanceNames(e.inv.nameSpace, "TAVRIN_AgentService");
+    if (!agents.ok())
+        return failed(e.err, agents);
+    if (agents.items.empty())
+        return failed(e.err, Status{CMPI_RC_ERR_NOT_FOUND, "no TAVRIN_AgentService instance"});
+    const std::string params = a.positional.size() > 1 ? a.positional[1] : "[]";
+    const std::string request =
+        "{\"version\": \"1.1\", \"id\": 1, \"method\": " + jsonQuoted(a.positional[0]) +
+        ", \"params\": " + params + "}";
+    const MethodResult r = e.host.invokeMethod(agents.items.front(), "executeMethod",
+                                               {Property{"request", Value::string(request)}});
+    if (!r.ok())
+        return failed(e.err, r);
+    const Value* response = findProperty(r.out, "response");
+    if (response == nullptr || response->isNull())
+        return failed(e.err, Status{CMPI_RC_ERR_FAILED, "executeMethod gave no response"});
+    e.out << response->asString();
+    if (response->asString().empty() || response->asString().back() != '\n')
+        e.out << '\n';
+    return 0;
+}
+
 int cmdIndications(Env& e, const CommandArgs& a) {
     double seconds = 10;
     if (a.positional.size() == 2) {
@@ -470,6 +516,15 @@ const Command kCommands[] = {
      false,
      cmdCallMethod},
     {"im", "PATH METHOD [ARG=VALUE]...", "", {}, 2, SIZE_MAX, true, true, cmdCallMethod},
+    {"rpc",
+     "METHOD [PARAMS]",
+     "call a management method (PARAMS: a JSON array), print the response",
+     {},
+     1,
+     2,
+     true,
+     false,
+     cmdRpc},
     {"ind",
      "CLASS [SECONDS] [--count N]",
      "subscribe and print indications for SECONDS (default 10) or until N came",

@@ -1,6 +1,7 @@
 // The provider of TAVRIN_AgentService.
 #include "providers/Server_Profile.h"
 #include "providers/generated/TAVRIN_AgentService_Methods.h"
+#include "rpc/JsonRpcManager.h"
 
 namespace CPTA {
 
@@ -10,7 +11,18 @@ const Inventory_Source TAVRIN_AgentService_Source = {
 
 class TAVRIN_AgentService_Provider
     : public Inventory_Provider<TAVRIN_AgentService, TAVRIN_AgentService_Source>,
-      public TAVRIN_AgentService_Methods {};
+      public TAVRIN_AgentService_Methods {
+public:
+    // The management tunnel: a JSON-RPC request in, its response out. Every
+    // failure is reported inside the response; the method itself succeeds.
+    Invoke_Method_Status executeMethod(const TAVRIN_AgentService*, Property<String>& response,
+                                       const Property<String>& request,
+                                       Property<uint32>& return_value) {
+        response.set(JsonRpcManager::executeMethod(request));
+        return_value.set(0);
+        return INVOKE_METHOD_OK;
+    }
+};
 
 }  // namespace CPTA
 
