@@ -85,6 +85,21 @@ String adapterKeyAt(const Json::Value& answer, int number) {
     return jsonAsString(keys[Json::ArrayIndex(number - 1)]);
 }
 
+String owningAdapterKey(const String& portKey) {
+    Json::Value answer;
+    if (!guardedCall(LibCall("libGetAdapterIdByPort", portKey), libGetAdapterIdByPort,
+                     keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(portKey)), answer))
+        return String();
+    const Json::Value* id = jsonMember(answer, "adapterId");
+    if (!ProviderUtil::isValidJsonResponse(answer) || id == nullptr || !id->isUInt() ||
+        id->asUInt() == 0)
+        return String();
+    Json::Value adapters;
+    if (listAdapters(adapters, false) < int(id->asUInt()))
+        return String();
+    return adapterKeyAt(adapters, int(id->asUInt()));
+}
+
 bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
     const Json::Value colonId = jsonText(ProviderUtil::getIndexInColonFormat(portId));
     request = Json::Value(Json::objectValue);

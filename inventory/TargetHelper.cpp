@@ -118,7 +118,8 @@ bool TargetHelper::readLun(const Json::Value& u, const String& remotePortWwn, _h
     return true;
 }
 
-Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, classId_t classId) {
+Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, classId_t classId,
+                                                  const PortScope& scope) {
     return runWalk("TargetHelper::getTargetInstances", [&](InstanceList& out) {
         TVRN_LOG(LL_DBG, "Entering: %s", "getTargetInstances");
         Json::Value request, remotePorts;
@@ -128,6 +129,8 @@ Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, clas
 
         for (Json::ArrayIndex k = 0; k < remotePorts.size(); k++) {
             const String remoteWwn = jsonString(remotePorts[k], "remotePortWwn");
+            if (!scope.admitsRemote(ProviderUtil::eraseColonsFromIndex(remoteWwn)))
+                continue;
             request["rPortWwn"] = jsonText(remoteWwn);
             Json::Value answer;
             guardedCall(LibCall("libGetCompleteRemotePort"), libGetCompleteRemotePort, request,
