@@ -113,4 +113,32 @@ bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& re
     return true;
 }
 
+bool listRemotePorts(const String& portId, const String& remoteWwn, Json::Value& request,
+                     Json::Value& remotePorts) {
+    if (remoteWwn.size() == 0)
+        return listRemotePorts(portId, request, remotePorts);
+    const Json::Value colonId = jsonText(ProviderUtil::getIndexInColonFormat(portId));
+    request = Json::Value(Json::objectValue);
+    request["pPortWwn"] = colonId;
+    request["lPortWwn"] = colonId;
+    remotePorts = Json::Value(Json::arrayValue);
+    Json::Value named(Json::objectValue);
+    named["remotePortWwn"] = jsonText(ProviderUtil::getIndexInColonFormat(remoteWwn));
+    named["named"] = true;
+    remotePorts.append(named);
+    return true;
+}
+
+String remotePortWwn(const Json::Value& listed, const Json::Value& record) {
+    const String asListed = jsonString(listed, "remotePortWwn");
+    if (!jsonHas(listed, "named", Json::booleanValue) ||
+        !jsonHas(record, "remotePortWwn", Json::stringValue))
+        return asListed;
+    const String asRecorded = jsonString(record, "remotePortWwn");
+    return ProviderUtil::eraseColonsFromIndex(asRecorded)
+                   .equali(ProviderUtil::eraseColonsFromIndex(asListed))
+               ? asRecorded
+               : asListed;
+}
+
 }  // namespace CPTA

@@ -142,6 +142,14 @@ void forEachAdapter(const char* noAdapters, bool logCount, Visit&& visit) {
 // "rPortWwn". False (after "libGetAllRemotePorts returns NULL.") when the
 // answer is not a list.
 bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts);
+// The same when only the remote port `remoteWwn` (colon-free; "" every one)
+// is wanted: the list then names just that port, without asking the library,
+// which is asked about it next anyway.
+bool listRemotePorts(const String& portId, const String& remoteWwn, Json::Value& request,
+                     Json::Value& remotePorts);
+// The WWN of a remote port as the list spelled it, or, for a port named
+// alone, as the library's complete record of it spells it (when it does).
+String remotePortWwn(const Json::Value& listed, const Json::Value& record);
 
 }  // namespace CPTA
 

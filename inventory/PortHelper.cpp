@@ -248,7 +248,7 @@ void PortHelper::addEndpoints(_hbaPortInfo& record, InstanceList& out, const Por
         return;
     const String ownId = record.portId;
     Json::Value request, remotePorts;
-    if (!listRemotePorts(ownId, request, remotePorts))
+    if (!listRemotePorts(ownId, scope.namedRemote(), request, remotePorts))
         return;
     TVRN_LOG(LL_DBG, "Number of Rports = %u", unsigned(remotePorts.size()));
     for (const Json::Value& remote : remotePorts) {
@@ -271,7 +271,7 @@ void PortHelper::addEndpoints(_hbaPortInfo& record, InstanceList& out, const Por
         if (!jsonBool(device, "isTarget"))
             continue;
         record.portId.append('_');
-        record.portId.append(ProviderUtil::eraseColonsFromIndex(remoteWwn));
+        record.portId.append(ProviderUtil::eraseColonsFromIndex(remotePortWwn(remote, answer)));
         record.portState = jsonInt(device, "stateMofValue");
         out.add(getSCSIProtocolEndpointInstance(record, false));
     }

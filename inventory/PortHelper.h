@@ -37,6 +37,8 @@ struct PortScope {
     bool admitsRemote(const String& wwn) const {
         return remotes == ALL_REMOTES || (remotes == ONE_REMOTE && remote.equali(wwn));
     }
+    // The one remote port named, or "".
+    String namedRemote() const { return remotes == ONE_REMOTE ? remote : String(); }
 };
 
 class PortHelper {

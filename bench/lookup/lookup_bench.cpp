@@ -137,7 +137,7 @@ int main(int argc, char** argv) {
         benchmark::RegisterBenchmark(("crawl/TAVRIN_StorageExtent" + size).c_str(), crawl, &host,
                                      "TAVRIN_StorageExtent")
             ->Unit(benchmark::kMillisecond)
-            ->Iterations(1);
+            ->Iterations(3);
     }
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();
