@@ -151,6 +151,54 @@ std::vector<unsigned long long> callsPerGet(Module_Session& s, const char* fixtu
     return calls;
 }
 
+// Library calls of the LUN paths from the first SCSI endpoint whose role is
+// `role` (2 initiator, 3 target) and from the first storage extent.
+std::vector<unsigned long long> callsPerPathRequest(Module_Session& s, const char* fixture) {
+    EXPECT_EQ(tvrn_sim_load_fixture_text(fixture), 0) << tvrn_sim_last_error();
+    std::vector<ObjectPath> sources;
+    for (unsigned long long role : {2, 3})
+        for (const Instance& e : s.enumerate("TAVRIN_SCSIProtocolEndpoint").items)
+            if (e.get("Role") && e.get("Role")->asUint() == role) {
+                sources.push_back(e.path());
+                break;
+            }
+    Result<ObjectPath> extents = s.enumerateNames("TAVRIN_StorageExtent");
+    if (!extents.items.empty())
+        sources.push_back(extents.items.front());
+    EXPECT_EQ(sources.size(), 3u);
+    std::vector<unsigned long long> calls;
+    for (const ObjectPath& source : sources) {
+        s.resetCounters();
+        Result<ObjectPath> ends =
+            s.host().associatorNames(source, "TAVRIN_SCSIInitiatorTargetLogicalUnitPath");
+        EXPECT_TRUE(ends.ok() && !ends.items.empty()) << source.toString();
+        calls.push_back(s.totalCalls());
+    }
+    return calls;
+}
+
+TEST(Lookup, APathRequestFromOneEndAsksTheLibraryOnlyAboutItsPort) {
+    Module_Session& s = Module_Session::open();
+    ASSERT_TRUE(s.loaded());
+    // The same targets behind each port; more adapters, ports, targets and
+    // LUNs elsewhere.
+    const auto small = callsPerPathRequest(s, R"({"generate": {"fcHbas": 1, "cnas": 1,
+        "portsPerAdapter": 2, "targetsPerPort": 3, "lunsPerTarget": 2,
+        "tapeTargetsPerPort": 1, "initiatorsPerPort": 1}})");
+    const auto large = callsPerPathRequest(s, R"({"generate": {"fcHbas": 5, "cnas": 3,
+        "portsPerAdapter": 4, "targetsPerPort": 3, "lunsPerTarget": 2,
+        "tapeTargetsPerPort": 1, "initiatorsPerPort": 1}})");
+    EXPECT_EQ(small, large);
+    // From a target or a LUN: the same however many targets the port has.
+    const auto moreTargets = callsPerPathRequest(s, R"({"generate": {"fcHbas": 1, "cnas": 1,
+        "portsPerAdapter": 2, "targetsPerPort": 24, "lunsPerTarget": 16,
+        "tapeTargetsPerPort": 4, "initiatorsPerPort": 2}})");
+    ASSERT_EQ(moreTargets.size(), 3u);
+    EXPECT_EQ(moreTargets[1], small[1]);
+    EXPECT_EQ(moreTargets[2], small[2]);
+    tvrn_sim_reset();
+}
+
 TEST(Lookup, AGetAsksTheLibraryAsMuchOnALargeHostAsOnASmallOne) {
     Module_Session& s = Module_Session::open();
     ASSERT_TRUE(s.loaded());
