@@ -2,6 +2,7 @@
 // the dispatchers, and adapter serial numbers from the adapter library.
 #include "providers/Association_Pairing.h"
 
+#include <cctype>
 #include <cstdlib>
 #include <exception>
 #include <map>
@@ -16,6 +17,7 @@
 #include "inventory/EthernetPortHelper.h"
 #include "inventory/FCHBAManager.h"
 #include "inventory/HostIdentityScope.h"
+#include "inventory/PortHelper.h"
 #include "schema/generated/TAVRIN_AdapterSoftwareIdentity.h"
 #include "schema/generated/TAVRIN_AlarmDevice.h"
 #include "schema/generated/TAVRIN_CIMXMLCommunicationMechanism.h"
@@ -267,6 +269,36 @@ Enum_References_Status scoped_references(const Pairing& rule, const Meta_Class* 
                    ENUM_INSTANCES_FAILED
                ? ENUM_REFERENCES_FAILED
                : ENUM_REFERENCES_OK;
+}
+
+One_Port_Scope::One_Port_Scope(const Instance* source) : _reach(UNKNOWN) {
+    const Property<String>* named = nullptr;
+    for (const char* key : {"DeviceID", "InstanceID", "Name"}) {
+        const Property<String>* p = text_property(source, key);
+        if (p == nullptr || p->null)
+            continue;
+        if (named != nullptr)
+            return;  // not an object of a port
+        named = p;
+    }
+    if (named == nullptr)
+        return;
+    _reach = NOTHING;
+    const String& wwn = named->value;
+    if (wwn.size() != 16)
+        return;
+    for (size_t i = 0; i < wwn.size(); i++)
+        if (!isxdigit(static_cast<unsigned char>(wwn[i])))
+            return;
+    _port = wwn;
+    _reach = NARROWED;
+}
+
+Array<Instance*> One_Port_Scope::fetch(classId_t id) {
+    PortScope scope;
+    scope.port = _port;
+    scope.remotes = PortScope::NO_REMOTES;
+    return FCHBAManager::getFCHBAManager()->getInstancesByPort(id, scope);
 }
 
 // ---- keys of physical connectors ---------------------------------------------

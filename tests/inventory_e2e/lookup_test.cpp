@@ -313,3 +313,19 @@ TEST(ScopedAssociations, LunPathsFromEachEndAnswerWhatFilteringGives) {
 }
 
 }  // namespace
+
+namespace {
+
+TEST(ScopedAssociations, TheObjectsOfOnePortAnswerWhatFilteringGives) {
+    const std::vector<std::string> ends = {"TAVRIN_FCPort", "TAVRIN_FCPortStatistics",
+                                           "TAVRIN_AlarmDevice", "TAVRIN_SCSIProtocolEndpoint",
+                                           "TAVRIN_PortController"};
+    expectAssociationsEqualFiltering("TAVRIN_ElementStatisticalData", ends,
+                                     {"", "ManagedElement", "Stats"});
+    expectAssociationsEqualFiltering("TAVRIN_AssociatedAlarm", ends,
+                                     {"", "Antecedent", "Dependent"});
+    expectAssociationsEqualFiltering("TAVRIN_DeviceSAPImplementation", ends,
+                                     {"", "Antecedent", "Dependent"});
+}
+
+}  // namespace
