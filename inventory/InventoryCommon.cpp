@@ -100,11 +100,21 @@ String owningAdapterKey(const String& portKey) {
     return adapterKeyAt(adapters, int(id->asUInt()));
 }
 
-bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
+namespace {
+
+// A request about the remote ports of the local port `portId`.
+Json::Value remotePortRequest(const String& portId) {
     const Json::Value colonId = jsonText(ProviderUtil::getIndexInColonFormat(portId));
-    request = Json::Value(Json::objectValue);
+    Json::Value request(Json::objectValue);
     request["pPortWwn"] = colonId;
     request["lPortWwn"] = colonId;
+    return request;
+}
+
+}  // namespace
+
+bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
+    request = remotePortRequest(portId);
     guardedCall(LibCall("libGetAllRemotePorts"), libGetAllRemotePorts, request, remotePorts);
     if (!ProviderUtil::isValidJsonResponse(remotePorts) || !remotePorts.isArray()) {
         TVRN_LOG(LL_ERR, "libGetAllRemotePorts returns NULL.");
@@ -117,10 +127,7 @@ bool listRemotePorts(const String& portId, const String& remoteWwn, Json::Value&
                      Json::Value& remotePorts) {
     if (remoteWwn.size() == 0)
         return listRemotePorts(portId, request, remotePorts);
-    const Json::Value colonId = jsonText(ProviderUtil::getIndexInColonFormat(portId));
-    request = Json::Value(Json::objectValue);
-    request["pPortWwn"] = colonId;
-    request["lPortWwn"] = colonId;
+    request = remotePortRequest(portId);
     remotePorts = Json::Value(Json::arrayValue);
     Json::Value named(Json::objectValue);
     named["remotePortWwn"] = jsonText(ProviderUtil::getIndexInColonFormat(remoteWwn));

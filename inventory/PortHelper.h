@@ -31,8 +31,8 @@ struct PortScope {
     Remotes remotes = ALL_REMOTES;
     String remote;  // colon-free WWN of the remote port for ONE_REMOTE
 
-    // Whether the port listed under `key`, or answering to `wwn` (both
-    // colon-free), is in the scope.
+    // Whether the local port / the remote port with this colon-free WWN is in
+    // the scope.
     bool admitsPort(const String& wwn) const { return port.size() == 0 || port.equali(wwn); }
     bool admitsRemote(const String& wwn) const {
         return remotes == ALL_REMOTES || (remotes == ONE_REMOTE && remote.equali(wwn));
