@@ -97,14 +97,21 @@ AdapterHelper* AdapterHelper::getAdapterHelperInstance() {
 
 Array<Instance*> AdapterHelper::getInstancesByClass(classId_t classId) {
     return runWalk("AdapterHelper::getInstancesByClass",
-                   [&](InstanceList& out) { walk(classId, out); });
+                   [&](InstanceList& out) { walk(classId, out, String()); });
 }
 
-void AdapterHelper::walk(classId_t classId, InstanceList& out) {
+Array<Instance*> AdapterHelper::getInstancesByAddress(classId_t classId, const String& address) {
+    return runWalk("AdapterHelper::getInstancesByAddress",
+                   [&](InstanceList& out) { walk(classId, out, address); });
+}
+
+void AdapterHelper::walk(classId_t classId, InstanceList& out, const String& only) {
     TVRN_LOG(LL_DBG, "Entering: %s", "getInstancesByClass");
     bool networkDriverReported = false;
     bool storageDriverReported = false;
     forEachAdapter("No adapters in the system!", true, [&](int number, const String& key) {
+        if (only.size() > 0 && !ProviderUtil::eraseColonsFromIndex(key).equali(only))
+            return;
         _adapterData record;
         Json::Value details;
         if (ProviderUtil::getAdapterDetails(key, details) != 0) {

@@ -29,6 +29,10 @@ public:
     // All instances of class 2, 6, 7 or 8 for all adapters, in adapter order.
     // Never throws: a library exception ends the walk with no instances.
     Array<Instance*> getInstancesByClass(classId_t classId);
+    // The instances of the same classes that the walk builds for the one
+    // adapter listed under `address` (colon-free WWN or MAC, in any case):
+    // only that adapter is asked about.
+    Array<Instance*> getInstancesByAddress(classId_t classId, const String& address);
 
     // Builders: one new instance each (null only when memory runs out).
     Instance* getPortControllerInstance(const _adapterData& adapter);
@@ -43,7 +47,8 @@ public:
 
 private:
     AdapterHelper() = default;
-    void walk(classId_t classId, InstanceList& out);
+    // `only`: the colon-free address of the one adapter to visit; "" all.
+    void walk(classId_t classId, InstanceList& out, const String& only);
 };
 
 }  // namespace CPTA

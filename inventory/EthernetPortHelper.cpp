@@ -86,8 +86,18 @@ Array<Instance*> EthernetPortHelper::getEthernetPortInstancesByAdapter(const Str
     });
 }
 
-void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId,
-                                     InstanceList& out) {
+Array<Instance*> EthernetPortHelper::getInstancesByPort(classId_t classId, const String& mac) {
+    return runWalk("EthernetPortHelper::getInstancesByPort", [&](InstanceList& out) {
+        // As the walk of all adapters: the key from the adapter list, and
+        // only an adapter with Ethernet ports.
+        const String key = owningAdapterKey(mac);
+        if (key.size() > 0 && ProviderUtil::hasEthernetPort(key))
+            walkAdapter(key, classId, out, mac);
+    });
+}
+
+void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId, InstanceList& out,
+                                     const String& onlyPort) {
     Json::Value ports;
     guardedCall(LibCall("libGetEthPhyPortIndicesByAdapter", adapterKey),
                 libGetEthPhyPortIndicesByAdapter, keyRequest("indexStr", adapterKey), ports);
@@ -99,6 +109,8 @@ void EthernetPortHelper::walkAdapter(const String& adapterKey, classId_t classId
     const Json::Value& keys = jsonArray(ports, "indexStrings");
     for (Json::ArrayIndex i = 0; i < keys.size(); i++) {
         const String portKey = jsonAsString(keys[i]);
+        if (onlyPort.size() > 0 && !ProviderUtil::eraseColonsFromIndex(portKey).equali(onlyPort))
+            continue;
         Json::Value details;
         if (getEthPortDetails(portKey, details) != 0) {
             TVRN_LOG(LL_ERR, "Unable to get Eth port data for %s", portKey.c_str());

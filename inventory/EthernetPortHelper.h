@@ -29,6 +29,9 @@ public:
     // The TAVRIN_EthernetPort instances of the adapter that owns the given
     // port or adapter address.
     Array<Instance*> getEthernetPortInstancesByAdapter(const String& portKey);
+    // The instances of class 20 or 34 that the walk builds for the one port
+    // `mac` (colon-free): only that port and its adapter are asked about.
+    Array<Instance*> getInstancesByPort(classId_t classId, const String& mac);
 
     // The library's record of one Ethernet port; 0 when it carries an object
     // "ethData", else -1. Also serves ProviderUtil::getEthDeviceNameByMAC.
@@ -42,7 +45,9 @@ public:
 
 private:
     EthernetPortHelper() = default;
-    void walkAdapter(const String& adapterKey, classId_t classId, InstanceList& out);
+    // `onlyPort`: the colon-free MAC of the one port to visit; "" all.
+    void walkAdapter(const String& adapterKey, classId_t classId, InstanceList& out,
+                     const String& onlyPort = String());
 };
 
 }  // namespace CPTA

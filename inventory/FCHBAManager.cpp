@@ -148,6 +148,13 @@ Array<Instance*> FCHBAManager::getEthernetPortInstancesByAdapter(const String& p
     return _ethernetPortHelper->getEthernetPortInstancesByAdapter(portKey);
 }
 
+Array<Instance*> FCHBAManager::getInstancesByPort(classId_t classId, const PortScope& scope) {
+    HostIdentityScope host;
+    if (!ProviderUtil::getDriverStatus())
+        return Array<Instance*>();
+    return _portHelper->getInstancesByPort(classId, scope);
+}
+
 // ---- HDRManager --------------------------------------------------------------------
 
 HDRManager::HDRManager() : _portHelper(PortHelper::getPortHelperObject()) {

@@ -20,6 +20,7 @@
 namespace CPTA {
 
 class AdapterHelper;
+struct PortScope;
 class CommonHelper;
 class EthernetPortHelper;
 class PhysicalAssetHelper;
@@ -46,6 +47,10 @@ public:
     Array<Instance*> getFCPortInstancesByAdapter(const String& adapterKey);
     // The TAVRIN_EthernetPort instances of the adapter owning this port.
     Array<Instance*> getEthernetPortInstancesByAdapter(const String& portKey);
+    // The instances of an FC port class (3, 4, 5, 30, 36) or of a class the
+    // targets give (9, 16, 38) for the one port and the remote ports of the
+    // scope (PortHelper::getInstancesByPort), behind the driver gate.
+    Array<Instance*> getInstancesByPort(classId_t classId, const PortScope& scope);
 
     AdapterHelper* getAdapterHelper() const { return _adapterHelper; }
     PortHelper* getPortHelper() const { return _portHelper; }

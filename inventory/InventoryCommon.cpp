@@ -85,17 +85,67 @@ String adapterKeyAt(const Json::Value& answer, int number) {
     return jsonAsString(keys[Json::ArrayIndex(number - 1)]);
 }
 
-bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
+String owningAdapterKey(const String& portKey) {
+    Json::Value answer;
+    if (!guardedCall(LibCall("libGetAdapterIdByPort", portKey), libGetAdapterIdByPort,
+                     keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(portKey)), answer))
+        return String();
+    const Json::Value* id = jsonMember(answer, "adapterId");
+    if (!ProviderUtil::isValidJsonResponse(answer) || id == nullptr || !id->isUInt() ||
+        id->asUInt() == 0)
+        return String();
+    Json::Value adapters;
+    if (listAdapters(adapters, false) < int(id->asUInt()))
+        return String();
+    return adapterKeyAt(adapters, int(id->asUInt()));
+}
+
+namespace {
+
+// A request about the remote ports of the local port `portId`.
+Json::Value remotePortRequest(const String& portId) {
     const Json::Value colonId = jsonText(ProviderUtil::getIndexInColonFormat(portId));
-    request = Json::Value(Json::objectValue);
+    Json::Value request(Json::objectValue);
     request["pPortWwn"] = colonId;
     request["lPortWwn"] = colonId;
+    return request;
+}
+
+}  // namespace
+
+bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts) {
+    request = remotePortRequest(portId);
     guardedCall(LibCall("libGetAllRemotePorts"), libGetAllRemotePorts, request, remotePorts);
     if (!ProviderUtil::isValidJsonResponse(remotePorts) || !remotePorts.isArray()) {
         TVRN_LOG(LL_ERR, "libGetAllRemotePorts returns NULL.");
         return false;
     }
     return true;
+}
+
+bool listRemotePorts(const String& portId, const String& remoteWwn, Json::Value& request,
+                     Json::Value& remotePorts) {
+    if (remoteWwn.size() == 0)
+        return listRemotePorts(portId, request, remotePorts);
+    request = remotePortRequest(portId);
+    remotePorts = Json::Value(Json::arrayValue);
+    Json::Value named(Json::objectValue);
+    named["remotePortWwn"] = jsonText(ProviderUtil::getIndexInColonFormat(remoteWwn));
+    named["named"] = true;
+    remotePorts.append(named);
+    return true;
+}
+
+String remotePortWwn(const Json::Value& listed, const Json::Value& record) {
+    const String asListed = jsonString(listed, "remotePortWwn");
+    if (!jsonHas(listed, "named", Json::booleanValue) ||
+        !jsonHas(record, "remotePortWwn", Json::stringValue))
+        return asListed;
+    const String asRecorded = jsonString(record, "remotePortWwn");
+    return ProviderUtil::eraseColonsFromIndex(asRecorded)
+                   .equali(ProviderUtil::eraseColonsFromIndex(asListed))
+               ? asRecorded
+               : asListed;
 }
 
 }  // namespace CPTA

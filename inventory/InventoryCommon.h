@@ -116,6 +116,13 @@ int listAdapters(Json::Value& answer, bool logCount);
 // Key of adapter `number` (from 1) of such a list; "" when the entry is not text.
 String adapterKeyAt(const Json::Value& answer, int number);
 
+// The key, as the adapter list gives it, of the adapter that owns the port
+// `portKey` (WWN or MAC, with or without colons): one question about the port
+// and one reading of the list. "" when no adapter owns it or the library
+// cannot say. The question about the port is a guarded call; the list is read
+// as listAdapters reads it.
+String owningAdapterKey(const String& portKey);
+
 // Calls visit(number, key) for every adapter of the library's list, in
 // adapter order; an empty list logs `noAdapters` (WARN).
 template <class Visit>
@@ -135,6 +142,14 @@ void forEachAdapter(const char* noAdapters, bool logCount, Visit&& visit) {
 // "rPortWwn". False (after "libGetAllRemotePorts returns NULL.") when the
 // answer is not a list.
 bool listRemotePorts(const String& portId, Json::Value& request, Json::Value& remotePorts);
+// The same when only the remote port `remoteWwn` (colon-free; "" every one)
+// is wanted: the list then names just that port, without asking the library,
+// which is asked about it next anyway.
+bool listRemotePorts(const String& portId, const String& remoteWwn, Json::Value& request,
+                     Json::Value& remotePorts);
+// The WWN of a remote port as the list spelled it, or, for a port named
+// alone, as the library's complete record of it spells it (when it does).
+String remotePortWwn(const Json::Value& listed, const Json::Value& record);
 
 }  // namespace CPTA
 

@@ -22,6 +22,7 @@ namespace {
 
 const sint64 kGigabit = 1000000000;
 const sint64 kSpeedUnknown = 99999;  // "operatingSpeed" of a port without link
+const size_t kWwnDigits = 16;
 
 // Gigabits per second as bits per second; 0 for a negative or an impossible
 // figure.
@@ -116,22 +117,33 @@ PortHelper* PortHelper::getPortHelperObject() {
 
 Array<Instance*> PortHelper::getInstancesByClass(classId_t classId) {
     return runWalk("PortHelper::getInstancesByClass", [&](InstanceList& out) {
-        forEachAdapter("No adapters in the system. ", false,
-                       [&](int, const String& key) { walkAdapter(key, classId, BY_NUMBER, out); });
+        forEachAdapter("No adapters in the system. ", false, [&](int, const String& key) {
+            walkAdapter(key, classId, BY_NUMBER, out, PortScope());
+        });
     });
 }
 
 Array<Instance*> PortHelper::getInstancesByAdapterId(int adapterNumber, classId_t classId,
                                                      const Json::Value& allAdapters) {
     return runWalk("PortHelper::getInstancesByAdapterId", [&](InstanceList& out) {
-        walkAdapter(adapterKeyAt(allAdapters, adapterNumber), classId, BY_NUMBER, out);
+        walkAdapter(adapterKeyAt(allAdapters, adapterNumber), classId, BY_NUMBER, out, PortScope());
     });
 }
 
 Array<Instance*> PortHelper::getInstancesByAdapterAddress(const String& adapterKey,
                                                           classId_t classId) {
     return runWalk("PortHelper::getInstancesByAdapterAddress", [&](InstanceList& out) {
-        walkAdapter(ProviderUtil::getIndexInColonFormat(adapterKey), classId, BY_ADDRESS, out);
+        walkAdapter(ProviderUtil::getIndexInColonFormat(adapterKey), classId, BY_ADDRESS, out,
+                    PortScope());
+    });
+}
+
+Array<Instance*> PortHelper::getInstancesByPort(classId_t classId, const PortScope& scope) {
+    return runWalk("PortHelper::getInstancesByPort", [&](InstanceList& out) {
+        // As the walk of all ports: the adapter's key from the adapter list.
+        const String key = owningAdapterKey(scope.port);
+        if (key.size() > 0)
+            walkAdapter(key, classId, BY_NUMBER, out, scope);
     });
 }
 
@@ -141,7 +153,7 @@ Array<Instance*> PortHelper::getFCPortInstancesByAdapter(const String& adapterKe
 }
 
 void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkForm form,
-                             InstanceList& out) {
+                             InstanceList& out, const PortScope& scope) {
     Json::Value ports;
     guardedCall(LibCall("libGetFcPhyPortIndicesByAdapter"), libGetFcPhyPortIndicesByAdapter,
                 keyRequest("indexStr", adapterKey), ports);
@@ -162,6 +174,10 @@ void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkFo
 
     for (Json::ArrayIndex i = 0; i < keys.size(); i++) {
         const String portKey = jsonAsString(keys[i]);
+        // A port listed by its WWN is known to be out of scope without asking.
+        const String listed = ProviderUtil::eraseColonsFromIndex(portKey);
+        if (listed.size() == kWwnDigits && !scope.admitsPort(listed))
+            continue;
         Json::Value port;
         if (!guardedCall(LibCall("libGetPortByWwn"), libGetPortByWwn, keyRequest("wwn", portKey),
                          port))
@@ -175,6 +191,8 @@ void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkFo
         record.portNumber = sint32(i);
         record.hostName = HostIdentityScope::hostText();
         record.portId = ProviderUtil::eraseColonsFromIndex(jsonString(port, "wwn"));
+        if (!scope.admitsPort(record.portId))
+            continue;
         record.nodeWwn = ProviderUtil::eraseColonsFromIndex(jsonString(port, "nodeWwn"));
         record.symbolicName = jsonString(port, "PortSymbolicName");
         const sint64 speed = jsonInt64(port, "operatingSpeed");
@@ -185,24 +203,26 @@ void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkFo
         record.portType = jsonInt(port, "portTypeMOFValue");
         record.maxFrameSize = jsonInt64(port, "maxFrameSize");
         record.portState = jsonInt(port, "portStatusValue");
-        addPortInstances(port, portKey, record, classId, out);
+        addPortInstances(port, portKey, record, classId, out, scope);
     }
     TVRN_LOG(LL_DBG, "Returning: %s", "getInstancesByAdapterId");
 }
 
 void PortHelper::addPortInstances(const Json::Value& port, const String& portKey,
-                                  _hbaPortInfo& record, classId_t classId, InstanceList& out) {
+                                  _hbaPortInfo& record, classId_t classId, InstanceList& out,
+                                  const PortScope& scope) {
     switch (classId) {
         case CID_FC_PORT: out.add(getFCPortInstance(record)); break;
         case CID_SCSI_PROTOCOL_ENDPOINT:
-            out.add(getSCSIProtocolEndpointInstance(record, true));
-            addEndpoints(record, out);
+            if (scope.remotes != PortScope::ONE_REMOTE)
+                out.add(getSCSIProtocolEndpointInstance(record, true));
+            addEndpoints(record, out, scope);
             break;
         case CID_FC_PORT_STATISTICS: addStatistics(port, portKey, record, out); break;
         case CID_STORAGE_EXTENT:
         case CID_TAPE_DRIVE:
         case CID_LOGICAL_DISK: {
-            Array<Instance*> targets = _targetHelper->getTargetInstances(record, classId);
+            Array<Instance*> targets = _targetHelper->getTargetInstances(record, classId, scope);
             out.take(targets);
             break;
         }
@@ -223,15 +243,19 @@ void PortHelper::addPortInstances(const Json::Value& port, const String& portKey
 }
 
 // The endpoints of the remote targets seen through the port.
-void PortHelper::addEndpoints(_hbaPortInfo& record, InstanceList& out) {
+void PortHelper::addEndpoints(_hbaPortInfo& record, InstanceList& out, const PortScope& scope) {
+    if (scope.remotes == PortScope::NO_REMOTES)
+        return;
     const String ownId = record.portId;
     Json::Value request, remotePorts;
-    if (!listRemotePorts(ownId, request, remotePorts))
+    if (!listRemotePorts(ownId, scope.namedRemote(), request, remotePorts))
         return;
     TVRN_LOG(LL_DBG, "Number of Rports = %u", unsigned(remotePorts.size()));
     for (const Json::Value& remote : remotePorts) {
         record.portId = ownId;
         const String remoteWwn = jsonString(remote, "remotePortWwn");
+        if (!scope.admitsRemote(ProviderUtil::eraseColonsFromIndex(remoteWwn)))
+            continue;
         request["rPortWwn"] = jsonText(remoteWwn);
         Json::Value answer;
         // An exception ends the handling of this port's remote ports.
@@ -247,7 +271,7 @@ void PortHelper::addEndpoints(_hbaPortInfo& record, InstanceList& out) {
         if (!jsonBool(device, "isTarget"))
             continue;
         record.portId.append('_');
-        record.portId.append(ProviderUtil::eraseColonsFromIndex(remoteWwn));
+        record.portId.append(ProviderUtil::eraseColonsFromIndex(remotePortWwn(remote, answer)));
         record.portState = jsonInt(device, "stateMofValue");
         out.add(getSCSIProtocolEndpointInstance(record, false));
     }

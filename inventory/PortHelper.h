@@ -19,6 +19,28 @@ namespace CPTA {
 class InstanceList;
 class TargetHelper;
 
+// Narrows a port walk to what the keys of one object name. The default scope
+// lets every port and every remote port through.
+struct PortScope {
+    enum Remotes {
+        ALL_REMOTES,  // every remote port, and the port's own endpoint
+        NO_REMOTES,   // the port's own endpoint only
+        ONE_REMOTE,   // the remote port `remote` only
+    };
+    String port;  // colon-free WWN of the one local port; "" every port
+    Remotes remotes = ALL_REMOTES;
+    String remote;  // colon-free WWN of the remote port for ONE_REMOTE
+
+    // Whether the local port / the remote port with this colon-free WWN is in
+    // the scope.
+    bool admitsPort(const String& wwn) const { return port.size() == 0 || port.equali(wwn); }
+    bool admitsRemote(const String& wwn) const {
+        return remotes == ALL_REMOTES || (remotes == ONE_REMOTE && remote.equali(wwn));
+    }
+    // The one remote port named, or "".
+    String namedRemote() const { return remotes == ONE_REMOTE ? remote : String(); }
+};
+
 class PortHelper {
 public:
     static PortHelper* getPortHelperObject();
@@ -45,6 +67,11 @@ public:
     Array<Instance*> getInstancesByAdapterAddress(const String& adapterKey, classId_t classId);
     // The TAVRIN_FCPort instances of one adapter.
     Array<Instance*> getFCPortInstancesByAdapter(const String& adapterKey);
+    // The instances of the same classes that the walk builds for the port
+    // `scope.port` and the remote ports of the scope alone: the library is
+    // asked only about that port's adapter, that port and those remote ports.
+    // Nothing when no adapter owns the port.
+    Array<Instance*> getInstancesByPort(classId_t classId, const PortScope& scope);
 
     // Builders: one new instance each (null only when memory runs out).
     Instance* getFCPortInstance(const _hbaPortInfo& port);
@@ -75,10 +102,11 @@ public:
 private:
     PortHelper();
     enum WalkForm { BY_NUMBER, BY_ADDRESS };
-    void walkAdapter(const String& adapterKey, classId_t classId, WalkForm form, InstanceList& out);
+    void walkAdapter(const String& adapterKey, classId_t classId, WalkForm form, InstanceList& out,
+                     const PortScope& scope);
     void addPortInstances(const Json::Value& port, const String& portKey, _hbaPortInfo& record,
-                          classId_t classId, InstanceList& out);
-    void addEndpoints(_hbaPortInfo& record, InstanceList& out);
+                          classId_t classId, InstanceList& out, const PortScope& scope);
+    void addEndpoints(_hbaPortInfo& record, InstanceList& out, const PortScope& scope);
     void addStatistics(const Json::Value& port, const String& portKey, const _hbaPortInfo& record,
                        InstanceList& out);
 

@@ -118,16 +118,19 @@ bool TargetHelper::readLun(const Json::Value& u, const String& remotePortWwn, _h
     return true;
 }
 
-Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, classId_t classId) {
+Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, classId_t classId,
+                                                  const PortScope& scope) {
     return runWalk("TargetHelper::getTargetInstances", [&](InstanceList& out) {
         TVRN_LOG(LL_DBG, "Entering: %s", "getTargetInstances");
         Json::Value request, remotePorts;
-        if (!listRemotePorts(port.portId, request, remotePorts))
+        if (!listRemotePorts(port.portId, scope.namedRemote(), request, remotePorts))
             return;
         TVRN_LOG(LL_DBG, "libGetAllRemotePorts. Number of rports -  %d", int(remotePorts.size()));
 
         for (Json::ArrayIndex k = 0; k < remotePorts.size(); k++) {
-            const String remoteWwn = jsonString(remotePorts[k], "remotePortWwn");
+            String remoteWwn = jsonString(remotePorts[k], "remotePortWwn");
+            if (!scope.admitsRemote(ProviderUtil::eraseColonsFromIndex(remoteWwn)))
+                continue;
             request["rPortWwn"] = jsonText(remoteWwn);
             Json::Value answer;
             guardedCall(LibCall("libGetCompleteRemotePort"), libGetCompleteRemotePort, request,
@@ -136,6 +139,7 @@ Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, clas
                 TVRN_LOG(LL_ERR, "libGetCompleteRemotePort response is null or has error");
                 continue;
             }
+            remoteWwn = remotePortWwn(remotePorts[k], answer);
             TVRN_LOG(LL_DBG, "Loop for the rport index =   %d", int(k));
             const Json::Value& device = jsonObject(answer, "deviceData");
             if (!jsonBool(device, "isTarget")) {

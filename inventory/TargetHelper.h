@@ -10,6 +10,7 @@
 #include "framework/Instance.h"
 #include "gateway/ClassId.h"
 #include "inventory/InventoryRecords.h"
+#include "inventory/PortHelper.h"
 
 namespace CPTA {
 
@@ -18,8 +19,10 @@ public:
     static TargetHelper* getTargetHelperObject();
 
     // The instances of class 9, 16 or 38 behind the local port `port`
-    // (its portId is the port's colon-free WWN). Never throws.
-    Array<Instance*> getTargetInstances(const _hbaPortInfo& port, classId_t classId);
+    // (its portId is the port's colon-free WWN), from the remote ports the
+    // scope admits (only those are asked about). Never throws.
+    Array<Instance*> getTargetInstances(const _hbaPortInfo& port, classId_t classId,
+                                        const PortScope& scope = PortScope());
 
     // Builders: one new instance each (null only when memory runs out).
     Instance* getStorageExtentInstance(const _hbaPortInfo& port, const _hbaLunInfo& lun);

@@ -2,6 +2,7 @@
 // the dispatchers, and adapter serial numbers from the adapter library.
 #include "providers/Association_Pairing.h"
 
+#include <cctype>
 #include <cstdlib>
 #include <exception>
 #include <map>
@@ -17,6 +18,7 @@
 #include "inventory/EthernetPortHelper.h"
 #include "inventory/FCHBAManager.h"
 #include "inventory/HostIdentityScope.h"
+#include "inventory/PortHelper.h"
 #include "schema/generated/TAVRIN_AdapterSoftwareIdentity.h"
 #include "schema/generated/TAVRIN_AlarmDevice.h"
 #include "schema/generated/TAVRIN_CIMXMLCommunicationMechanism.h"
@@ -104,12 +106,16 @@ const Meta_Class* class_of(classId_t id) {
 // instances).
 class Inventory_Sources : public Pairing_Sources {
 public:
+    explicit Inventory_Sources(Pairing_Fetcher* fetcher) : _fetcher(fetcher) {}
+
     Array<Instance*> fetch(Source source, int id, const Meta_Class*& expected) override {
         if (source == Source::DIAGNOSTIC_TESTS) {
             expected = &TAVRIN_DiagnosticTest::static_meta_class;
             return DiagnosticHelper::getDiagnosticHelperObject()->getDiagnosticServices();
         }
         expected = class_of(classId_t(id));
+        if (_fetcher != nullptr)
+            return _fetcher->fetch(classId_t(id));
         return source == Source::HOST_DISCOVERED
                    ? HDRManager::getHDRManager()->getInstances(classId_t(id))
                    : FCHBAManager::getFCHBAManager()->getInstances(classId_t(id));
@@ -138,6 +144,7 @@ public:
 private:
     const String& address(unsigned number);
 
+    Pairing_Fetcher* _fetcher;
     bool _listed = false;
     std::vector<String> _addresses;
     std::map<unsigned, String> _serials;
@@ -174,13 +181,14 @@ String Inventory_Sources::adapter_serial_number(unsigned number) {
 }  // namespace
 
 Enum_Instances_Status enumerate_inventory_pairs(const Pairing& rule, const Meta_Class* association,
-                                                Association_Sink sink, void* target) noexcept {
+                                                Association_Sink sink, void* target,
+                                                Pairing_Fetcher* fetcher) noexcept {
     log(LL_DBG, rule.file, rule.line, "Entering: %s", "enum_instances");
     Enum_Instances_Status status = ENUM_INSTANCES_FAILED;
     try {
         // One host identity for every instance the request builds.
         HostIdentityScope host;
-        Inventory_Sources sources;
+        Inventory_Sources sources(fetcher);
         status = enumerate_pairs(rule, association, sources, sink, target);
     } catch (const HbaAgentError& e) {
         log(LL_ERR, rule.file, rule.line, "enum_instances got User exception %d: %s", e.code,
@@ -192,6 +200,126 @@ Enum_Instances_Status enumerate_inventory_pairs(const Pairing& rule, const Meta_
     }
     log(LL_DBG, rule.file, rule.line, "Returning: %s", "enum_instances");
     return status;
+}
+
+// ---- requests from one object ----------------------------------------------
+
+namespace {
+
+struct Scoped_Names {
+    const Instance* source;
+    const char* result_class;
+    const char* role;
+    const char* result_role;
+    Enum_Associator_Names_Handler<Instance>* handler;
+    bool stopped;
+};
+
+const char* c_str_or_null(const String& s) {
+    return s.size() ? s.c_str() : nullptr;
+}
+
+// As the binding does with each association of an enumeration: hands on the
+// ends other than the source, then lets the association go.
+void deliver_associators(Instance* association, void* target) {
+    Scoped_Names* names = static_cast<Scoped_Names*>(target);
+    Ref<> hold(association);
+    if (names->stopped)
+        return;
+    std::vector<const Instance*> ends(association->meta_class->num_meta_features + 1);
+    int n = get_associators(names->source, association, names->result_class, names->role,
+                            names->result_role, ends.data());
+    for (int i = 0; i < n && !names->stopped; i++) {
+        ref(ends[i]);
+        if (!names->handler->handle(const_cast<Instance*>(ends[i])))
+            names->stopped = true;
+    }
+}
+
+struct Scoped_References {
+    const Instance* source;
+    const char* role;
+    bool (*hand_on)(Instance* association, void* handler);
+    void* handler;
+    bool stopped;
+};
+
+void deliver_reference(Instance* association, void* target) {
+    Scoped_References* refs = static_cast<Scoped_References*>(target);
+    bool refers = false;
+    if (!refs->stopped) {
+        try {
+            refers = is_reference_of(refs->source, association, refs->role);
+        } catch (...) {
+            refs->stopped = true;
+        }
+    }
+    if (!refers) {
+        unref(association);
+        return;
+    }
+    if (!refs->hand_on(association, refs->handler))
+        refs->stopped = true;
+}
+
+}  // namespace
+
+Enum_Associator_Names_Status scoped_associator_names(
+    const Pairing& rule, const Meta_Class* association, Pairing_Fetcher& fetcher,
+    const Instance* source, const String& result_class, const String& role,
+    const String& result_role, Enum_Associator_Names_Handler<Instance>* handler) noexcept {
+    Scoped_Names names = {source,
+                          c_str_or_null(result_class),
+                          c_str_or_null(role),
+                          c_str_or_null(result_role),
+                          handler,
+                          false};
+    return enumerate_inventory_pairs(rule, association, deliver_associators, &names, &fetcher) ==
+                   ENUM_INSTANCES_FAILED
+               ? ENUM_ASSOCIATOR_NAMES_FAILED
+               : ENUM_ASSOCIATOR_NAMES_OK;
+}
+
+Enum_References_Status scoped_references(const Pairing& rule, const Meta_Class* association,
+                                         Pairing_Fetcher& fetcher, const Instance* source,
+                                         const String& role,
+                                         bool (*hand_on)(Instance* association, void* handler),
+                                         void* handler) noexcept {
+    Scoped_References refs = {source, c_str_or_null(role), hand_on, handler, false};
+    return enumerate_inventory_pairs(rule, association, deliver_reference, &refs, &fetcher) ==
+                   ENUM_INSTANCES_FAILED
+               ? ENUM_REFERENCES_FAILED
+               : ENUM_REFERENCES_OK;
+}
+
+One_Port_Scope::One_Port_Scope(const Instance* source) : _reach(UNKNOWN) {
+    const Property<String>* named = nullptr;
+    for (const char* key : {"DeviceID", "InstanceID", "Name"}) {
+        const Property<String>* p = text_property(source, key);
+        if (p == nullptr || p->null)
+            continue;
+        if (named != nullptr)
+            return;  // not an object of a port
+        named = p;
+    }
+    if (named == nullptr)
+        return;
+    _reach = NOTHING;
+    const String& wwn = named->value;
+    if (wwn.size() != 16)
+        return;
+    for (size_t i = 0; i < wwn.size(); i++)
+        if (!isxdigit(static_cast<unsigned char>(wwn[i])))
+            return;
+    _port = wwn;
+    _reach = NARROWED;
+}
+
+Array<Instance*> One_Port_Scope::fetch(classId_t id) {
+    PortScope scope;
+    scope.port = _port;
+    scope.remotes = PortScope::NO_REMOTES;
+    return FCHBAManager::getFCHBAManager()->getInstancesByPort(id, scope);
 }
 
 // ---- keys of physical connectors ---------------------------------------------

@@ -11,8 +11,10 @@
 //         public TAVRIN_FCPort_Methods {};
 //
 // Its log lines name the provider's source file and the line of that
-// declaration. get_instance stays unsupported, so the binding serves it by
-// enumerating and comparing keys; the writes stay unsupported too.
+// declaration. get_instance looks the object up by its keys where the
+// inventory can (inventory/InventoryLookup.h); elsewhere it answers
+// unsupported, and the binding serves it by enumerating and comparing keys.
+// The writes stay unsupported.
 #ifndef CPTA_PROVIDERS_INVENTORY_PROVIDER_H
 #define CPTA_PROVIDERS_INVENTORY_PROVIDER_H
 
@@ -23,6 +25,7 @@
 #include "gateway/ClassId.h"
 #include "inventory/FCHBAManager.h"
 #include "inventory/HostIdentityScope.h"
+#include "inventory/InventoryLookup.h"
 #include "providers/Provider_Base.h"
 
 namespace CPTA {
@@ -122,11 +125,46 @@ Enum_Instances_Status enumerate_inventory(const Inventory_Source& source,
     return ENUM_INSTANCES_OK;
 }
 
+// get_instance of the provider: the instance that the look-up by keys built
+// and whose keys equal the model's, as the enumeration would deliver it (of
+// `meta_class` or a subclass). GET_INSTANCE_UNSUPPORTED when the keys cannot
+// be looked up, or when the provider's delivery can fail a request.
+inline Get_Instance_Status lookup_inventory(const Inventory_Source& source,
+                                            const Meta_Class* meta_class, const Instance* model,
+                                            Instance*& instance) {
+    if (source.delivery != ANNOUNCED && source.delivery != QUIET)
+        return GET_INSTANCE_UNSUPPORTED;
+    Array<Instance*> found;
+    if (!lookupInventory(source.classId, model, found))
+        return GET_INSTANCE_UNSUPPORTED;
+    Inventory_Answer answer(found);
+    log(LL_DBG, source.file, source.line, "Entering: %s", "get_instance");
+    for (size_t i = 0; i < answer.size(); i++) {
+        const Instance* candidate = answer.instances()[i];
+        if (candidate != nullptr && is_subclass(meta_class, candidate->meta_class) &&
+            key_eq(model, candidate)) {
+            instance = answer.take(i);
+            log(LL_DBG, source.file, source.line, "Returning: %s", "get_instance");
+            return GET_INSTANCE_OK;
+        }
+    }
+    log(LL_DBG, source.file, source.line, "Returning: %s", "get_instance");
+    return GET_INSTANCE_NOT_FOUND;
+}
+
 // An association class whose instances a dispatcher builds names its base:
 // Inventory_Provider<C, SOURCE, Association_Provider<C>>.
 template <class C, const Inventory_Source& SOURCE, class Base = Instance_Provider<C>>
 class Inventory_Provider : public Base {
 public:
+    Get_Instance_Status get_instance(const C* model, C*& instance) {
+        Instance* found = nullptr;
+        const Get_Instance_Status status =
+            lookup_inventory(SOURCE, &C::static_meta_class, model, found);
+        instance = static_cast<C*>(found);
+        return status;
+    }
+
     // The model (the properties asked for) is not looked at, nor whether the
     // handler wants more: every instance is delivered whole.
     Enum_Instances_Status enum_instances(const C*, Enum_Instances_Handler<C>* handler) {

@@ -16,8 +16,9 @@ constexpr Pairing kAlarms = TVRN_PAIRING.fetch(CID_FC_PORT)
 
 }  // namespace
 
-class TAVRIN_AssociatedAlarm_Provider : public Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms>,
-                                        public TAVRIN_AssociatedAlarm_Methods {};
+class TAVRIN_AssociatedAlarm_Provider
+    : public Scoped_Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms, One_Port_Scope>,
+      public TAVRIN_AssociatedAlarm_Methods {};
 
 }  // namespace CPTA
 

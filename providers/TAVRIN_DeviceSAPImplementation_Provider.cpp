@@ -20,7 +20,7 @@ constexpr Pairing kEndpoints =
 }  // namespace
 
 class TAVRIN_DeviceSAPImplementation_Provider
-    : public Pairing_Provider<TAVRIN_DeviceSAPImplementation, kEndpoints>,
+    : public Scoped_Pairing_Provider<TAVRIN_DeviceSAPImplementation, kEndpoints, One_Port_Scope>,
       public TAVRIN_DeviceSAPImplementation_Methods {};
 
 }  // namespace CPTA

@@ -19,7 +19,7 @@ constexpr Pairing kStatistics =
 }  // namespace
 
 class TAVRIN_ElementStatisticalData_Provider
-    : public Pairing_Provider<TAVRIN_ElementStatisticalData, kStatistics>,
+    : public Scoped_Pairing_Provider<TAVRIN_ElementStatisticalData, kStatistics, One_Port_Scope>,
       public TAVRIN_ElementStatisticalData_Methods {};
 
 }  // namespace CPTA

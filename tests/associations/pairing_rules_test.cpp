@@ -337,7 +337,26 @@ TEST(Pairing, EachProviderMatchesAsItsRuleSays) {
 // here run on the sets of the case.
 Enum_Instances_Status CPTA::enumerate_inventory_pairs(const Pairing& rule,
                                                       const Meta_Class* association,
-                                                      Association_Sink sink,
-                                                      void* target) noexcept {
+                                                      Association_Sink sink, void* target,
+                                                      Pairing_Fetcher*) noexcept {
     return enumerate_pairs(rule, association, *gSets, sink, target);
+}
+
+// Requests from one object are not made here.
+Enum_Associator_Names_Status CPTA::scoped_associator_names(
+    const Pairing&, const Meta_Class*, Pairing_Fetcher&, const Instance*, const String&,
+    const String&, const String&, Enum_Associator_Names_Handler<Instance>*) noexcept {
+    return ENUM_ASSOCIATOR_NAMES_FAILED;
+}
+
+Enum_References_Status CPTA::scoped_references(const Pairing&, const Meta_Class*, Pairing_Fetcher&,
+                                               const Instance*, const String&,
+                                               bool (*)(Instance*, void*), void*) noexcept {
+    return ENUM_REFERENCES_FAILED;
+}
+
+CPTA::One_Port_Scope::One_Port_Scope(const Instance*) : _reach(UNKNOWN) {}
+
+Array<Instance*> CPTA::One_Port_Scope::fetch(classId_t) {
+    return Array<Instance*>();
 }
