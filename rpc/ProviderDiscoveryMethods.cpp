@@ -84,20 +84,20 @@ struct MethodRow {
         for (const Param& p : params_)
             params[i++] = p;  // more than kMaxParams does not compile
     }
-    constexpr MethodRow zero(const char* member) const { return with(&MethodRow::zeroed, member); }
-    constexpr MethodRow test(const char* name_) const { return with(&MethodRow::function, name_); }
-    constexpr MethodRow handledBy(const char* name_) const {
-        return with(&MethodRow::handler, name_);
-    }
-    constexpr MethodRow secretive() const { return with(&MethodRow::secret, true); }
-
-private:
+    // The row with one member changed (defined before its users, so that
+    // every compiler can evaluate the table at compile time).
     template <typename T>
     constexpr MethodRow with(T MethodRow::*field, T value) const {
         MethodRow r = *this;
         r.*field = value;
         return r;
     }
+    constexpr MethodRow zero(const char* member) const { return with(&MethodRow::zeroed, member); }
+    constexpr MethodRow test(const char* name_) const { return with(&MethodRow::function, name_); }
+    constexpr MethodRow handledBy(const char* name_) const {
+        return with(&MethodRow::handler, name_);
+    }
+    constexpr MethodRow secretive() const { return with(&MethodRow::secret, true); }
 };
 
 void positional(const MethodRow&, const Json::Value&, Json::Value&);
