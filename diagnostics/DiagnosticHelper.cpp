@@ -6,6 +6,8 @@
 #include <cstdio>
 #include <iterator>
 #include <map>
+#include <string>
+#include <utility>
 
 #include <json/json.h>
 
@@ -121,13 +123,15 @@ void setReference(Instance* association, const char* role, Instance* target) {
     reference_in(slot_of(association, mr->offset)) = target;
 }
 
-// The elements records and jobs name, found by class and DeviceID. Each class
-// is enumerated at most once per look-up session.
+// The elements records and jobs name, found by class and DeviceID. Each one
+// is built by the walk of its class narrowed to the adapter or port its key
+// names (so a look-up costs what its jobs and records cost, not what the
+// host has), at most once per look-up session.
 class Element_Finder {
 public:
     Element_Finder() = default;
     ~Element_Finder() {
-        for (auto& entry : _byClass)
+        for (auto& entry : _byKey)
             destroyInstances(entry.second);
     }
     Element_Finder(const Element_Finder&) = delete;
@@ -143,31 +147,38 @@ public:
             case CID_ETHERNET_PORT: key = &portMac; break;
             default: return nullptr;
         }
-        const Array<Instance*>& all = instancesOf(elementClass);
-        for (size_t i = 0; i < all.size(); i++)
-            if (all[i] != nullptr && textOf(all[i], "DeviceID").equali(*key))
-                return all[i];
+        if (key->size() == 0)
+            return nullptr;
+        const Array<Instance*>& found = instancesFor(elementClass, *key);
+        for (size_t i = 0; i < found.size(); i++)
+            if (found[i] != nullptr && textOf(found[i], "DeviceID").equali(*key))
+                return found[i];
         return nullptr;
     }
 
 private:
-    const Array<Instance*>& instancesOf(classId_t elementClass) {
-        auto known = _byClass.find(elementClass);
-        if (known != _byClass.end())
+    const Array<Instance*>& instancesFor(classId_t elementClass, const String& key) {
+        const std::pair<int, std::string> at(elementClass, key.c_str());
+        auto known = _byKey.find(at);
+        if (known != _byKey.end())
             return known->second;
-        Array<Instance*> all;
-        if (elementClass == CID_FC_PORT)
-            all = PortHelper::getPortHelperObject()->getInstancesByClass(CID_FC_PORT);
-        else if (elementClass == CID_ETHERNET_PORT)
-            all = EthernetPortHelper::getEthernetPortHelperObject()->getInstancesByClass(
-                CID_ETHERNET_PORT);
-        else
-            all =
-                AdapterHelper::getAdapterHelperInstance()->getInstancesByClass(CID_PORT_CONTROLLER);
-        return _byClass[elementClass] = all;
+        Array<Instance*> found;
+        if (elementClass == CID_FC_PORT) {
+            PortScope scope;
+            scope.port = key;
+            scope.remotes = PortScope::NO_REMOTES;
+            found = PortHelper::getPortHelperObject()->getInstancesByPort(CID_FC_PORT, scope);
+        } else if (elementClass == CID_ETHERNET_PORT) {
+            found = EthernetPortHelper::getEthernetPortHelperObject()->getInstancesByPort(
+                CID_ETHERNET_PORT, key);
+        } else {
+            found = AdapterHelper::getAdapterHelperInstance()->getInstancesByAddress(
+                CID_PORT_CONTROLLER, key);
+        }
+        return _byKey[at] = found;
     }
 
-    std::map<classId_t, Array<Instance*>> _byClass;
+    std::map<std::pair<int, std::string>, Array<Instance*>> _byKey;
 };
 
 template <class T>
