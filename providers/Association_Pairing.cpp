@@ -14,10 +14,13 @@
 #include "gateway/HbaAgentError.h"
 #include "gateway/JsonAccess.h"
 #include "gateway/ProviderUtil.h"
+#include "inventory/AdapterHelper.h"
 #include "inventory/ConnectorTag.h"
 #include "inventory/EthernetPortHelper.h"
 #include "inventory/FCHBAManager.h"
 #include "inventory/HostIdentityScope.h"
+#include "inventory/InventoryCommon.h"
+#include "inventory/InventoryLookup.h"
 #include "inventory/PortHelper.h"
 #include "schema/generated/TAVRIN_AdapterSoftwareIdentity.h"
 #include "schema/generated/TAVRIN_AlarmDevice.h"
@@ -292,34 +295,186 @@ Enum_References_Status scoped_references(const Pairing& rule, const Meta_Class* 
                : ENUM_REFERENCES_OK;
 }
 
-One_Port_Scope::One_Port_Scope(const Instance* source) : _reach(UNKNOWN) {
-    const Property<String>* named = nullptr;
-    for (const char* key : {"DeviceID", "InstanceID", "Name"}) {
-        const Property<String>* p = text_property(source, key);
-        if (p == nullptr || p->null)
-            continue;
-        if (named != nullptr)
-            return;  // not an object of a port
-        named = p;
-    }
-    if (named == nullptr)
-        return;
-    _reach = NOTHING;
-    const String& wwn = named->value;
-    if (wwn.size() != 16)
-        return;
-    for (size_t i = 0; i < wwn.size(); i++)
-        if (!isxdigit(static_cast<unsigned char>(wwn[i])))
-            return;
-    _port = wwn;
-    _reach = NARROWED;
+// ---- scopes as data -------------------------------------------------------------
+
+namespace {
+
+const size_t kWwnDigits = 16;
+const size_t kMacDigits = 12;
+
+// The class id a class stands for, 0 when the associations fetch none.
+classId_t class_id_of(const Meta_Class* meta_class) {
+    for (int id = 1; id < MAXCLASSID; id++)
+        if (class_of(classId_t(id)) == meta_class)
+            return classId_t(id);
+    return classId_t(0);
 }
 
-Array<Instance*> One_Port_Scope::fetch(classId_t id) {
-    PortScope scope;
-    scope.port = _port;
-    scope.remotes = PortScope::NO_REMOTES;
-    return FCHBAManager::getFCHBAManager()->getInstancesByPort(id, scope);
+// The value of a text key, or "".
+String key_text(const Instance* source, const char* name) {
+    const Property<String>* p = text_property(source, name);
+    return p == nullptr || p->null ? String() : p->value;
+}
+
+// `text` up to its first "_" when it is `digits` hexadecimal digits, else "".
+String address_in(const String& text, size_t digits) {
+    size_t end = text.find('_');
+    if (end == String::npos)
+        end = text.size();
+    if (end != digits)
+        return String();
+    for (size_t i = 0; i < end; i++)
+        if (!isxdigit(static_cast<unsigned char>(text[i])))
+            return String();
+    return text.substr(0, end);
+}
+
+bool is_adapter_class(classId_t id) {
+    return id == CID_PORT_CONTROLLER || id == CID_PHYSICAL_PACKAGE || id == CID_PRODUCT ||
+           id == CID_ADAPTER_SOFTWARE_IDENTITY;
+}
+
+}  // namespace
+
+Object_Scope::Object_Scope(const Pairing& rule, const Object_Scopes& scopes, const Instance* source)
+    : _rule(rule) {
+    try {
+        const classId_t from = source ? class_id_of(source->meta_class) : CID_NONE;
+        _from = from;
+        for (size_t r = 0; r < scopes.num_rows && from != CID_NONE; r++)
+            if (scopes.rows[r].from == from)
+                _row = &scopes.rows[r];
+        if (_row == nullptr)
+            return;
+        // What the keys name: an adapter, an FC port (the local one of a
+        // target or LUN) or an Ethernet port.
+        switch (from) {
+            case CID_PORT_CONTROLLER: {
+                const String id = key_text(source, "DeviceID");
+                _adapter = address_in(id, kWwnDigits).size() ? address_in(id, kWwnDigits)
+                                                             : address_in(id, kMacDigits);
+                if (_adapter.size() != id.size())
+                    _adapter = String();
+                _adapterKnown = true;
+                break;
+            }
+            case CID_ADAPTER_SOFTWARE_IDENTITY: {
+                // Only a firmware or BIOS identity names its adapter.
+                const String id = key_text(source, "InstanceID");
+                const size_t end = id.find('_');
+                const String kind = end == String::npos ? String() : id.substr(end + 1);
+                if (kind == "firmware" || kind == "bios")
+                    _adapter = address_in(id, kWwnDigits).size() ? address_in(id, kWwnDigits)
+                                                                 : address_in(id, kMacDigits);
+                _adapterKnown = true;
+                break;
+            }
+            case CID_FC_PORT_STATISTICS:
+                _port = address_in(key_text(source, "InstanceID"), kWwnDigits);
+                break;
+            case CID_SCSI_PROTOCOL_ENDPOINT:
+                _port = address_in(key_text(source, "Name"), kWwnDigits);
+                break;
+            case CID_ETHERNET_PORT: {
+                const String id = key_text(source, "DeviceID");
+                _mac = address_in(id, kMacDigits).size() == id.size() ? id : String();
+                break;
+            }
+            default: {
+                const String id = key_text(source, "DeviceID");
+                _port = address_in(id, kWwnDigits);
+                if (from == CID_FC_PORT || from == CID_ALARM_DEVICE)
+                    _port = _port.size() == id.size() ? _port : String();
+                break;
+            }
+        }
+
+        _reach = NOTHING;
+        // As the walks: nothing is asked while the driver is not usable, and
+        // then every set that could hold the source is empty.
+        if (!ProviderUtil::getDriverStatus())
+            return;
+        for (size_t set = 0; set < rule.num_sets; set++) {
+            if (is_per_element(rule.sets[set].source))
+                continue;
+            switch (_row->sets[set]) {
+                case Narrowing::WHOLE: break;
+                case Narrowing::OBJECT:
+                    if (!lookupInventory(from, source, _object)) {
+                        _reach = UNKNOWN;
+                        return;
+                    }
+                    if (_object.size() == 0)
+                        return;
+                    break;
+                case Narrowing::ADAPTER:
+                    if (_adapter.size() == 0 && _port.size() == 0 && _mac.size() == 0)
+                        return;
+                    break;
+                case Narrowing::PORT:
+                    if (_port.size() == 0)
+                        return;
+                    break;
+                case Narrowing::ETHERNET_PORT:
+                    if (_mac.size() == 0)
+                        return;
+                    break;
+            }
+        }
+        _reach = NARROWED;
+    } catch (...) {
+        _reach = UNKNOWN;
+    }
+}
+
+Object_Scope::~Object_Scope() {
+    for (size_t i = 0; i < _object.size(); i++)
+        if (_object[i] != nullptr)
+            destroy(_object[i]);
+}
+
+const String& Object_Scope::adapter() {
+    if (!_adapterKnown) {
+        _adapterKnown = true;
+        _adapter =
+            ProviderUtil::eraseColonsFromIndex(owningAdapterKey(_port.size() ? _port : _mac));
+    }
+    return _adapter;
+}
+
+Array<Instance*> Object_Scope::fetch(classId_t id) {
+    size_t set = 0;
+    while (set < _rule.num_sets && (is_per_element(_rule.sets[set].source) ||
+                                    (_rule.sets[set].ids[0] != id && _rule.sets[set].ids[1] != id)))
+        set++;
+    const Narrowing narrowing = set < _rule.num_sets ? _row->sets[set] : Narrowing::WHOLE;
+    Array<Instance*> found;
+    switch (narrowing) {
+        case Narrowing::WHOLE:
+            return set < _rule.num_sets && _rule.sets[set].source == Source::HOST_DISCOVERED
+                       ? HDRManager::getHDRManager()->getInstances(id)
+                       : FCHBAManager::getFCHBAManager()->getInstances(id);
+        case Narrowing::OBJECT:
+            // The part of a set that holds the source; its other part has
+            // nothing that can be the source.
+            if (id == _from)
+                found.swap(_object);
+            return found;
+        case Narrowing::ADAPTER:
+            if (is_adapter_class(id) && adapter().size() > 0)
+                found =
+                    AdapterHelper::getAdapterHelperInstance()->getInstancesByAddress(id, adapter());
+            return found;
+        case Narrowing::PORT: {
+            PortScope scope;
+            scope.port = _port;
+            scope.remotes = PortScope::NO_REMOTES;
+            return FCHBAManager::getFCHBAManager()->getInstancesByPort(id, scope);
+        }
+        case Narrowing::ETHERNET_PORT:
+            return EthernetPortHelper::getEthernetPortHelperObject()->getInstancesByPort(id, _mac);
+    }
+    return found;
 }
 
 // ---- keys of physical connectors ---------------------------------------------

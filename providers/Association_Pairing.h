@@ -112,20 +112,87 @@ private:
     }
 };
 
-// The scope of the associations among the objects of one FC port (the port,
-// its statistics, alarm device and own SCSI endpoint): the source's key
-// DeviceID, InstanceID or Name names the port by its WWN; anything else
-// (a target's endpoint, a LUN, another class) pairs with none of them.
-class One_Port_Scope : public Pairing_Fetcher {
+// ---- scopes as data -------------------------------------------------------------
+//
+// Most associations are scoped the same way: the keys of the source name an
+// adapter, an FC port or an Ethernet port, and each request-wide set of the
+// rule is narrowed to what the walk of its class builds for that object. A
+// provider states, for each class a source may be of, how each set of its
+// rule is narrowed (by set number; per-element sets are already fetched per
+// walked instance and are left as they are):
+//
+//   constexpr Object_Scopes kScopes = Object_Scopes()
+//       .from(CID_PORT_CONTROLLER, Narrowing::OBJECT)   // set 0: the controller
+//       .from(CID_FC_PORT, Narrowing::ADAPTER);         // set 0: its adapter's
+//
+//   class TAVRIN_ControlledBy_Provider
+//       : public Keyed_Pairing_Provider<TAVRIN_ControlledBy, kPorts, kScopes>, ...
+//
+// A source of a class without a row, or whose own object cannot be looked up
+// by its keys (inventory/InventoryLookup.h), is served by the binding's
+// fallbacks. Narrowed sets keep the order of the whole ones, so the answer is
+// the enumeration's, as long as the partners of the source are all among
+// what the narrowing gives.
+enum class Narrowing : uint8 {
+    WHOLE,          // as the enumeration fetches it (the host, the diagnostic tests)
+    OBJECT,         // the source itself, looked up by its keys (a set of its class)
+    ADAPTER,        // the port controller, package, product or software identities
+                    // of the source's adapter (named by the source, or owning its port)
+    PORT,           // what the walk builds for the source's FC port, no remote port
+    ETHERNET_PORT,  // what the walk builds for the source's Ethernet port
+};
+
+struct Scope_Row {
+    classId_t from;  // the class of the source
+    Narrowing sets[Pairing::MAX_SETS];
+};
+
+struct Object_Scopes {
+    static constexpr size_t MAX_ROWS = 3;
+    Scope_Row rows[MAX_ROWS];
+    size_t num_rows;
+
+    constexpr Object_Scopes() : rows{}, num_rows(0) {}
+    constexpr Object_Scopes from(classId_t source, Narrowing set0,
+                                 Narrowing set1 = Narrowing::WHOLE,
+                                 Narrowing set2 = Narrowing::WHOLE) const {
+        Object_Scopes s = *this;
+        s.rows[s.num_rows++] = Scope_Row{source, {set0, set1, set2, Narrowing::WHOLE}};
+        return s;
+    }
+};
+
+// The sets of a rule narrowed for one source by a table of Object_Scopes.
+class Object_Scope : public Pairing_Fetcher {
 public:
-    explicit One_Port_Scope(const Instance* source);
+    Object_Scope(const Pairing& rule, const Object_Scopes& scopes, const Instance* source);
+    ~Object_Scope();
+    Object_Scope(const Object_Scope&) = delete;
+    Object_Scope& operator=(const Object_Scope&) = delete;
+
     Reach reach() const { return _reach; }
     Array<Instance*> fetch(classId_t id) override;
 
 private:
-    Reach _reach;
-    String _port;
+    const String& adapter();
+
+    const Pairing& _rule;
+    const Scope_Row* _row = nullptr;
+    classId_t _from = CID_NONE;
+    Reach _reach = UNKNOWN;
+    String _adapter, _port, _mac;
+    bool _adapterKnown = false;
+    Array<Instance*> _object;  // the source looked up, until fetched
 };
+
+template <const Pairing& RULE, const Object_Scopes& SCOPES>
+class Keyed_Scope : public Object_Scope {
+public:
+    explicit Keyed_Scope(const Instance* source) : Object_Scope(RULE, SCOPES, source) {}
+};
+
+template <class C, const Pairing& RULE, const Object_Scopes& SCOPES>
+using Keyed_Pairing_Provider = Scoped_Pairing_Provider<C, RULE, Keyed_Scope<RULE, SCOPES>>;
 
 // ---- keys of physical connectors (their Tag: inventory/ConnectorTag.h) --------
 

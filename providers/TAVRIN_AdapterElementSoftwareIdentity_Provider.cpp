@@ -69,10 +69,13 @@ constexpr Pairing kSoftware =
         .as("Dependent")
         .with_all(0, "Antecedent", key(controller_keys), key(identity_keys));
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_ADAPTER_SOFTWARE_IDENTITY, Narrowing::OBJECT, Narrowing::ADAPTER);
+
 }  // namespace
 
 class TAVRIN_AdapterElementSoftwareIdentity_Provider
-    : public Pairing_Provider<TAVRIN_AdapterElementSoftwareIdentity, kSoftware>,
+    : public Keyed_Pairing_Provider<TAVRIN_AdapterElementSoftwareIdentity, kSoftware, kScopes>,
       public TAVRIN_AdapterElementSoftwareIdentity_Methods {};
 
 }  // namespace CPTA

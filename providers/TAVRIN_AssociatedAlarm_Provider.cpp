@@ -14,10 +14,14 @@ constexpr Pairing kAlarms = TVRN_PAIRING.fetch(CID_FC_PORT)
                                 .as("Dependent")
                                 .with_all(1, "Antecedent", key("DeviceID"), key("DeviceID"));
 
+constexpr Object_Scopes kScopes = Object_Scopes()
+                                      .from(CID_FC_PORT, Narrowing::PORT, Narrowing::PORT)
+                                      .from(CID_ALARM_DEVICE, Narrowing::PORT, Narrowing::PORT);
+
 }  // namespace
 
 class TAVRIN_AssociatedAlarm_Provider
-    : public Scoped_Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms, One_Port_Scope>,
+    : public Keyed_Pairing_Provider<TAVRIN_AssociatedAlarm, kAlarms, kScopes>,
       public TAVRIN_AssociatedAlarm_Methods {};
 
 }  // namespace CPTA

@@ -17,10 +17,14 @@ constexpr Pairing kAdapterTests =
         .as("UserOfService")
         .with_every(1, "ServiceProvided");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_PORT_CONTROLLER, Narrowing::OBJECT, Narrowing::WHOLE);
+
 }  // namespace
 
 class TAVRIN_AvailableDiagnosticServiceForAdapter_Provider
-    : public Pairing_Provider<TAVRIN_AvailableDiagnosticServiceForAdapter, kAdapterTests>,
+    : public Keyed_Pairing_Provider<TAVRIN_AvailableDiagnosticServiceForAdapter, kAdapterTests,
+                                    kScopes>,
       public TAVRIN_AvailableDiagnosticServiceForAdapter_Methods {};
 
 }  // namespace CPTA

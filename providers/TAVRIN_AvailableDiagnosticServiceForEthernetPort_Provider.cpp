@@ -17,10 +17,14 @@ constexpr Pairing kPortTests =
         .as("UserOfService")
         .with_every(1, "ServiceProvided");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_ETHERNET_PORT, Narrowing::OBJECT, Narrowing::WHOLE);
+
 }  // namespace
 
 class TAVRIN_AvailableDiagnosticServiceForEthernetPort_Provider
-    : public Pairing_Provider<TAVRIN_AvailableDiagnosticServiceForEthernetPort, kPortTests>,
+    : public Keyed_Pairing_Provider<TAVRIN_AvailableDiagnosticServiceForEthernetPort, kPortTests,
+                                    kScopes>,
       public TAVRIN_AvailableDiagnosticServiceForEthernetPort_Methods {};
 
 }  // namespace CPTA

@@ -36,10 +36,14 @@ constexpr Pairing kPortTests =
         .with_every(1, "ServiceProvided")
         .only_for_walked(offered_on);
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_FC_PORT, Narrowing::ADAPTER, Narrowing::WHOLE);
+
 }  // namespace
 
 class TAVRIN_AvailableDiagnosticServiceForFCPort_Provider
-    : public Pairing_Provider<TAVRIN_AvailableDiagnosticServiceForFCPort, kPortTests>,
+    : public Keyed_Pairing_Provider<TAVRIN_AvailableDiagnosticServiceForFCPort, kPortTests,
+                                    kScopes>,
       public TAVRIN_AvailableDiagnosticServiceForFCPort_Methods {};
 
 }  // namespace CPTA

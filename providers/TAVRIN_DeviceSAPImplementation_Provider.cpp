@@ -17,10 +17,15 @@ constexpr Pairing kEndpoints =
         .as("Antecedent")
         .with_first(0, "Dependent", key("DeviceID"), key("Name"));
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes()
+        .from(CID_SCSI_PROTOCOL_ENDPOINT, Narrowing::PORT, Narrowing::PORT)
+        .from(CID_FC_PORT, Narrowing::PORT, Narrowing::PORT);
+
 }  // namespace
 
 class TAVRIN_DeviceSAPImplementation_Provider
-    : public Scoped_Pairing_Provider<TAVRIN_DeviceSAPImplementation, kEndpoints, One_Port_Scope>,
+    : public Keyed_Pairing_Provider<TAVRIN_DeviceSAPImplementation, kEndpoints, kScopes>,
       public TAVRIN_DeviceSAPImplementation_Methods {};
 
 }  // namespace CPTA

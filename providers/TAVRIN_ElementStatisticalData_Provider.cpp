@@ -16,10 +16,15 @@ constexpr Pairing kStatistics =
         .as("ManagedElement")
         .with_all(1, "Stats", key("DeviceID"), key("InstanceID"));
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes()
+        .from(CID_FC_PORT, Narrowing::PORT, Narrowing::PORT)
+        .from(CID_FC_PORT_STATISTICS, Narrowing::PORT, Narrowing::PORT);
+
 }  // namespace
 
 class TAVRIN_ElementStatisticalData_Provider
-    : public Scoped_Pairing_Provider<TAVRIN_ElementStatisticalData, kStatistics, One_Port_Scope>,
+    : public Keyed_Pairing_Provider<TAVRIN_ElementStatisticalData, kStatistics, kScopes>,
       public TAVRIN_ElementStatisticalData_Methods {};
 
 }  // namespace CPTA

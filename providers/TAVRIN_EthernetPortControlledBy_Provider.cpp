@@ -10,10 +10,14 @@ namespace {
 constexpr Pairing kEthernetPorts =
     TVRN_PAIRING.controller_with_every(Source::ETHERNET_PORTS_OF_ADAPTER);
 
+constexpr Object_Scopes kScopes = Object_Scopes()
+                                      .from(CID_PORT_CONTROLLER, Narrowing::OBJECT)
+                                      .from(CID_ETHERNET_PORT, Narrowing::ADAPTER);
+
 }  // namespace
 
 class TAVRIN_EthernetPortControlledBy_Provider
-    : public Pairing_Provider<TAVRIN_EthernetPortControlledBy, kEthernetPorts>,
+    : public Keyed_Pairing_Provider<TAVRIN_EthernetPortControlledBy, kEthernetPorts, kScopes>,
       public TAVRIN_EthernetPortControlledBy_Methods {};
 
 }  // namespace CPTA

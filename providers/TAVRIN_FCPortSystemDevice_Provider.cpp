@@ -9,10 +9,13 @@ namespace {
 constexpr Pairing kHosted = TVRN_PAIRING.host_with_every(
     CID_FC_PORT, "GroupComponent", "PartComponent", "Error: Invalid mapping information");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_FC_PORT, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
 class TAVRIN_FCPortSystemDevice_Provider
-    : public Pairing_Provider<TAVRIN_FCPortSystemDevice, kHosted>,
+    : public Keyed_Pairing_Provider<TAVRIN_FCPortSystemDevice, kHosted, kScopes>,
       public TAVRIN_FCPortSystemDevice_Methods {};
 
 }  // namespace CPTA

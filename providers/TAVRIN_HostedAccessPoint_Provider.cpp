@@ -13,10 +13,13 @@ constexpr Pairing kHosted =
                          "Error: Invalid mapping information")
         .when_empty(LL_WARN, "Invalid number of SCSIProtocolEndPoint instances returned.");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_SCSI_PROTOCOL_ENDPOINT, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
 class TAVRIN_HostedAccessPoint_Provider
-    : public Pairing_Provider<TAVRIN_HostedAccessPoint, kHosted>,
+    : public Keyed_Pairing_Provider<TAVRIN_HostedAccessPoint, kHosted, kScopes>,
       public TAVRIN_HostedAccessPoint_Methods {};
 
 }  // namespace CPTA

@@ -12,10 +12,14 @@ constexpr Pairing kHosted = TVRN_PAIRING
                                                  "Error: Invalid mapping information")
                                 .when_empty(LL_WARN, "No Logical Port Groups found!");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_LOGICAL_PORT_GROUP, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
-class TAVRIN_HostedCollection_Provider : public Pairing_Provider<TAVRIN_HostedCollection, kHosted>,
-                                         public TAVRIN_HostedCollection_Methods {};
+class TAVRIN_HostedCollection_Provider
+    : public Keyed_Pairing_Provider<TAVRIN_HostedCollection, kHosted, kScopes>,
+      public TAVRIN_HostedCollection_Methods {};
 
 }  // namespace CPTA
 

@@ -26,10 +26,14 @@ constexpr Pairing kPortPairs =
         .pair(1, "Dependent")
         .with_first(2, "Antecedent", key("PortNumber"), key("PortNumber"));
 
+constexpr Object_Scopes kScopes = Object_Scopes()
+                                      .from(CID_FC_PORT, Narrowing::ADAPTER)
+                                      .from(CID_ETHERNET_PORT, Narrowing::ADAPTER);
+
 }  // namespace
 
 class TAVRIN_HostedDependency_Provider
-    : public Pairing_Provider<TAVRIN_HostedDependency, kPortPairs>,
+    : public Keyed_Pairing_Provider<TAVRIN_HostedDependency, kPortPairs, kScopes>,
       public TAVRIN_HostedDependency_Methods {};
 
 }  // namespace CPTA

@@ -12,10 +12,13 @@ constexpr Pairing kHosted =
                          "Error: Invalid number of ComputerSystem instances")
         .when_empty(LL_WARN, "No Ethernet Port Found");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_LAN_ENDPOINT, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
 class TAVRIN_HostedLANEndpoint_Provider
-    : public Pairing_Provider<TAVRIN_HostedLANEndpoint, kHosted>,
+    : public Keyed_Pairing_Provider<TAVRIN_HostedLANEndpoint, kHosted, kScopes>,
       public TAVRIN_HostedLANEndpoint_Methods {};
 
 }  // namespace CPTA

@@ -13,10 +13,13 @@ constexpr Pairing kHosted =
                          "Error: count of computersystem instance is not 1")
         .when_empty(LL_ERR, "Error: Invalid mapping information");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_ADAPTER_SOFTWARE_IDENTITY, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
 class TAVRIN_InstalledSoftwareIdentity_Provider
-    : public Pairing_Provider<TAVRIN_InstalledSoftwareIdentity, kHosted>,
+    : public Keyed_Pairing_Provider<TAVRIN_InstalledSoftwareIdentity, kHosted, kScopes>,
       public TAVRIN_InstalledSoftwareIdentity_Methods {};
 
 }  // namespace CPTA

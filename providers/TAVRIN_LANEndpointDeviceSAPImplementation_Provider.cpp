@@ -16,10 +16,13 @@ constexpr Pairing kEndpoints = TVRN_PAIRING.fetch(CID_ETHERNET_PORT)
                                    .as("Antecedent")
                                    .with_first(1, "Dependent", key("DeviceID"), key("MACAddress"));
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_ETHERNET_PORT, Narrowing::OBJECT, Narrowing::ETHERNET_PORT);
+
 }  // namespace
 
 class TAVRIN_LANEndpointDeviceSAPImplementation_Provider
-    : public Pairing_Provider<TAVRIN_LANEndpointDeviceSAPImplementation, kEndpoints>,
+    : public Keyed_Pairing_Provider<TAVRIN_LANEndpointDeviceSAPImplementation, kEndpoints, kScopes>,
       public TAVRIN_LANEndpointDeviceSAPImplementation_Methods {};
 
 }  // namespace CPTA

@@ -16,10 +16,13 @@ constexpr Pairing kGroups =
         .as("Member")
         .with_first(1, "Collection", key("DeviceID"), key("Name"));
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_FC_PORT, Narrowing::PORT, Narrowing::PORT);
+
 }  // namespace
 
 class TAVRIN_MemberOfCollection_Provider
-    : public Pairing_Provider<TAVRIN_MemberOfCollection, kGroups>,
+    : public Keyed_Pairing_Provider<TAVRIN_MemberOfCollection, kGroups, kScopes>,
       public TAVRIN_MemberOfCollection_Methods {};
 
 }  // namespace CPTA

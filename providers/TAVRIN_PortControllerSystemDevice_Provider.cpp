@@ -14,10 +14,13 @@ constexpr Pairing kHosted =
         .when_empty(LL_ERR, "Error: Invalid mapping information")
         .announce(LL_INFO, "Building and returning association instances....\n");
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_PORT_CONTROLLER, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
 class TAVRIN_PortControllerSystemDevice_Provider
-    : public Pairing_Provider<TAVRIN_PortControllerSystemDevice, kHosted>,
+    : public Keyed_Pairing_Provider<TAVRIN_PortControllerSystemDevice, kHosted, kScopes>,
       public TAVRIN_PortControllerSystemDevice_Methods {};
 
 }  // namespace CPTA

@@ -18,9 +18,12 @@ constexpr Pairing kPackages =
         .as("Dependent")
         .at_same_position(1, "Antecedent", key("ElementName"), key("SerialNumber"));
 
+constexpr Object_Scopes kScopes =
+    Object_Scopes().from(CID_PORT_CONTROLLER, Narrowing::OBJECT, Narrowing::ADAPTER);
+
 }  // namespace
 
-class TAVRIN_Realizes_Provider : public Pairing_Provider<TAVRIN_Realizes, kPackages>,
+class TAVRIN_Realizes_Provider : public Keyed_Pairing_Provider<TAVRIN_Realizes, kPackages, kScopes>,
                                  public TAVRIN_Realizes_Methods {};
 
 }  // namespace CPTA

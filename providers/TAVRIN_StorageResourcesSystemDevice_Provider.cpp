@@ -15,10 +15,14 @@ constexpr Pairing kHosted = TVRN_PAIRING
                                 .as("GroupComponent")
                                 .with_every(1, "PartComponent");
 
+constexpr Object_Scopes kScopes = Object_Scopes()
+                                      .from(CID_STORAGE_EXTENT, Narrowing::WHOLE, Narrowing::OBJECT)
+                                      .from(CID_TAPE_DRIVE, Narrowing::WHOLE, Narrowing::OBJECT);
+
 }  // namespace
 
 class TAVRIN_StorageResourcesSystemDevice_Provider
-    : public Pairing_Provider<TAVRIN_StorageResourcesSystemDevice, kHosted>,
+    : public Keyed_Pairing_Provider<TAVRIN_StorageResourcesSystemDevice, kHosted, kScopes>,
       public TAVRIN_StorageResourcesSystemDevice_Methods {};
 
 }  // namespace CPTA

@@ -355,8 +355,11 @@ Enum_References_Status CPTA::scoped_references(const Pairing&, const Meta_Class*
     return ENUM_REFERENCES_FAILED;
 }
 
-CPTA::One_Port_Scope::One_Port_Scope(const Instance*) : _reach(UNKNOWN) {}
+CPTA::Object_Scope::Object_Scope(const Pairing& rule, const Object_Scopes&, const Instance*)
+    : _rule(rule) {}
 
-Array<Instance*> CPTA::One_Port_Scope::fetch(classId_t) {
+CPTA::Object_Scope::~Object_Scope() {}
+
+Array<Instance*> CPTA::Object_Scope::fetch(classId_t) {
     return Array<Instance*>();
 }
