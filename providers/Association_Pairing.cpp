@@ -372,21 +372,43 @@ Object_Scope::Object_Scope(const Pairing& rule, const Object_Scopes& scopes, con
             case CID_FC_PORT_STATISTICS:
                 _port = address_in(key_text(source, "InstanceID"), kWwnDigits);
                 break;
-            case CID_SCSI_PROTOCOL_ENDPOINT:
-                _port = address_in(key_text(source, "Name"), kWwnDigits);
+            case CID_SCSI_PROTOCOL_ENDPOINT: {
+                // The port's own: its WWN; a target's: that, "_", the target's.
+                const String name = key_text(source, "Name");
+                _port = address_in(name, kWwnDigits);
+                if (_port.size() > 0 && name.size() > _port.size()) {
+                    _remote = name.substr(_port.size() + 1);
+                    if (address_in(_remote, kWwnDigits).size() != _remote.size() ||
+                        _remote.size() == 0)
+                        _port = _remote = String();
+                }
                 break;
+            }
             case CID_ETHERNET_PORT: {
                 const String id = key_text(source, "DeviceID");
                 _mac = address_in(id, kMacDigits).size() == id.size() ? id : String();
                 break;
             }
-            default: {
+            case CID_FC_PORT:
+            case CID_ALARM_DEVICE: {
                 const String id = key_text(source, "DeviceID");
-                _port = address_in(id, kWwnDigits);
-                if (from == CID_FC_PORT || from == CID_ALARM_DEVICE)
-                    _port = _port.size() == id.size() ? _port : String();
+                _port = address_in(id, kWwnDigits).size() == id.size() ? id : String();
                 break;
             }
+            case CID_STORAGE_EXTENT:
+            case CID_TAPE_DRIVE:
+            case CID_LOGICAL_DISK: {
+                // The local port's WWN, "_", the target's, "_", and the LUN.
+                const String id = key_text(source, "DeviceID");
+                const size_t remote = kWwnDigits + 1, end = remote + kWwnDigits;
+                if (address_in(id, kWwnDigits).size() > 0 && id.size() > end && id[end] == '_' &&
+                    address_in(id.substr(remote), kWwnDigits).size() > 0) {
+                    _port = id.substr(0, kWwnDigits);
+                    _remote = id.substr(remote, kWwnDigits);
+                }
+                break;
+            }
+            default: break;
         }
 
         _reach = NOTHING;
@@ -398,6 +420,7 @@ Object_Scope::Object_Scope(const Pairing& rule, const Object_Scopes& scopes, con
             if (is_per_element(rule.sets[set].source))
                 continue;
             switch (_row->sets[set]) {
+                case Narrowing::NONE: return;
                 case Narrowing::WHOLE: break;
                 case Narrowing::OBJECT:
                     if (!lookupInventory(from, source, _object)) {
@@ -412,6 +435,7 @@ Object_Scope::Object_Scope(const Pairing& rule, const Object_Scopes& scopes, con
                         return;
                     break;
                 case Narrowing::PORT:
+                case Narrowing::PATHS:
                     if (_port.size() == 0)
                         return;
                     break;
@@ -450,6 +474,7 @@ Array<Instance*> Object_Scope::fetch(classId_t id) {
     const Narrowing narrowing = set < _rule.num_sets ? _row->sets[set] : Narrowing::WHOLE;
     Array<Instance*> found;
     switch (narrowing) {
+        case Narrowing::NONE: return found;
         case Narrowing::WHOLE:
             return set < _rule.num_sets && _rule.sets[set].source == Source::HOST_DISCOVERED
                        ? HDRManager::getHDRManager()->getInstances(id)
@@ -470,6 +495,25 @@ Array<Instance*> Object_Scope::fetch(classId_t id) {
             scope.port = _port;
             scope.remotes = PortScope::NO_REMOTES;
             return FCHBAManager::getFCHBAManager()->getInstancesByPort(id, scope);
+        }
+        case Narrowing::PATHS: {
+            FCHBAManager* inventory = FCHBAManager::getFCHBAManager();
+            PortScope scope;
+            scope.port = _port;
+            if (_remote.size() > 0) {
+                scope.remote = _remote;
+                scope.remotes = PortScope::ONE_REMOTE;
+            }
+            found = inventory->getInstancesByPort(id, scope);
+            if (id == CID_SCSI_PROTOCOL_ENDPOINT && _remote.size() > 0) {
+                // The port's own endpoint, first, as the walk gives it.
+                scope.remotes = PortScope::NO_REMOTES;
+                Array<Instance*> own = inventory->getInstancesByPort(id, scope);
+                own.append(found.data(), found.size());
+                found.clear();
+                return own;
+            }
+            return found;
         }
         case Narrowing::ETHERNET_PORT:
             return EthernetPortHelper::getEthernetPortHelperObject()->getInstancesByPort(id, _mac);

@@ -134,12 +134,17 @@ private:
 // the enumeration's, as long as the partners of the source are all among
 // what the narrowing gives.
 enum class Narrowing : uint8 {
+    NONE,           // no instance of the set can pair with the source (whose keys
+                    // are not those of any end): nothing is asked, nothing answered
     WHOLE,          // as the enumeration fetches it (the host, the diagnostic tests)
     OBJECT,         // the source itself, looked up by its keys (a set of its class)
     ADAPTER,        // the port controller, package, product or software identities
                     // of the source's adapter (named by the source, or owning its port)
     PORT,           // what the walk builds for the source's FC port, no remote port
     ETHERNET_PORT,  // what the walk builds for the source's Ethernet port
+    PATHS,          // what the walk builds for the source's FC port and the one remote
+                    // port it names (a target endpoint, a LUN), or all of them (the
+                    // port's own endpoint); the port's own endpoint always comes first
 };
 
 struct Scope_Row {
@@ -148,7 +153,7 @@ struct Scope_Row {
 };
 
 struct Object_Scopes {
-    static constexpr size_t MAX_ROWS = 3;
+    static constexpr size_t MAX_ROWS = 4;
     Scope_Row rows[MAX_ROWS];
     size_t num_rows;
 
@@ -180,7 +185,7 @@ private:
     const Scope_Row* _row = nullptr;
     classId_t _from = CID_NONE;
     Reach _reach = UNKNOWN;
-    String _adapter, _port, _mac;
+    String _adapter, _port, _remote, _mac;
     bool _adapterKnown = false;
     Array<Instance*> _object;  // the source looked up, until fetched
 };

@@ -12,8 +12,6 @@
 // port's WWN, a target's the two WWNs, a LUN's DeviceID begins with them.
 #include <cstdio>
 
-#include "inventory/FCHBAManager.h"
-#include "inventory/PortHelper.h"
 #include "providers/Association_Pairing.h"
 #include "providers/generated/TAVRIN_SCSIInitiatorTargetLogicalUnitPath_Methods.h"
 #include "schema/generated/TAVRIN_SCSIProtocolEndpoint.h"
@@ -94,70 +92,19 @@ constexpr Pairing kPaths =
         .only(is_target)
         .with_all(0, "LogicalUnit", key(ports_of_target), key(ports_of_unit));
 
-// The sets of the paths from one object, read from its keys: a Name (an
-// endpoint) or a DeviceID (a LUN). Another object of this host has a
-// DeviceID without the two WWNs, and no path.
-class Path_Scope : public Pairing_Fetcher {
-public:
-    explicit Path_Scope(const Instance* source) : _reach(UNKNOWN) {
-        // The source holds its keys only: a Name or a DeviceID.
-        const Property<String>* name = text_property(source, "Name");
-        const Property<String>* device = text_property(source, "DeviceID");
-        if (name != nullptr && name->null)
-            name = nullptr;
-        if (device != nullptr && device->null)
-            device = nullptr;
-        if ((name != nullptr) == (device != nullptr))
-            return;
-        const String& text = (name ? name : device)->value;
-        const size_t first = text.find('_');
-        _reach = NOTHING;
-        if (name != nullptr) {
-            // An initiator: its port's endpoints and LUNs; a target: its own.
-            _port = text.substr(0, first);
-            if (first != String::npos)
-                _remote = text.substr(first + 1);
-        } else {
-            const size_t second = first == String::npos ? first : text.find('_', first + 1);
-            if (second == String::npos)
-                return;
-            _port = text.substr(0, first);
-            _remote = text.substr(first + 1, second - first - 1);
-        }
-        if (_port.size() > 0 && (first == String::npos || _remote.size() > 0))
-            _reach = NARROWED;
-    }
-
-    Reach reach() const { return _reach; }
-
-    Array<Instance*> fetch(classId_t id) override {
-        FCHBAManager* inventory = FCHBAManager::getFCHBAManager();
-        PortScope scope;
-        scope.port = _port;
-        if (_remote.size() > 0) {
-            scope.remote = _remote;
-            scope.remotes = PortScope::ONE_REMOTE;
-        }
-        Array<Instance*> found = inventory->getInstancesByPort(id, scope);
-        if (id == CID_SCSI_PROTOCOL_ENDPOINT && _remote.size() > 0) {
-            // The port's own endpoint, the initiator of the paths, first.
-            scope.remotes = PortScope::NO_REMOTES;
-            Array<Instance*> initiator = inventory->getInstancesByPort(id, scope);
-            initiator.append(found.data(), found.size());
-            return initiator;
-        }
-        return found;
-    }
-
-private:
-    Reach _reach;
-    String _port, _remote;
-};
+// The paths from one object are paired from the endpoints and LUNs of the
+// one port (and target) its keys name; an FC port is no end of a path.
+constexpr Object_Scopes kScopes =
+    Object_Scopes()
+        .from(CID_SCSI_PROTOCOL_ENDPOINT, Narrowing::PATHS, Narrowing::PATHS)
+        .from(CID_STORAGE_EXTENT, Narrowing::PATHS, Narrowing::PATHS)
+        .from(CID_TAPE_DRIVE, Narrowing::PATHS, Narrowing::PATHS)
+        .from(CID_FC_PORT, Narrowing::NONE, Narrowing::NONE);
 
 }  // namespace
 
 class TAVRIN_SCSIInitiatorTargetLogicalUnitPath_Provider
-    : public Scoped_Pairing_Provider<TAVRIN_SCSIInitiatorTargetLogicalUnitPath, kPaths, Path_Scope>,
+    : public Keyed_Pairing_Provider<TAVRIN_SCSIInitiatorTargetLogicalUnitPath, kPaths, kScopes>,
       public TAVRIN_SCSIInitiatorTargetLogicalUnitPath_Methods {};
 
 }  // namespace CPTA
