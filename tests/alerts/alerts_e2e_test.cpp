@@ -29,11 +29,6 @@ int threads() {
     return count;
 }
 
-std::string text(const tvrnhost::Instance& instance, const char* property) {
-    const tvrnhost::Value* value = instance.get(property);
-    return value && !value->isNull() ? value->asString() : std::string();
-}
-
 class AlertProvider : public ::testing::Test {
 protected:
     void SetUp() override {
@@ -45,25 +40,13 @@ protected:
     Module_Session* session = nullptr;
 };
 
-TEST_F(AlertProvider, AnEventArrivesInBothForms) {
+// What an event becomes, in both forms, is in tests/golden/alerts.golden.
+TEST_F(AlertProvider, AnUnsubscribeWithdrawsFromTheLibrary) {
     tvrnhost::Host& host = session->host();
     ASSERT_TRUE(host.subscribe(tvrne2e::kNameSpace, kClass).ok());
     ASSERT_EQ(tvrn_sim_emit_event(kPortEvent), 1);
     ASSERT_TRUE(host.waitForIndications(2, std::chrono::seconds(10)));
-    const auto got = host.indications();
-    ASSERT_EQ(got.size(), 2u);
-    EXPECT_EQ(got[0].nameSpace, tvrne2e::kNameSpace);
-    EXPECT_EQ(text(got[0].instance, "MessageID"), "TVRN131073");
-    EXPECT_EQ(text(got[1].instance, "MessageID"), "PROPTVRN131073");
-    EXPECT_EQ(got[1].instance.get("SequenceNumber")->asSint(),
-              got[0].instance.get("SequenceNumber")->asSint() + 1);
-    const std::string hostName = session->hostName();
-    EXPECT_EQ(text(got[0].instance, "AlertingManagedElement"),
-              "//" + hostName +
-                  "/root/tavrin:TAVRIN_FCPort.SystemCreationClassName=\"TAVRIN_ComputerSystem\","
-                  "SystemName=\"" +
-                  hostName +
-                  "\",CreationClassName=\"TAVRIN_FCPort\",DeviceID=\"100000051e0a0b0c\"");
+    EXPECT_EQ(host.indications()[0].nameSpace, tvrne2e::kNameSpace);
 
     ASSERT_TRUE(host.unsubscribe(tvrne2e::kNameSpace, kClass).ok());
     EXPECT_EQ(session->calls("unregister_for_events"), 1u);

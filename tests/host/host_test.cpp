@@ -114,7 +114,8 @@ TEST_F(Requests, FailuresReportCodeAndMessage) {
     EXPECT_EQ(host->invokeMethod(w1, "NoSuchMethod").rc, CMPI_RC_ERR_METHOD_NOT_FOUND);
     EXPECT_EQ(host->invokeMethod(path("Test_Gadget.Name=\"g1\""), "Echo").rc,
               CMPI_RC_ERR_NOT_SUPPORTED);  // no method provider for the class
-    EXPECT_EQ(host->enumerateInstances(kNs, "Test_Unknown").rc, CMPI_RC_ERR_INVALID_CLASS);
+    EXPECT_EQ(host->enumerateInstances(kNs, "Test_Unknown").toString(),
+              "CMPI_RC_ERR_INVALID_CLASS: class Test_Unknown is not served in root/test");
     EXPECT_EQ(host->subscribe(kNs, "Test_Widget").rc, CMPI_RC_ERR_NOT_SUPPORTED);
     EXPECT_EQ(host->subscribe(kNs, "Test_Nothing").rc, CMPI_RC_ERR_INVALID_CLASS);
     EXPECT_EQ(host->getInstance(path("root/none:Test_Widget.Id=\"w1\"")).rc,
