@@ -25,7 +25,6 @@ const char kAdapter[] = "200000051e0a0b0c";
 const char kPort[] = "100000051e0a0b0c";
 const char kFailingPort[] = "100000051e0a0b0d";  // its loopback test fails
 const char kDisabledPort[] = "100000051e5c6d71";
-const char kFcoePort[] = "100000051e8a4b01";
 const char kEthPort[] = "00051e8a4b01";
 
 // One kind of test: its class, the Name of the instance invoked, the element
@@ -226,7 +225,9 @@ TEST_F(Diagnostics, DisabledPortIsTestedAsItIsAndStaysDisabled) {
     EXPECT_TRUE(callsOf("setPortByWwn").empty());
 }
 
-// Requests that start nothing: no job, no test call.
+// Requests that start nothing: no job, no test call (an FCoE port's internal
+// loopback, an element of another class and none are in
+// tests/golden/diagnostics_ports.golden).
 TEST_F(Diagnostics, RefusedRequestsStartNothing) {
     const struct {
         const char* what;
@@ -236,10 +237,6 @@ TEST_F(Diagnostics, RefusedRequestsStartNothing) {
         const char* deviceId;
         unsigned answer;
     } cases[] = {
-        {"internal loopback on an FCoE port", kLoopback, "InternalLoopbackTest", "FCPort",
-         kFcoePort, 1},
-        {"an element of another class", kLoopback, nullptr, "EthernetPort", kEthPort, 5},
-        {"no element", kLoopback, nullptr, "", nullptr, 5},
         {"a test name of no loopback test", kLoopback, "MemoryTest", nullptr, nullptr, 5},
         {"an adapter the library does not know", kMemory, nullptr, nullptr, "200000051e0a0b99", 5},
         {"an identifier of neither length", kMemory, nullptr, nullptr, "20000005", 5},
@@ -256,34 +253,6 @@ TEST_F(Diagnostics, RefusedRequestsStartNothing) {
     EXPECT_EQ(session->enumerate("TAVRIN_ConcreteJob").items.size(), jobsBefore);
     for (const Test_Kind* t : {&kMemory, &kLoopback, &kPci})
         EXPECT_EQ(session->calls(t->entryPoint), 0u) << t->entryPoint;
-}
-
-TEST_F(Diagnostics, NextRunReplacesTheJobAndRecordNumbersGoOn) {
-    const std::string first = start(kMemory);
-    waitForJob();
-    const long long lastOfFirst = recordNumber(
-        text(session->enumerate("TAVRIN_DiagnosticCompletionRecord").items.back(), "InstanceID"));
-    const std::string second = start(kPci);
-    std::vector<Instance> jobs = waitForJob();
-    ASSERT_EQ(jobs.size(), 1u);
-    EXPECT_EQ(text(jobs[0], "InstanceID"), second);
-    EXPECT_EQ(recordNumber(text(session->enumerate("TAVRIN_DiagnosticServiceRecord").items.back(),
-                                "InstanceID")),
-              lastOfFirst + 2);  // "Running PCI ..." and "Checking ..."
-    EXPECT_EQ(records(second, false),
-              (std::vector<Record>{{"PCI Loopback test run is successful", 2}}));
-
-    // The job with its test and with the port it ran on.
-    Result<Instance> owning = session->host().associators(
-        session->path("TAVRIN_ConcreteJob.InstanceID=\"" + second + "\""),
-        "TAVRIN_OwningJobElement");
-    ASSERT_EQ(owning.items.size(), 1u);
-    EXPECT_EQ(text(owning.items[0], "Name"), "Tavrin:PCILoopbackTest");
-    Result<ObjectPath> affected = session->host().associatorNames(
-        session->path("TAVRIN_ConcreteJob.InstanceID=\"" + second + "\""),
-        "TAVRIN_AffectedJobElement");
-    ASSERT_EQ(affected.items.size(), 1u);
-    EXPECT_EQ(affected.items[0].className(), "TAVRIN_FCPort");
 }
 
 TEST_F(Diagnostics, RecordListsKeepTheLatestHundred) {

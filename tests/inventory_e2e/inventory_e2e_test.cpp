@@ -73,31 +73,6 @@ std::string devicePath(const char* className, const std::string& deviceId,
            systemName + "\"";
 }
 
-TEST(Inventory, EveryClassEnumeratesAndEachPathFindsItsInstanceAgain) {
-    Module_Session& s = Module_Session::open();
-    ASSERT_TRUE(s.loaded());
-    ASSERT_FALSE(s.hostName().empty());
-    for (const Inventory_Class& c : kClasses) {
-        SCOPED_TRACE(c.name);
-        Result<Instance> got = s.enumerate(c.name);
-        ASSERT_TRUE(got.ok()) << got.toString();
-        EXPECT_EQ(got.items.size(), c.onDefaultHost);
-        Result<ObjectPath> names = s.enumerateNames(c.name);
-        ASSERT_TRUE(names.ok()) << names.toString();
-        ASSERT_EQ(names.items.size(), got.items.size());
-        std::set<std::string> distinct;
-        for (size_t i = 0; i < got.items.size(); i++) {
-            const Instance& instance = got.items[i];
-            EXPECT_EQ(names.items[i], instance.path());
-            distinct.insert(instance.path().toString());
-            InstanceResult again = s.get(instance.path());
-            ASSERT_TRUE(again.ok()) << instance.path().toString() << ": " << again.toString();
-            EXPECT_EQ(again.instance, instance);
-        }
-        EXPECT_EQ(distinct.size(), got.items.size()) << "paths must tell the instances apart";
-    }
-}
-
 TEST(Inventory, WithoutAdaptersEveryProviderSucceedsEmptyAndSaysSoOnce) {
     Module_Session& s = Module_Session::open("empty");
     ASSERT_TRUE(s.loaded());

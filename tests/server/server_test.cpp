@@ -71,15 +71,6 @@ TEST_F(ServerProfile, AnswersTheSameWithoutTheAdapterLibrary) {
     dlclose(library);
 }
 
-TEST_F(ServerProfile, EveryPathFindsItsInstance) {
-    for (const auto& c : kClasses)
-        for (const Instance& instance : host->enumerateInstances(kNs, c.first).items) {
-            InstanceResult found = host->getInstance(instance.path());
-            EXPECT_TRUE(found.ok()) << instance.path().toString() << ": " << found.toString();
-            EXPECT_EQ(found.instance, instance);
-        }
-}
-
 TEST_F(ServerProfile, OneObjectManagerPerRequestNamedAlsoWhenTheServerHasNone) {
     // The server answers, but has no object manager.
     host->store("root/PG_InterOp").defineClass("CIM_ObjectManager");
