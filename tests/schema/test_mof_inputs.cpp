@@ -1,7 +1,8 @@
 // The repository against the MOF classes it is made from, read here by a small
 // reader of its own so that a fault shared by the generator and its output
 // cannot hide: every class, its superclass, its features in order with their
-// kinds, keys and referenced classes.
+// kinds, keys and referenced classes, and each method's return type and
+// parameters.
 #include <gtest/gtest.h>
 
 #include <strings.h>
@@ -18,6 +19,7 @@
 #include <string>
 #include <vector>
 
+#include "framework/Type_Info.h"
 #include "schema/Repository.h"
 
 using namespace CPTA;
@@ -32,8 +34,9 @@ struct Feature {
     std::string name;
     char kind;  // 'P' property, 'R' reference, 'M' method
     bool key;
-    std::string ref;  // referenced class of a reference ("Instance": any class)
-    bool local;       // declared or redeclared by the class itself
+    std::string ref;             // referenced class of a reference ("Instance": any class)
+    bool local;                  // declared or redeclared by the class itself
+    std::string signature = "";  // of a method: "type(in out type[] Name, ...)"
 };
 
 // A class as declared (its own features), or with everything it inherits.
@@ -165,7 +168,7 @@ private:
         Qualifiers q = read_qualifiers();
         std::string type = word();
         bool ref = take("REF");
-        Feature f{word(), 'P', has(q, "key"), "", true};
+        Feature f{word(), 'P', has(q, "key"), "", true, type};
         if (take("["))
             skip_to();
         if (ref)
@@ -175,6 +178,29 @@ private:
         else if (has(q, "embeddedobject"))
             f.kind = 'R', f.ref = "Instance";
         return f;
+    }
+
+    // Parameters up to the closing ")": an [OUT] parameter is an input too
+    // unless IN(false).
+    std::string read_parameters() {
+        std::string out;
+        while (!take(")")) {
+            Qualifiers q = read_qualifiers();
+            const bool in = !q.count("in") || has(q, "in"), output = has(q, "out");
+            std::string type = word();
+            if (take("REF"))
+                type += " REF";
+            else if (q.count("embeddedinstance"))
+                type = q.at("embeddedinstance") + " embedded";
+            else if (has(q, "embeddedobject"))
+                type = "Instance embedded";
+            const std::string name = word();
+            const bool array = take("[") && (skip_to(), true);
+            out += std::string(out.empty() ? "" : ", ") + (in ? "in " : "") +
+                   (output ? "out " : "") + type + (array ? "[] " : " ") + name;
+            take(",");
+        }
+        return out;
     }
 
     Class read_class() {
@@ -189,14 +215,16 @@ private:
         expect("{");
         while (!take("}")) {
             Feature f = read_typed_name();
-            if (take("(")) {  // a method; its parameters are not compared
+            if (take("(")) {
                 f.kind = 'M', f.key = false, f.ref.clear();
-                skip_to();
+                f.signature += "(" + read_parameters() + ")";
             } else if (take("=")) {
                 while (!at(";"))
                     next();
             }
             expect(";");
+            if (f.kind != 'M')
+                f.signature.clear();
             c.features.push_back(f);
         }
         expect(";");
@@ -207,6 +235,31 @@ private:
     std::vector<std::string> tokens_;
     size_t pos_ = 0;
 };
+
+// "type(in out type[] Name, ...)" of a method record: parameters, then the
+// return value.
+std::string signature(const Meta_Method* m) {
+    std::string s = std::string(type_name(m->return_type)) + "(";
+    for (size_t k = 0; k + 1 < m->num_meta_features; k++) {
+        const Meta_Feature* f = m->meta_features[k];
+        s += std::string(k ? ", " : "") + (f->flags & FLAG_IN ? "in " : "") +
+             (f->flags & FLAG_OUT ? "out " : "");
+        bool array;
+        if (f->flags & FLAG_REFERENCE) {
+            auto r = reinterpret_cast<const Meta_Reference*>(f);
+            s +=
+                std::string(r->meta_class->name) +
+                (f->flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT) ? " embedded" : " REF");
+            array = r->subscript != 0;
+        } else {
+            auto p = reinterpret_cast<const Meta_Property*>(f);
+            s += type_name(p->type);
+            array = p->subscript != 0;
+        }
+        s += std::string(array ? "[] " : " ") + f->name;
+    }
+    return s + ")";
+}
 
 Class from_repository(const Meta_Class* mc) {
     Class c;
@@ -225,6 +278,8 @@ Class from_repository(const Meta_Class* mc) {
             const Meta_Class* target = reinterpret_cast<const Meta_Reference*>(mf)->meta_class;
             f.kind = 'R', f.ref = target ? target->name : "(none)";
         }
+        if (kind == FLAG_METHOD)
+            f.signature = signature(reinterpret_cast<const Meta_Method*>(mf));
         c.features.push_back(f);
     }
     return c;
@@ -282,19 +337,22 @@ std::string describe(const std::vector<Feature>& features, size_t i) {
     if (i >= features.size())
         return "nothing";
     const Feature& f = features[i];
-    return f.name + (f.kind == 'M' ? "()" : "") + (f.kind == 'R' ? " -> " + f.ref : "") +
-           (f.key ? " key" : "") + (f.local ? " (declared here)" : "");
+    return f.name + (f.kind == 'M' ? " " + f.signature : "") +
+           (f.kind == 'R' ? " -> " + f.ref : "") + (f.key ? " key" : "") +
+           (f.local ? " (declared here)" : "");
 }
 
 }  // namespace
 
 TEST(SchemaInputs, RepositoryHoldsWhatTheMofClassesDeclare) {
     const char* src = std::getenv("TVRN_SOURCE_DIR");
-    std::string tavrin_mof =
-        std::string(src ? src : TVRN_PROJECT_SOURCE_DIR) + "/schema/tavrin.mof";
-    const char* cim_mof = std::getenv("TVRN_CIM_SCHEMA_MOF");
-    if (!cim_mof || !*cim_mof)
-        cim_mof = TVRN_CIM_SCHEMA_MOF;
+    const std::string schema = std::string(src ? src : TVRN_PROJECT_SOURCE_DIR) + "/schema/";
+    std::string tavrin_mof = schema + "tavrin.mof";
+    const char* env_mof = std::getenv("TVRN_CIM_SCHEMA_MOF");
+    std::string cim_mof = env_mof && *env_mof ? env_mof : TVRN_CIM_SCHEMA_MOF;
+    // Without the DMTF file, the DMTF classes as the module installs them.
+    if (!std::ifstream(cim_mof).good())
+        cim_mof = schema + "generated/dmtf_classes.mof";
     bool have_cim = std::ifstream(cim_mof).good();
 
     std::vector<Class> classes;
