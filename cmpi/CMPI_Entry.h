@@ -12,6 +12,7 @@
 
 #include "cmpi/CMPI_Adapter.h"
 #include "cmpi/CMPI_Thread_Context.h"
+#include "framework/Request_Failure.h"
 
 namespace CPTA {
 
@@ -66,6 +67,7 @@ CMPIStatus run_entry(const char* name, void* hdl, const CMPIContext* context, F&
             broker = adapter->broker();
             Entry_Scope scope(adapter, context);
             _log_enter(name);
+            Request_Failure_Scope failures;
             try {
                 status = body(adapter, scope);
             } catch (const std::exception& e) {
@@ -73,6 +75,10 @@ CMPIStatus run_entry(const char* name, void* hdl, const CMPIContext* context, F&
             } catch (...) {
                 status = Entry_Status(CMPI_RC_ERR_FAILED, "unexpected exception");
             }
+            // Data lost below the provider fails the request, whatever the
+            // provider made of what was left.
+            if (failures.failed() && !(status.rc == CMPI_RC_ERR_FAILED && status.message.size()))
+                status = Entry_Status(CMPI_RC_ERR_FAILED, failures.message());
             _log_return(name, status);
             return _make_status(broker, status);
         }

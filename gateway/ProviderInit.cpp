@@ -73,11 +73,12 @@ void ProviderInit::start() {
 
 ProviderInit::~ProviderInit() {
     TVRN_LOG(LL_DBG, "Inside ProviderInit Destructor.");
-    guardedCall(LibCall("libFreeHbaLib"), [] { libFreeHbaLib(); });
     // The library stays mapped after the module is gone: it must not keep a
-    // callback into code that is about to be unmapped.
+    // callback into code that is about to be unmapped. The callback is taken
+    // back first: once told to free itself, the library is not called again.
     if (_logCallbackRegistered)
         guardedCall(LibCall("libRegisterLogMsgCb"), [] { libRegisterLogMsgCb(nullptr); });
+    guardedCall(LibCall("libFreeHbaLib"), [] { libFreeHbaLib(); });
 }
 
 int ProviderInit::getDriverStatus() {

@@ -175,7 +175,11 @@ void AdapterHelper::walk(classId_t classId, InstanceList& out, const String& onl
                 if (!ProviderUtil::valid_UTF_string(record.biosVersion.c_str()))
                     record.biosVersion.clear();
                 Json::Value flash = libGetFlashInfo(keyRequest("indexStr", key));
-                if (ProviderUtil::isValidJsonResponse(flash) && jsonBool(flash, "flashStatus"))
+                if (!ProviderUtil::isValidJsonResponse(flash) ||
+                    !jsonHas(flash, "flashStatus", Json::booleanValue))
+                    TVRN_LOG(LL_WARN, "Flash state of %s is not available; no BIOS identity",
+                             key.c_str());
+                else if (jsonBool(flash, "flashStatus"))
                     out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_BIOS, false));
                 out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_FIRMWARE, false));
                 break;

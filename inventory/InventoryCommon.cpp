@@ -3,6 +3,7 @@
 #include <cstdio>
 #include <vector>
 
+#include "framework/Request_Failure.h"
 #include "gateway/CIMProviderTfaj.h"
 #include "gateway/GuardedCall.h"
 #include "gateway/JsonAccess.h"
@@ -45,13 +46,18 @@ Array<Instance*> InstanceList::release() {
 
 void logWalkException(const char* operation, const HbaAgentError* user,
                       const std::exception* stdError) {
+    // The walk's data is lost: the request must fail, with the text logged.
+    char text[512];
     if (user != nullptr)
-        TVRN_LOG(LL_ERR, "%s ended by User exception %d: %s", operation, user->code,
-                 user->message.c_str());
+        std::snprintf(text, sizeof text, "%s ended by User exception %d: %s", operation, user->code,
+                      user->message.c_str());
     else if (stdError != nullptr)
-        TVRN_LOG(LL_ERR, "%s ended by std exception: %s", operation, stdError->what());
+        std::snprintf(text, sizeof text, "%s ended by std exception: %s", operation,
+                      stdError->what());
     else
-        TVRN_LOG(LL_ERR, "%s ended by default exception", operation);
+        std::snprintf(text, sizeof text, "%s ended by default exception", operation);
+    TVRN_LOG(LL_ERR, "%s", text);
+    note_request_failure(text);
 }
 
 uint16 enabledStateOf(long long portState) {
@@ -91,8 +97,11 @@ String owningAdapterKey(const String& portKey) {
                      keyRequest("indexStr", ProviderUtil::getIndexInColonFormat(portKey)), answer))
         return String();
     const Json::Value* id = jsonMember(answer, "adapterId");
-    if (!ProviderUtil::isValidJsonResponse(answer) || id == nullptr || !id->isUInt() ||
-        id->asUInt() == 0)
+    if (!ProviderUtil::isValidJsonResponse(answer) || id == nullptr || !id->isUInt()) {
+        TVRN_LOG(LL_ERR, "libGetAdapterIdByPort returns NULL.");
+        return String();
+    }
+    if (id->asUInt() == 0)
         return String();
     Json::Value adapters;
     if (listAdapters(adapters, false) < int(id->asUInt()))

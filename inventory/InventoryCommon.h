@@ -49,7 +49,10 @@ private:
 // Runs one walk of the inventory: opens the request's host scope, lets `fill`
 // add instances to a list and returns them. Library calls that are not
 // guarded may throw; the exception ends the walk here: it is logged with the
-// operation's name, whatever was built is destroyed and the result is empty.
+// operation's name, whatever was built is destroyed, the result is empty and
+// the request is noted as failed (framework/Request_Failure.h), so that the
+// client gets CMPI_RC_ERR_FAILED with the logged text rather than a short
+// answer.
 void logWalkException(const char* operation, const HbaAgentError* user,
                       const std::exception* stdError);
 

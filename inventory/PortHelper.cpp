@@ -182,9 +182,10 @@ void PortHelper::walkAdapter(const String& adapterKey, classId_t classId, WalkFo
         if (!guardedCall(LibCall("libGetPortByWwn"), libGetPortByWwn, keyRequest("wwn", portKey),
                          port))
             continue;
-        if (!ProviderUtil::isValidJsonResponse(port) || !port.isObject()) {
-            if (form == BY_ADDRESS)
-                TVRN_LOG(LL_ERR, "libGetPortByWwn response is null or has error");
+        // A port the library cannot name is skipped, and said so.
+        if (!ProviderUtil::isValidJsonResponse(port) || !port.isObject() ||
+            !jsonHas(port, "wwn", Json::stringValue)) {
+            TVRN_LOG(LL_ERR, "libGetPortByWwn response is null or has error");
             continue;
         }
         _hbaPortInfo record;
@@ -304,8 +305,12 @@ prov_pport_stats_s PortHelper::readStatistics(const Json::Value& list, bool isFC
         const int id = jsonInt(element, "id");
         for (const StatId* s = begin; s != end; s++) {
             uint64 value;
-            if (s->id == id && parseCounter(jsonString(element, "value"), value))
+            if (s->id != id)
+                continue;
+            if (parseCounter(jsonString(element, "value"), value))
                 stats.*(s->counter) = value;
+            else
+                TVRN_LOG(LL_WARN, "Statistic %d has no decimal value; counted as 0", id);
         }
     }
     return stats;

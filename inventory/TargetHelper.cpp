@@ -135,7 +135,10 @@ Array<Instance*> TargetHelper::getTargetInstances(const _hbaPortInfo& port, clas
             Json::Value answer;
             guardedCall(LibCall("libGetCompleteRemotePort"), libGetCompleteRemotePort, request,
                         answer);
-            if (!ProviderUtil::isValidJsonResponse(answer)) {
+            // Without its device data the remote port cannot be told from
+            // one that is no target: a broken answer.
+            if (!ProviderUtil::isValidJsonResponse(answer) ||
+                !jsonHas(answer, "deviceData", Json::objectValue)) {
                 TVRN_LOG(LL_ERR, "libGetCompleteRemotePort response is null or has error");
                 continue;
             }

@@ -3,6 +3,7 @@
 #include "providers/Association_Pairing.h"
 
 #include <cctype>
+#include <cstdio>
 #include <cstdlib>
 #include <exception>
 #include <map>
@@ -11,6 +12,7 @@
 #include <json/json.h>
 
 #include "diagnostics/DiagnosticHelper.h"
+#include "framework/Request_Failure.h"
 #include "gateway/HbaAgentError.h"
 #include "gateway/JsonAccess.h"
 #include "gateway/ProviderUtil.h"
@@ -183,6 +185,19 @@ String Inventory_Sources::adapter_serial_number(unsigned number) {
 
 }  // namespace
 
+namespace {
+
+// Logs why the request failed and gives the client the same text.
+template <class... Args>
+void failed(const Pairing& rule, const char* format, Args... args) {
+    char text[512];
+    std::snprintf(text, sizeof text, format, args...);
+    log(LL_ERR, rule.file, rule.line, "%s", text);
+    note_request_failure(text);
+}
+
+}  // namespace
+
 Enum_Instances_Status enumerate_inventory_pairs(const Pairing& rule, const Meta_Class* association,
                                                 Association_Sink sink, void* target,
                                                 Pairing_Fetcher* fetcher) noexcept {
@@ -194,12 +209,11 @@ Enum_Instances_Status enumerate_inventory_pairs(const Pairing& rule, const Meta_
         Inventory_Sources sources(fetcher);
         status = enumerate_pairs(rule, association, sources, sink, target);
     } catch (const HbaAgentError& e) {
-        log(LL_ERR, rule.file, rule.line, "enum_instances got User exception %d: %s", e.code,
-            e.message.c_str());
+        failed(rule, "enum_instances got User exception %d: %s", e.code, e.message.c_str());
     } catch (const std::exception& e) {
-        log(LL_ERR, rule.file, rule.line, "enum_instances got std exception: %s", e.what());
+        failed(rule, "enum_instances got std exception: %s", e.what());
     } catch (...) {
-        log(LL_ERR, rule.file, rule.line, "enum_instances got default exception");
+        failed(rule, "%s", "enum_instances got default exception");
     }
     log(LL_DBG, rule.file, rule.line, "Returning: %s", "enum_instances");
     return status;

@@ -16,6 +16,8 @@ namespace {
 int intQuery(EntryId id) {
     Library& lib = Library::instance();
     lib.note(id);
+    if (lib.calledAfterFree(id))
+        return -1;
     switch (id) {
         case tvrnsim::EP_getRequestID: return lib.nextRequestId();
         case tvrnsim::EP_free_hba_lib: return lib.freeLibrary();
@@ -26,24 +28,31 @@ int intQuery(EntryId id) {
 unsigned int uintQuery(EntryId id) {
     Library& lib = Library::instance();
     lib.note(id);
+    if (lib.calledAfterFree(id))
+        return 0xFFFFu;
     return id == tvrnsim::EP_getNumberOfAdapters ? lib.adapterCount() : 0xFFFFu;
 }
 
 const char* stringQuery(EntryId id) {
     Library& lib = Library::instance();
     lib.note(id);
+    lib.calledAfterFree(id);
     return id == tvrnsim::EP_get_agt_version ? lib.version() : nullptr;
 }
 
 void eventCallback(EntryId id, void (*cb)(const char*)) {
     Library& lib = Library::instance();
     lib.note(id);
+    lib.calledAfterFree(id);
     lib.setEventCallback(cb);
 }
 
 void logCallback(EntryId id, void (*cb)(int, const char*, int, const char*)) {
     Library& lib = Library::instance();
     lib.note(id);
+    // Taken out of order, the callback is still set: a withdrawal is always
+    // honoured, so that the library never calls into an unloaded module.
+    lib.calledAfterFree(id, cb == nullptr);
     lib.setLogCallback(cb);
 }
 
@@ -143,6 +152,10 @@ SIM_API unsigned long long tvrn_sim_call_count(const char* entryPoint) {
 
 SIM_API unsigned long long tvrn_sim_total_calls(void) {
     return Library::instance().totalCalls();
+}
+
+SIM_API unsigned long long tvrn_sim_calls_after_free(void) {
+    return Library::instance().callsAfterFree();
 }
 
 SIM_API void tvrn_sim_reset_counters(void) {

@@ -158,8 +158,24 @@ void Library::note(EntryId id, const Json::Value* request) {
     recorded_.push_back(std::move(call));
 }
 
+bool Library::calledAfterFree(EntryId id, bool withdrawsCallback) {
+    if (!freed_.load())
+        return false;
+    const bool startUp = id == EP_get_agt_version || id == EP_init_hba_lib ||
+                         (id == EP_registerLogMsgCb && !withdrawsCallback);
+    if (startUp)
+        return false;
+    callsAfterFree_.fetch_add(1);
+    std::fprintf(stderr, "libdtfaj.so: %s called after free_hba_lib\n", kEntries[id].name);
+    return true;
+}
+
 Json::Value Library::callJson(EntryId id, const Json::Value& request) {
     note(id, &request);
+    if (calledAfterFree(id))
+        return errorAnswer(kInvalidState, "the library has been freed");
+    if (id == EP_init_hba_lib)
+        freed_.store(false);
     Fault fault;
     const bool faulted = takeFault(id, request, fault);
     if (faulted) {
@@ -241,6 +257,7 @@ int Library::nextRequestId() {
 }
 
 int Library::freeLibrary() {
+    freed_.store(true);
     events_.unsubscribe();
     log({LogLine{2, __FILE__, __LINE__, "library released"}});
     return 0;
@@ -390,6 +407,8 @@ int Library::reset() {
     resetCounters();
     clearRecording();
     events_.discardQueued();
+    freed_.store(false);
+    callsAfterFree_.store(0);
     return rc;
 }
 

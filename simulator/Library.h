@@ -43,6 +43,10 @@ public:
     // Entry points. Every call is first noted (counted and recorded); callJson
     // does that itself.
     void note(EntryId id, const Json::Value* request = nullptr);
+    // Whether a call of `id` comes after free_hba_lib without a new start:
+    // counted and reported on stderr. Only the start-up calls (get_agt_version,
+    // registering a log callback, init_hba_lib) are in order then.
+    bool calledAfterFree(EntryId id, bool withdrawsCallback = false);
     Json::Value callJson(EntryId id, const Json::Value& request);
     int nextRequestId();
     int freeLibrary();
@@ -64,6 +68,7 @@ public:
                  int times, int skip = 0);
     void clearFaults();
     std::uint64_t callCount(const char* entryPoint);
+    std::uint64_t callsAfterFree() { return callsAfterFree_.load(); }
     std::uint64_t totalCalls();
     void resetCounters();
     // The recorded calls as a JSON array text, and how many did not fit.
@@ -92,6 +97,8 @@ private:
     std::atomic<LogCallback> logCb_{nullptr};
     EventHub events_;
     std::atomic<std::uint64_t> counters_[EP_COUNT] = {};
+    std::atomic<bool> freed_{false};  // free_hba_lib called, init_hba_lib not since
+    std::atomic<std::uint64_t> callsAfterFree_{0};
 
     struct RecordedCall {
         EntryId id;

@@ -66,6 +66,11 @@ void tvrn_sim_clear_faults(void);
 unsigned long long tvrn_sim_call_count(const char* entryPoint);
 unsigned long long tvrn_sim_total_calls(void);
 void tvrn_sim_reset_counters(void);
+/* Calls made after free_hba_lib other than a new start (get_agt_version,
+ * registering a log callback, init_hba_lib); each is reported on stderr, and
+ * a JSON entry point then answers an "error" object. tvrn_sim_reset() clears
+ * the count; init_hba_lib ends the freed state. */
+unsigned long long tvrn_sim_calls_after_free(void);
 
 /* The calls since the recording was last cleared, oldest first, as the text of
  * one JSON array: [{"entry": "getHbaByWwn", "request": {"wwn": "..."}}, ...].

@@ -182,6 +182,9 @@ void SimLibrary::setFault(const char* entry, const char* key, int kind, int code
 unsigned long long SimLibrary::calls(const char* entry) const {
     return SIM_CONTROL(tvrn_sim_call_count)(entry);
 }
+unsigned long long SimLibrary::callsAfterFree() const {
+    return SIM_CONTROL(tvrn_sim_calls_after_free)();
+}
 Json::Value SimLibrary::recorded() const {
     return parseJson(SIM_CONTROL(tvrn_sim_recorded_calls)());
 }

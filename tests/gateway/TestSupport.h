@@ -75,6 +75,8 @@ public:
     void setFault(const char* entry, const char* key, int kind, int code = 0,
                   const char* text = nullptr, int times = 0);
     unsigned long long calls(const char* entry) const;
+    // Calls out of order after free_hba_lib (tvrn_sim_calls_after_free).
+    unsigned long long callsAfterFree() const;
     // The recorded calls: entry point names in order, and the requests of one
     // entry point in order.
     std::vector<std::string> entriesCalled() const;

@@ -42,12 +42,13 @@ TEST(StartUp, BuiltInHostStartsAndTheLibraryLogsThroughUs) {
             EXPECT_EQ(ProviderInit::getDriverStatus(), 0);
             EXPECT_EQ(sim.lastRequest("init_hba_lib"), parseJson(R"({"appId": 2})"));
         }
-        // Shut-down frees the library, then takes our callback back (the
-        // library stays mapped after the module is gone).
+        // Shut-down takes our callback back (the library stays mapped after
+        // the module is gone), then frees the library, and calls nothing more.
         EXPECT_EQ(
             sim.entriesCalled(),
             (std::vector<std::string>{"get_agt_version", "registerLogMsgCb", "init_hba_lib",
-                                      "getNumberOfAdapters", "free_hba_lib", "registerLogMsgCb"}));
+                                      "getNumberOfAdapters", "registerLogMsgCb", "free_hba_lib"}));
+        EXPECT_EQ(sim.callsAfterFree(), 0u);
         EXPECT_EQ(log.count("ERR", " not found. ", true), 0);
         EXPECT_TRUE(log.has("INFO", "TFAJ Library version: 3.2.1"));
         EXPECT_EQ(log.count("INFO", kSimulatorInitMessage, true), 1) << log.text();
@@ -120,7 +121,7 @@ TEST(StartUp, HostWithoutAdaptersGivesStatusOne) {
         setenv("TVRN_SIM_FIXTURE", "empty", 1);  // read when the simulator is first used
         SimLibrary sim(TVRN_SIM_LIBRARY);
         LogCapture& log = freshLog();
-        { ProviderInit init; }
+        ProviderInit init;  // the library is in use until the scenario ends
         EXPECT_EQ(ProviderInit::driverStatus, 1);
         EXPECT_TRUE(log.has("DBG", "Adapter Count = 0"));
         // Status 1 still lets requests through to the library; 2 and 3 do not.
@@ -138,7 +139,7 @@ TEST(StartUp, LibraryLackingOneEntryPoint) {
     gwtest::inFreshProcess([] {
         SimLibrary sim(TVRN_SIM_NO_GETCEE);
         LogCapture& log = freshLog();
-        { ProviderInit init; }
+        ProviderInit init;
         EXPECT_EQ(ProviderInit::driverStatus, 0);
         EXPECT_EQ(log.count("ERR", "getCee not found. "), 1) << log.text();
         EXPECT_EQ(log.count("ERR", " not found. ", true), 1);  // every other entry point is bound

@@ -222,6 +222,21 @@ TEST_F(Control, CountsAndRecordsEveryCallInOrder) {
     EXPECT_STREQ("[]", tvrn_sim_recorded_calls());
 }
 
+// After free_hba_lib only a new start is in order: anything else is counted
+// and refused until init_hba_lib; taking the log callback back still works.
+TEST_F(Control, CallsAfterFreeAreCountedUntilTheNextStart) {
+    EXPECT_EQ(0, free_hba_lib());
+    EXPECT_TRUE(isError(getHbaByWwn(kFcHbaReq)));
+    registerLogMsgCb(nullptr);
+    EXPECT_EQ(2u, tvrn_sim_calls_after_free());
+    EXPECT_NE(nullptr, get_agt_version());
+    EXPECT_EQ(0, init_hba_lib(J(R"({"appId": 2})"))["result"].asInt());
+    EXPECT_EQ("Tavrin-825", getHbaByWwn(kFcHbaReq)["hbaData"]["model"].asString());
+    EXPECT_EQ(2u, tvrn_sim_calls_after_free());
+    tvrn_sim_reset();
+    EXPECT_EQ(0u, tvrn_sim_calls_after_free());
+}
+
 TEST_F(Control, RecordingKeepsTheLatestCalls) {
     getHbaByWwn(kFcHbaReq);
     for (int i = 0; i < 100000; ++i)
