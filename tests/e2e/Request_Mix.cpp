@@ -368,9 +368,13 @@ Soak_Figures soak(Request_Mix& mix, std::size_t warmUp, std::size_t requests) {
     auto part = [&](std::size_t from, std::size_t to) {
         for (std::size_t n = from; n < to; n++) {
             std::string problem = mix.run(n);
-            // The host keeps what it receives: taken as the requests go.
-            if (problem.empty() && (n + 1) % mix.kinds() == 0)
-                problem = mix.takeIndications();
+            // The host keeps what it receives, the simulator the calls it
+            // answered (up to 100,000): both emptied as the requests go.
+            if ((n + 1) % mix.kinds() == 0) {
+                tvrn_sim_clear_recording();
+                if (problem.empty())
+                    problem = mix.takeIndications();
+            }
             if (!problem.empty() && figures.failures++ == 0)
                 figures.firstFailure = problem;
         }

@@ -1,6 +1,7 @@
 // A shorter soak than bench/soak's: mixed requests, one after the other,
 // through the real module in the embedded host (tests/e2e/Request_Mix.h);
-// after a warm-up the resident memory must stay within 1 MiB. Under the
+// after a warm-up the resident memory must stay within 1 MiB (the program runs
+// with one malloc arena and no cache of thread stacks: CMakeLists.txt). Under the
 // sanitizers resident memory says nothing (their allocators keep freed memory
 // in quarantine), so the requests run and are checked there, without the
 // bound; LeakSanitizer then shows a leak at exit.
