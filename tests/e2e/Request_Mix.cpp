@@ -233,28 +233,26 @@ std::string Request_Mix::get(std::size_t turn) {
 }
 
 std::string Request_Mix::associators(std::size_t turn) {
-    const std::size_t object = turn % _objects.size();
-    const ObjectPath& path = _objects[object];
-    Result<Instance> got = _session.host().associators(path);
-    if (!got.ok())
-        return failed("associators of", path.toString(), got);
-    if (got.items.size() < _associated[object])
-        return unexpected("associators of", path.toString(),
-                          std::to_string(got.items.size()) + " instead of at least " +
-                              std::to_string(_associated[object]));
-    return "";
+    return related(turn, false);
 }
 
 std::string Request_Mix::references(std::size_t turn) {
+    return related(turn, true);
+}
+
+std::string Request_Mix::related(std::size_t turn, bool references) {
     const std::size_t object = turn % _objects.size();
     const ObjectPath& path = _objects[object];
-    Result<Instance> got = _session.host().references(path);
+    const char* what = references ? "references of" : "associators of";
+    Result<Instance> got =
+        references ? _session.host().references(path) : _session.host().associators(path);
+    const std::size_t least = references ? _references[object] : _associated[object];
     if (!got.ok())
-        return failed("references of", path.toString(), got);
-    if (got.items.size() < _references[object])
-        return unexpected("references of", path.toString(),
-                          std::to_string(got.items.size()) + " instead of at least " +
-                              std::to_string(_references[object]));
+        return failed(what, path.toString(), got);
+    if (got.items.size() < least)
+        return unexpected(
+            what, path.toString(),
+            std::to_string(got.items.size()) + " instead of at least " + std::to_string(least));
     return "";
 }
 

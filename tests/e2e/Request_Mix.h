@@ -59,6 +59,7 @@ private:
     std::string get(std::size_t turn);
     std::string associators(std::size_t turn);
     std::string references(std::size_t turn);
+    std::string related(std::size_t turn, bool references);
     std::string executeMethod(std::size_t turn);
     std::string runDiagnostic(std::size_t turn);
     std::string indications(std::size_t turn);
