@@ -4,10 +4,11 @@
 #   tools/dev.sh run    install missing packages, build, and run the main job
 #   tools/dev.sh test   install missing packages, build, and run the whole test suite
 #   tools/dev.sh build  install missing packages and build only
-#   tools/dev.sh fuzz [SECONDS] [TARGET...]
+#   tools/dev.sh fuzz [-j JOBS] [SECONDS] [TARGET...]
 #                       install clang and libFuzzer, build the fuzz targets in
 #                       build-fuzz/ and run each (or the ones named) for
-#                       SECONDS (default 45) with the sanitizers on
+#                       SECONDS (default 45) with the sanitizers on, JOBS
+#                       targets at once (default 1)
 #   tools/dev.sh server sfcb|pegasus
 #                       install the prebuilt CIM server of the shared directory
 #                       beside the repository (../shared, else /work/shared)
@@ -123,5 +124,5 @@ case "$mode" in
   build) install_missing "${packages[@]}"; configure_and_build ;;
   fuzz)  shift; fuzz "$@" ;;
   server) install_server "${2:-}" ;;
-  *) echo "usage: $0 run|test|build|fuzz [SECONDS] [TARGET...]|server sfcb|pegasus" >&2; exit 2 ;;
+  *) echo "usage: $0 run|test|build|fuzz [-j JOBS] [SECONDS] [TARGET...]|server sfcb|pegasus" >&2; exit 2 ;;
 esac
