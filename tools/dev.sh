@@ -7,10 +7,11 @@
 #   tools/dev.sh tsan   install missing packages, build the suites that run
 #                       threads (label "threads") with ThreadSanitizer in
 #                       build-tsan/ and run them
-#   tools/dev.sh fuzz [SECONDS] [TARGET...]
+#   tools/dev.sh fuzz [-j JOBS] [SECONDS] [TARGET...]
 #                       install clang and libFuzzer, build the fuzz targets in
 #                       build-fuzz/ and run each (or the ones named) for
-#                       SECONDS (default 45) with the sanitizers on
+#                       SECONDS (default 45) with the sanitizers on, JOBS
+#                       targets at once (default 1)
 #   tools/dev.sh server sfcb|pegasus
 #                       install the prebuilt CIM server of the shared directory
 #                       beside the repository (../shared, else /work/shared)
@@ -142,5 +143,5 @@ case "$mode" in
   tsan)  tsan ;;
   fuzz)  shift; fuzz "$@" ;;
   server) install_server "${2:-}" ;;
-  *) echo "usage: $0 run|test|build|tsan|fuzz [SECONDS] [TARGET...]|server sfcb|pegasus" >&2; exit 2 ;;
+  *) echo "usage: $0 run|test|build|tsan|fuzz [-j JOBS] [SECONDS] [TARGET...]|server sfcb|pegasus" >&2; exit 2 ;;
 esac

@@ -30,8 +30,10 @@ property unset is a difference. Enumerations compare as sorted lists of
 such instances.
 
 Request lines (FILE of `requests`) are tvrncli command lines: ei, ein, gi,
-ai, ain, ri, rin (with --assoc, --result-class, --role, --result-role) and
-cm PATH METHOD [NAME=VALUE]...; words are split as a shell would. Several
+ai, ain, ri, rin (with --assoc, --result-class, --role, --result-role; ei,
+gi, ai and ri also after --props P1,P2), cm PATH METHOD [NAME=VALUE]... and
+wait CLASS PROP=VALUE [SECONDS] (on the server: ei every half second until
+an instance has the value); words are split as a shell would. Several
 commands joined by " ; " run in one tvrncli process and one after the other
 on the server, and their answers are compared together (what a method
 changes, the next command sees). A line starting with "!" must fail on both
@@ -39,7 +41,13 @@ sides with the same CIM status code. `let NAME = TEXT` defines $NAME for the
 lines below it; "<host>" stands for the Name of TAVRIN_ComputerSystem, "<here>"
 for the directory of FILE (where the files a request reads live). Method
 arguments are written as tvrncli takes them (a reference as a quoted path,
-an array as TYPE[]:{A,B}) and passed to wbemcli in its own form. A
+an array as TYPE[]:{A,B}) and passed to wbemcli in its own form; a string
+argument goes with its characters that XML or wbemcli's value lists give a
+meaning (& < > " and the comma) as XML character references, since wbemcli
+copies the text into the request as it is and splits values at commas.
+String outputs of methods that are JSON texts (the management tunnel's
+responses) compare as JSON, whatever the layout and the escapes of the
+client that printed them. A
 line that changes the server's state must put it back, since the next line
 starts afresh on the tvrncli side.
 """
@@ -47,12 +55,14 @@ starts afresh on the tvrncli side.
 import argparse
 import concurrent.futures
 import difflib
+import json
 import os
 import re
 import shlex
 import subprocess
 import sys
 import tempfile
+import time
 
 NAMESPACE = "root/tavrin"
 MODULE_FILE = "libtvrnprovider.so"
@@ -216,17 +226,70 @@ def wbemcli_paths(text):
     return ["path " + canon_path(line) for line in text.splitlines() if line.strip()]
 
 
+def _string(text):
+    """A string value; a JSON object or array as its JSON, keys sorted."""
+    if text[:1] in ("{", "["):
+        try:
+            return "json:" + json.dumps(json.loads(text), sort_keys=True)
+        except ValueError:
+            pass
+    return '"%s"' % text
+
+
+def _wbemcli_output(name, kind, value):
+    """One output wbemcli printed as `Name (type): value`: strings with
+    backslash and quote escaped, newlines as they are, and the character
+    references the server wrote into its XML left as they came (OpenPegasus
+    writes line breaks and runs of blanks as &#10; and &#32;)."""
+    if kind == "string":
+        text = re.sub(r'\\(.)', r"\1", value, flags=re.S)
+        text = re.sub(r"&#(x[0-9A-Fa-f]+|[0-9]+);",
+                      lambda c: chr(int(c.group(1)[1:], 16) if c.group(1)[0] == "x" else int(c.group(1))),
+                      text)
+        return _prop(name, [_string(text)])
+    return _prop(name, _elements(value))
+
+
+_WBEMCLI_OUTPUT = re.compile(r"^([A-Za-z_]\w*) \(([a-z0-9]+(?:\[\])?)\): (.*)$")
+
+
 def wbemcli_method(text, method):
-    """`<path> Method: value` then, with -nl, -Name=value per output."""
-    out = []
+    """`<path> Method: value` then, with -nl, one output a line (a string
+    output may go on over several): `Name (type): value` or -Name=value."""
+    out, output = [], None
     for line in text.splitlines():
         m = re.search(r" %s: (.*)$" % re.escape(method), line)
+        o = _WBEMCLI_OUTPUT.match(line)
+        if m or o or line.startswith("-"):
+            if output:
+                out.append(_wbemcli_output(*output))
+            output = None
         if m:
             out.append(_prop("ReturnValue", _elements(m.group(1))))
+        elif o:
+            output = list(o.groups())
         elif line.startswith("-"):
             name, _, value = line[1:].partition("=")
             out.append(_prop(name, _elements(value)))
+        elif output:
+            output[2] += "\n" + line
+    if output:
+        out.append(_wbemcli_output(*output))
     return ["method " + p for p in out if p]
+
+
+_MOF_ESCAPES = {"n": "\n", "t": "\t", "r": "\r", "b": "\b", "f": "\f"}
+
+
+def _mof_output(value):
+    """A method output as tvrncli prints it: a string (not a reference)
+    with its MOF escapes undone, else as a property value."""
+    if len(value) < 2 or value[0] != '"' or value[-1] != '"' or value.startswith('"' + NAMESPACE + ":"):
+        return _mof_value(value)
+    text = re.sub(r"\\(x[0-9A-Fa-f]{4}|.)",
+                  lambda e: chr(int(e.group(1)[1:], 16)) if len(e.group(1)) == 5
+                  else _MOF_ESCAPES.get(e.group(1), e.group(1)), value[1:-1])
+    return [_string(text)]
 
 
 _MOF_PROP = re.compile(r"^\s+([A-Za-z_]\w*) = (.*);$")
@@ -254,7 +317,7 @@ def tvrncli_answers(text):
             continue
         elif _METHOD_LINE.match(line):
             m = _METHOD_LINE.match(line)
-            p = _prop(m.group(1), _mof_value(m.group(2)))
+            p = _prop(m.group(1), _mof_output(m.group(2)))
             if p:
                 items.append("method " + p)
         else:
@@ -367,18 +430,26 @@ def wbemcli_argument(arg):
     elif value.startswith('"'):
         text, end = _quoted(value, 0)
         if end == len(value):
-            value = text if _PATH.match(text) else '"%s"' % text
+            value = text if _PATH.match(text) else '"%s"' % re.sub(
+                r'[&<>",]', lambda c: "&#%d;" % ord(c.group(0)), text)
     return "%s=%s" % (name, value)
 
 
 def ask_server(clients, words):
     """(status code, answer) of one command asked through wbemcli: code 0
     and the answer in normal form, or the CIM status code and the message."""
+    props = []
+    if words[0] == "--props":
+        props, words = [words[1]], words[2:]
     op = words[0]
     positional, options = _split_options(words[1:])
+    if props and op not in _INSTANCES:
+        raise Failure("--props only before ei, gi, ai and ri: %s" % " ".join(words))
     if op in _INSTANCES:
-        rc, out, err = clients.wbemcli(op, positional[0], ["-nl"] + options)
+        rc, out, err = clients.wbemcli(op, positional[0], ["-nl"] + options, props)
         read = wbemcli_instances
+    elif op == "wait":
+        return wait_on_server(clients, *positional)
     elif op in _NAMES:
         rc, out, err = clients.wbemcli(op, positional[0], options)
         read = wbemcli_paths
@@ -398,6 +469,23 @@ def ask_server(clients, words):
     if code is not None or rc != 0:
         return (code if code is not None else -1), err.strip()
     return 0, read(out)
+
+
+def wait_on_server(clients, cls, assignment, seconds="60"):
+    """wait CLASS PROP=VALUE [SECONDS] on the server: (0, []) once an
+    instance of CLASS has the value, else a failure as tvrncli's."""
+    name, _, value = assignment.partition("=")
+    wanted = _prop(name, _elements(value))
+    deadline = time.monotonic() + float(seconds)
+    while True:
+        rc, out, err = clients.wbemcli("ei", cls, ["-nl"], [name])
+        if rc != 0:
+            return (status_code(err) or -1), err.strip()
+        if any(wanted in instance.split("\n") for instance in wbemcli_instances(out)):
+            return 0, []
+        if time.monotonic() >= deadline:
+            return 1, "no %s with %s after %s s" % (cls, assignment, seconds)
+        time.sleep(0.5)
 
 
 def ask_embedded(clients, lines):
