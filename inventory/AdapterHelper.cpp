@@ -105,11 +105,22 @@ Array<Instance*> AdapterHelper::getInstancesByAddress(classId_t classId, const S
                    [&](InstanceList& out) { walk(classId, out, address); });
 }
 
-void AdapterHelper::walk(classId_t classId, InstanceList& out, const String& only) {
+Array<Instance*> AdapterHelper::getDriverIdentities(const String& driver) {
+    return runWalk("AdapterHelper::getDriverIdentities", [&](InstanceList& out) {
+        walk(CID_ADAPTER_SOFTWARE_IDENTITY, out, String(), driver);
+    });
+}
+
+void AdapterHelper::walk(classId_t classId, InstanceList& out, const String& only,
+                         const String& onlyDriver) {
     TVRN_LOG(LL_DBG, "Entering: %s", "getInstancesByClass");
     bool networkDriverReported = false;
     bool storageDriverReported = false;
+    bool driverFound = false;
     forEachAdapter("No adapters in the system!", true, [&](int number, const String& key) {
+        if (onlyDriver.size() > 0 &&
+            (driverFound || (networkDriverReported && storageDriverReported)))
+            return;
         if (only.size() > 0 && !ProviderUtil::eraseColonsFromIndex(key).equali(only))
             return;
         _adapterData record;
@@ -165,11 +176,15 @@ void AdapterHelper::walk(classId_t classId, InstanceList& out, const String& onl
                 if (!networkDriverReported && record.networkDriverName.size() > 0) {
                     out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, true));
                     networkDriverReported = true;
+                    driverFound = driverFound || record.networkDriverName == onlyDriver;
                 }
                 if (!storageDriverReported && record.storageDriverName.size() > 0) {
                     out.add(getAdapterSoftwareIdentityInstance(record, SOFTWARE_DRIVER, false));
                     storageDriverReported = true;
+                    driverFound = driverFound || record.storageDriverName == onlyDriver;
                 }
+                if (onlyDriver.size() > 0)
+                    break;
                 record.biosVersion = ProviderUtil::trimString(jsonString(firmware, "biosVersion"),
                                                               _adapterData::VERSION_WIDTH);
                 if (!ProviderUtil::valid_UTF_string(record.biosVersion.c_str()))

@@ -33,6 +33,11 @@ public:
     // adapter listed under `address` (colon-free WWN or MAC, in any case):
     // only that adapter is asked about.
     Array<Instance*> getInstancesByAddress(classId_t classId, const String& address);
+    // The software identities of the drivers that the walk of class 8 builds,
+    // up to the one named `driver`: the adapters are asked about in order
+    // until that driver (or both kinds of driver) has been reported, and no
+    // firmware or BIOS is asked about.
+    Array<Instance*> getDriverIdentities(const String& driver);
 
     // Builders: one new instance each (null only when memory runs out).
     Instance* getPortControllerInstance(const _adapterData& adapter);
@@ -48,7 +53,9 @@ public:
 private:
     AdapterHelper() = default;
     // `only`: the colon-free address of the one adapter to visit; "" all.
-    void walk(classId_t classId, InstanceList& out, const String& only);
+    // `onlyDriver`: only the driver identities, up to the one of that name.
+    void walk(classId_t classId, InstanceList& out, const String& only,
+              const String& onlyDriver = String());
 };
 
 }  // namespace CPTA

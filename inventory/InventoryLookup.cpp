@@ -7,8 +7,10 @@
 #include "framework/Meta_Lookup.h"
 #include "framework/Slot.h"
 #include "inventory/AdapterHelper.h"
+#include "inventory/ConnectorTag.h"
 #include "inventory/EthernetPortHelper.h"
 #include "inventory/InventoryCommon.h"
+#include "inventory/PhysicalAssetHelper.h"
 #include "inventory/PortHelper.h"
 
 namespace CPTA {
@@ -120,12 +122,24 @@ bool byAdapter(classId_t classId, const String& address, Array<Instance*>& found
 // "_bios". A driver's identity is named by the driver alone.
 bool byAdapterSoftware(classId_t classId, const String& instanceId, Array<Instance*>& found) {
     String parts[1];
-    if (!leadingParts(instanceId, parts, 1))
-        return false;
-    const String kind = instanceId.substr(parts[0].size() + 1);
-    if (kind != "firmware" && kind != "bios")
-        return false;
-    return byAdapter(classId, parts[0], found);
+    if (leadingParts(instanceId, parts, 1)) {
+        const String kind = instanceId.substr(parts[0].size() + 1);
+        if (kind == "firmware" || kind == "bios")
+            return byAdapter(classId, parts[0], found);
+    }
+    if (instanceId.size() > 0)  // no driver is reported without a name
+        found = AdapterHelper::getAdapterHelperInstance()->getDriverIdentities(instanceId);
+    return true;
+}
+
+// Physical connector: the optic's serial number, the adapter's number and
+// the port's position.
+bool byConnectorTag(classId_t classId, const String& tag, Array<Instance*>& found) {
+    unsigned adapterNumber = 0, portPosition = 0;
+    if (parseConnectorTag(tag, adapterNumber, portPosition))
+        found = PhysicalAssetHelper::getPhysicalAssetHelperObject()->getInstancesByPosition(
+            classId, adapterNumber, portPosition);
+    return true;
 }
 
 // Ethernet port: its MAC.
@@ -153,6 +167,7 @@ const LookupRow kLookups[] = {
     {CID_ETHERNET_PORT, "DeviceID", true, byEthernetPort},
     {CID_ALARM_DEVICE, "DeviceID", true, byLocalPort},
     {CID_LOGICAL_DISK, "DeviceID", true, byLun},
+    {CID_PHYSICAL_CONNECTOR, "Tag", false, byConnectorTag},
 };
 
 }  // namespace

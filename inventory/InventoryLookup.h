@@ -11,14 +11,15 @@
 // equal the ones asked for, so the answer is the one that enumerating the
 // class and comparing keys gives.
 //
-// Classes whose keys name no single library object are not looked up, and
-// the caller enumerates: the physical package and the product (named by
-// serial number or UUID), the logical port group (by node WWN, which the
-// ports of an adapter share), the LAN endpoint (by interface name), the
-// physical connector (its walk ends at the first adapter that cannot be
-// read), the host itself (it needs no library), the software identities of
-// the drivers (each made by the first adapter that has the driver), and every
-// class that the inventory does not build.
+// The physical connector is named by its adapter's number and its port's
+// position; a driver's software identity by the driver, which the walk
+// reports from the first adapter that has it, so its look-up visits the
+// adapters in order until then. Classes whose keys name no single library
+// object are not looked up, and the caller enumerates: the physical package
+// and the product (named by the UUID or serial number the adapter reports),
+// the logical port group (by node WWN, a member of each port's record), the
+// LAN endpoint (by interface name, likewise), the host itself (it needs no
+// library), and every class that the inventory does not build.
 #ifndef CPTA_INVENTORY_INVENTORYLOOKUP_H
 #define CPTA_INVENTORY_INVENTORYLOOKUP_H
 

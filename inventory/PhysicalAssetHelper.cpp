@@ -19,7 +19,17 @@ Array<Instance*> PhysicalAssetHelper::getInstancesByClass(classId_t classId) {
                    [&](InstanceList& out) { walk(classId, out); });
 }
 
-void PhysicalAssetHelper::walk(classId_t classId, InstanceList& out) {
+Array<Instance*> PhysicalAssetHelper::getInstancesByPosition(classId_t classId,
+                                                             unsigned adapterNumber,
+                                                             unsigned portPosition) {
+    return runWalk("PhysicalAssetHelper::getInstancesByPosition", [&](InstanceList& out) {
+        if (adapterNumber > 0)
+            walk(classId, out, adapterNumber, portPosition);
+    });
+}
+
+void PhysicalAssetHelper::walk(classId_t classId, InstanceList& out, unsigned onlyAdapter,
+                               unsigned onlyPort) {
     Json::Value adapters;
     const int count = ProviderUtil::getNumberOfAdapters(adapters);
     if (count < 1) {
@@ -28,6 +38,8 @@ void PhysicalAssetHelper::walk(classId_t classId, InstanceList& out) {
     }
     PortHelper* ports = PortHelper::getPortHelperObject();
     for (int number = 1; number <= count; number++) {
+        if (onlyAdapter != 0 && unsigned(number) != onlyAdapter)
+            continue;
         const String key = adapterKeyAt(adapters, number);
         Json::Value details;
         if (ProviderUtil::getAdapterDetails(key, details) != 0) {
@@ -40,6 +52,8 @@ void PhysicalAssetHelper::walk(classId_t classId, InstanceList& out) {
             TVRN_LOG(LL_WARN, "There are no ports associated to Adapter id %d", number);
         const Json::Value& portKeys = jsonArray(portList, "indexStrings");
         for (Json::ArrayIndex j = 0; j < portKeys.size(); j++) {
+            if (onlyAdapter != 0 && j != onlyPort)
+                continue;
             const String portKey = jsonAsString(portKeys[j]);
             Json::Value port;
             if (ports->getPortDetails(portKey, port) != 0)

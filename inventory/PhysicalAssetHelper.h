@@ -20,6 +20,11 @@ public:
 
     // All instances of class 35. Never throws.
     Array<Instance*> getInstancesByClass(classId_t classId);
+    // The instance the walk builds for the port at `portPosition` (from 0)
+    // of adapter `adapterNumber` (from 1) alone: only that adapter and that
+    // port are asked about. Never throws.
+    Array<Instance*> getInstancesByPosition(classId_t classId, unsigned adapterNumber,
+                                            unsigned portPosition);
     Instance* getPhysicalConnectorInstance(const _sfpInfo& sfp);
 
     // The optic record of port position `portPosition` of adapter
@@ -28,7 +33,10 @@ public:
 
 private:
     PhysicalAssetHelper() = default;
-    void walk(classId_t classId, InstanceList& out);
+    // `onlyAdapter` 0: every adapter and port; else that adapter's port at
+    // `onlyPort` alone.
+    void walk(classId_t classId, InstanceList& out, unsigned onlyAdapter = 0,
+              unsigned onlyPort = 0);
 };
 
 }  // namespace CPTA

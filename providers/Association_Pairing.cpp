@@ -373,13 +373,15 @@ Object_Scope::Object_Scope(const Pairing& rule, const Object_Scopes& scopes, con
                 break;
             }
             case CID_ADAPTER_SOFTWARE_IDENTITY: {
-                // Only a firmware or BIOS identity names its adapter.
+                // Only a firmware or BIOS identity names its adapter; a
+                // driver's pairs with every adapter that has the driver.
                 const String id = key_text(source, "InstanceID");
                 const size_t end = id.find('_');
                 const String kind = end == String::npos ? String() : id.substr(end + 1);
-                if (kind == "firmware" || kind == "bios")
-                    _adapter = address_in(id, kWwnDigits).size() ? address_in(id, kWwnDigits)
-                                                                 : address_in(id, kMacDigits);
+                if (kind != "firmware" && kind != "bios")
+                    return;
+                _adapter = address_in(id, kWwnDigits).size() ? address_in(id, kWwnDigits)
+                                                             : address_in(id, kMacDigits);
                 _adapterKnown = true;
                 break;
             }

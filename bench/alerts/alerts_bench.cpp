@@ -22,6 +22,7 @@
 #include <string>
 #include <vector>
 
+#include "bench/Bench_Session.h"
 #include "tests/e2e/Module_Session.h"
 
 using tvrne2e::Module_Session;
@@ -113,20 +114,14 @@ int main(int argc, char** argv) {
             args.push_back(argv[i]);
     }
     int count = int(args.size());
-    gSession = &Module_Session::open("default", logLevel);
-    if (!gSession->loaded()) {
-        std::fprintf(stderr, "the module did not load\n");
+    gSession = tvrnbench::openSession("default", logLevel);
+    if (gSession == nullptr)
         return 1;
-    }
     benchmark::RegisterBenchmark("burst", burst)
         ->Arg(1000)
         ->Arg(100000)
         ->UseManualTime()
         ->Iterations(3)
         ->Unit(benchmark::kMillisecond);
-    benchmark::Initialize(&count, args.data());
-    benchmark::RunSpecifiedBenchmarks();
-    benchmark::Shutdown();
-    Module_Session::close();
-    return 0;
+    return tvrnbench::runAndClose(count, args.data());
 }

@@ -20,6 +20,7 @@
 #include <string>
 #include <utility>
 
+#include "bench/Bench_Session.h"
 #include "simulator/SimControl.h"
 #include "tests/e2e/Module_Session.h"
 
@@ -120,21 +121,14 @@ void printSummary() {
 }  // namespace
 
 int main(int argc, char** argv) {
-    gSession = &Module_Session::open("default", "FATAL");
-    if (!gSession->loaded()) {
-        std::fprintf(stderr, "the module did not load\n");
+    gSession = tvrnbench::openSession();
+    if (gSession == nullptr)
         return 1;
-    }
     for (const San& san : kSans)
         for (const char* association : kAssociations)
             benchmark::RegisterBenchmark(
                 (std::string("enumerate/") + san.name + "/" + association).c_str(), enumerate, &san,
                 association)
                 ->Unit(benchmark::kMillisecond);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    benchmark::Shutdown();
-    printSummary();
-    Module_Session::close();
-    return 0;
+    return tvrnbench::runAndClose(argc, argv, printSummary);
 }

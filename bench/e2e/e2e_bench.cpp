@@ -18,6 +18,7 @@
 #include <string>
 #include <vector>
 
+#include "bench/Bench_Session.h"
 #include "tests/e2e/Module_Session.h"
 
 using tvrne2e::Module_Session;
@@ -94,19 +95,13 @@ int main(int argc, char** argv) {
     const std::string& fixture = options["--fixture="];
     int count = int(args.size());
 
-    gSession = &Module_Session::open(fixture, options["--log-level="]);
-    if (!gSession->loaded()) {
-        std::fprintf(stderr, "the module did not load on fixture %s\n", fixture.c_str());
+    gSession = tvrnbench::openSession(fixture, options["--log-level="]);
+    if (gSession == nullptr)
         return 1;
-    }
     for (const char* className : kClasses)
         benchmark::RegisterBenchmark((std::string("enumerate/") + className).c_str(), enumerate,
                                      className)
             ->Unit(benchmark::kMillisecond);
     benchmark::RegisterBenchmark("get/TAVRIN_FCPort", getFCPort)->Unit(benchmark::kMillisecond);
-    benchmark::Initialize(&count, args.data());
-    benchmark::RunSpecifiedBenchmarks();
-    benchmark::Shutdown();
-    Module_Session::close();
-    return 0;
+    return tvrnbench::runAndClose(count, args.data());
 }

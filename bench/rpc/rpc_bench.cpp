@@ -14,6 +14,7 @@
 #include <cstdio>
 #include <string>
 
+#include "bench/Bench_Session.h"
 #include "gateway/CIMProviderTfaj.h"
 #include "rpc/JsonRpcManager.h"
 #include "tests/rpc/Agent_Service.h"
@@ -66,11 +67,9 @@ void dispatcher(benchmark::State& state, const char* request) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    gSession = &Module_Session::open("default", "FATAL");
-    if (!gSession->loaded()) {
-        std::fprintf(stderr, "the module did not load\n");
+    gSession = tvrnbench::openSession();
+    if (gSession == nullptr)
         return 1;
-    }
     for (const auto& b :
          {std::make_pair("getServerTime", kServerTime), std::make_pair("getHbaByWwn", kHbaByWwn),
           std::make_pair("unknownMethod", kUnknown)}) {
@@ -81,9 +80,5 @@ int main(int argc, char** argv) {
                                      b.second)
             ->Unit(benchmark::kMicrosecond);
     }
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    benchmark::Shutdown();
-    Module_Session::close();
-    return 0;
+    return tvrnbench::runAndClose(argc, argv);
 }
