@@ -74,6 +74,13 @@ void PhysicalAssetHelper::walk(classId_t classId, InstanceList& out, unsigned on
 
 _sfpInfo PhysicalAssetHelper::readOptic(const Json::Value& sfp, int adapterNumber,
                                         int portPosition) {
+    // A member missing or of the wrong type leaves its property empty; the
+    // serial number also names the connector, so say which one is lost.
+    for (const char* member :
+         {"vendorName", "serialNo", "vendorPart", "revision", "speed", "extendedID"})
+        if (!sfp.isObject() || !sfp[member].isString())
+            TVRN_LOG(LL_WARN, "The optic of adapter %d port %d has no text %s", adapterNumber,
+                     portPosition, member);
     _sfpInfo record;
     record.vendorName =
         ProviderUtil::trimString(jsonString(sfp, "vendorName"), _sfpInfo::IDENT_WIDTH);
