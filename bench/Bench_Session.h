@@ -5,12 +5,35 @@
 
 #include <benchmark/benchmark.h>
 
+#include <algorithm>
 #include <cstdio>
+#include <cstring>
+#include <map>
 #include <string>
+#include <vector>
 
 #include "tests/e2e/Module_Session.h"
 
 namespace tvrnbench {
+
+// Takes the program's own "--name=value" options out of the command line:
+// each found in `options` (keyed by "--name=", holding its default) gets its
+// value; what is left, with the program name first, is for the benchmark
+// library.
+inline std::vector<char*> takeOptions(int argc, char** argv,
+                                      std::map<std::string, std::string>& options) {
+    std::vector<char*> rest;
+    for (int i = 0; i < argc; i++) {
+        auto option = std::find_if(options.begin(), options.end(), [&](const auto& o) {
+            return std::strncmp(argv[i], o.first.c_str(), o.first.size()) == 0;
+        });
+        if (option != options.end())
+            option->second = argv[i] + option->first.size();
+        else
+            rest.push_back(argv[i]);
+    }
+    return rest;
+}
 
 // The module loaded in the embedded host on `fixture`, logging at
 // `logLevel`; null (reported on stderr) when it did not load.

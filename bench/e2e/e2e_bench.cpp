@@ -11,9 +11,7 @@
 // line per instance built).
 #include <benchmark/benchmark.h>
 
-#include <algorithm>
 #include <cstdio>
-#include <cstring>
 #include <map>
 #include <string>
 #include <vector>
@@ -82,16 +80,7 @@ int main(int argc, char** argv) {
     // --fixture=NAME and --log-level=LEVEL are ours, the rest the benchmark library's.
     std::map<std::string, std::string> options = {{"--fixture=", "large-san"},
                                                   {"--log-level=", "FATAL"}};
-    std::vector<char*> args;
-    for (int i = 0; i < argc; i++) {
-        auto option = std::find_if(options.begin(), options.end(), [&](const auto& o) {
-            return std::strncmp(argv[i], o.first.c_str(), o.first.size()) == 0;
-        });
-        if (option != options.end())
-            option->second = argv[i] + option->first.size();
-        else
-            args.push_back(argv[i]);
-    }
+    std::vector<char*> args = tvrnbench::takeOptions(argc, argv, options);
     const std::string& fixture = options["--fixture="];
     int count = int(args.size());
 

@@ -17,13 +17,12 @@
 
 #include <stdlib.h>
 
-#include <algorithm>
 #include <cstdio>
-#include <cstring>
 #include <map>
 #include <string>
 #include <vector>
 
+#include "bench/Bench_Session.h"
 #include "tests/e2e/Module_Session.h"
 #include "tests/e2e/Request_Mix.h"
 
@@ -54,16 +53,7 @@ int main(int argc, char** argv) {
     // --requests=, --warm-up= and --log-level= are ours, the rest the benchmark library's.
     std::map<std::string, std::string> options = {
         {"--requests=", "20000"}, {"--warm-up=", "2000"}, {"--log-level=", "FATAL"}};
-    std::vector<char*> args;
-    for (int i = 0; i < argc; i++) {
-        auto option = std::find_if(options.begin(), options.end(), [&](const auto& o) {
-            return std::strncmp(argv[i], o.first.c_str(), o.first.size()) == 0;
-        });
-        if (option != options.end())
-            option->second = argv[i] + option->first.size();
-        else
-            args.push_back(argv[i]);
-    }
+    std::vector<char*> args = tvrnbench::takeOptions(argc, argv, options);
     int count = int(args.size());
     // The loopback runs do not pause for the link to settle.
     setenv("TVRN_DIAG_PAUSE_MS", "0", 1);
